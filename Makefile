@@ -1,0 +1,55 @@
+# make run    install what is missing, build, process the demo material
+# make test   the same set-up, then every test, also under ASan and UBSan
+# make bench  realtime factors of plug-ins and kernels
+# make install [PREFIX=/usr/local]
+
+BUILD_DIR ?= build
+ASAN_DIR  ?= build-asan
+PREFIX    ?= /usr/local
+JOBS      ?= $(shell nproc)
+CMAKE     ?= cmake
+
+COMMON_FLAGS := -G Ninja -DZEN_WERROR=ON
+ZENFX := $(BUILD_DIR)/bin/zenfx
+
+.PHONY: all setup configure build run test test-release test-asan bench install clean
+
+all: build
+
+setup:
+	@scripts/install-deps.sh
+
+configure: setup
+	@$(CMAKE) -S . -B $(BUILD_DIR) $(COMMON_FLAGS) >/dev/null
+
+build: configure
+	@$(CMAKE) --build $(BUILD_DIR) -j $(JOBS)
+
+run: build
+	@$(ZENFX) demo -o $(BUILD_DIR)/demo-input.wav
+	@$(ZENFX) process -o $(BUILD_DIR)/demo-output.wav \
+	    --plugin "Soft Clipper" --set Threshold=6 --set Shape=0.8 --set "Output Level=-1" \
+	    --meters-json $(BUILD_DIR)/demo-meters.json
+	@echo "Listen to $(BUILD_DIR)/demo-input.wav and $(BUILD_DIR)/demo-output.wav"
+
+test: test-release test-asan
+
+test-release: build
+	cd $(BUILD_DIR) && ctest --output-on-failure -j $(JOBS)
+
+# Assertions stay live (Debug) at -O1 so the tests run at a usable speed.
+test-asan: setup
+	@$(CMAKE) -S . -B $(ASAN_DIR) $(COMMON_FLAGS) -DZEN_SANITIZE=ON -DZEN_BUILD_BENCHMARKS=OFF \
+	    -DCMAKE_BUILD_TYPE=Debug "-DCMAKE_CXX_FLAGS_DEBUG=-g -O1" >/dev/null
+	@$(CMAKE) --build $(ASAN_DIR) -j $(JOBS)
+	cd $(ASAN_DIR) && ASAN_OPTIONS=detect_leaks=1:abort_on_error=1 UBSAN_OPTIONS=print_stacktrace=1:halt_on_error=1 \
+	    ctest --output-on-failure -j $(JOBS)
+
+bench: build
+	$(BUILD_DIR)/bin/ZenBenchmarks --benchmark_counters_tabular=true
+
+install: build
+	$(CMAKE) --install $(BUILD_DIR) --prefix $(PREFIX)
+
+clean:
+	rm -rf $(BUILD_DIR) $(ASAN_DIR)
