@@ -1,0 +1,62 @@
+// Static definition of one parameter of a plug-in or algorithm class. A class
+// builds its whole table once (a function-local static) and every instance
+// shares it:
+//
+//   static const ParameterTableDefinition table = MakeParameterTable("BiQuad", {
+//       SwitchParameter("IN", QT_TRANSLATE_NOOP("BiQuad", "In"), 0),
+//       ListParameter("SHAPE", QT_TRANSLATE_NOOP("BiQuad", "Shape"), {"LPF", ...}, 4),
+//       ...});
+#pragma once
+
+#include <QString>
+#include <QStringList>
+#include <cstdint>
+#include <initializer_list>
+#include <vector>
+
+#include "zen/ParameterInfo.h"
+
+namespace zen {
+
+struct ParameterDefinition {
+    std::uint64_t index = 0;  // position in the class's table
+    QString identifier;       // class name, "::" and the upper-case name
+    QString label;            // translated display name
+    ParameterKind kind = ParameterKind::Continuous;
+    bool logarithmic = false;
+    float minimum = 0.0f;
+    float maximum = 1.0f;
+    float defaultValue = 0.0f;
+    float step = 0.0f;
+    QString unit;
+    QStringList choices;  // translated captions, list parameters only
+
+    ParameterTaper Taper() const {
+        if (kind == ParameterKind::List) return ParameterTaper::List;
+        return logarithmic ? ParameterTaper::Logarithmic : ParameterTaper::Linear;
+    }
+
+    // Nearest value the parameter can hold: inside the range, and a whole
+    // step of a switch or list. NaN is not a value; callers refuse it first.
+    float Constrain(float value) const;
+
+    ParameterInfo ToInfo() const;
+};
+
+using ParameterTableDefinition = std::vector<ParameterDefinition>;
+
+// Rows hold the upper-case name in `identifier` and the untranslated label;
+// the table builder prefixes the class name, numbers the rows and translates
+// labels and captions in the class's context.
+ParameterDefinition ContinuousParameter(const char* name, const char* label, float minimum, float maximum,
+                                        float defaultValue, float step, const char* unit = "");
+ParameterDefinition LogarithmicParameter(const char* name, const char* label, float minimum, float maximum,
+                                         float defaultValue, float step, const char* unit = "");
+ParameterDefinition SwitchParameter(const char* name, const char* label, float defaultValue,
+                                    const char* unit = "");
+ParameterDefinition ListParameter(const char* name, const char* label, std::initializer_list<const char*> captions,
+                                  float defaultValue);
+
+ParameterTableDefinition MakeParameterTable(const char* className, std::vector<ParameterDefinition> rows);
+
+}  // namespace zen

@@ -1,0 +1,236 @@
+#include "ZenAudioPluginImpl.h"
+
+#include <QJsonObject>
+#include <algorithm>
+#include <cmath>
+#include <cstring>
+
+#include "GlobalSmoothing.h"
+#include "OnePoleSmoother.h"
+#include "StateText.h"
+#include "ScopedDenormalFlush.h"
+
+ZenAudioPluginImpl::ZenAudioPluginImpl() = default;
+
+ZenAudioPluginImpl::~ZenAudioPluginImpl() { LeaveProcessing(); }
+
+void ZenAudioPluginImpl::AttachToHost(const zen::PluginDescriptor* descriptor, void* hostContext,
+                                      zen::HostServices* hostServices) {
+    m_descriptor = descriptor;
+    m_hostContext = hostContext;
+    m_hostServices = hostServices;
+    if (hostServices != nullptr) {
+        if (hostServices->GetChannelIndex != nullptr) m_hostChannelIndex = hostServices->GetChannelIndex(hostServices);
+        if (hostServices->GetSessionId != nullptr) m_hostSessionId = hostServices->GetSessionId(hostServices);
+    }
+    m_inputs = std::min(2u, descriptor->inputChannelLimit);
+    m_outputs = std::min(2u, descriptor->outputChannelLimit);
+}
+
+const char* ZenAudioPluginImpl::GetName() const { return m_descriptor != nullptr ? m_descriptor->name : ""; }
+
+void* ZenAudioPluginImpl::QueryInterface(const char* interfaceName) {
+    if (interfaceName == nullptr) return nullptr;
+    if (std::strcmp(interfaceName, zen::PluginInstance::kInterfaceName) == 0) return static_cast<zen::PluginInstance*>(this);
+    if (std::strcmp(interfaceName, AudioPlugin::kInterfaceName) == 0) return static_cast<AudioPlugin*>(this);
+    if (std::strcmp(interfaceName, ZenControlValueHost::kInterfaceName) == 0)
+        return static_cast<ZenControlValueHost*>(this);
+    return QObject::qt_metacast(interfaceName);
+}
+
+void ZenAudioPluginImpl::InitParameters(const zen::ParameterTableDefinition& definitions) {
+    m_parameters.Build(definitions);
+    m_pendingWords = (m_parameters.GetCount() + 63) / 64;
+    m_pending.reset(new std::atomic<std::uint64_t>[m_pendingWords]);
+    for (std::uint32_t w = 0; w < m_pendingWords; ++w) m_pending[w].store(0);
+}
+
+bool ZenAudioPluginImpl::GetParameterInfo(std::uint32_t index, zen::ParameterInfo& info) const {
+    if (!m_parameters.Contains(index)) return false;
+    info = m_parameters[index].Definition().ToInfo();
+    return true;
+}
+
+bool ZenAudioPluginImpl::SetParameter(std::uint32_t index, float value) {
+    if (!m_parameters.Contains(index) || std::isnan(value)) return false;
+    return OnParameterChanged(index, m_parameters[index].Definition().Constrain(value));
+}
+
+float ZenAudioPluginImpl::GetParameter(std::uint32_t index) const {
+    return m_parameters.Contains(index) ? m_parameters[index].GetValue() : 0.0f;
+}
+
+bool ZenAudioPluginImpl::OnParameterChanged(std::uint32_t index, float value) {
+    if (!m_parameters.Contains(index)) return false;
+    m_parameters[index].Exchange(value);
+    m_pending[index / 64].fetch_or(std::uint64_t{1} << (index % 64), std::memory_order_release);
+    return true;
+}
+
+void ZenAudioPluginImpl::UpdateProcessingParameter(std::uint32_t, float) {}
+
+void ZenAudioPluginImpl::ApplyPendingParameters() noexcept {
+    for (std::uint32_t w = 0; w < m_pendingWords; ++w) {
+        std::uint64_t bits = m_pending[w].exchange(0, std::memory_order_acq_rel);
+        while (bits != 0) {
+            const auto bit = static_cast<std::uint32_t>(__builtin_ctzll(bits));
+            bits &= bits - 1;
+            const std::uint32_t index = w * 64 + bit;
+            UpdateProcessingParameter(index, m_parameters[index].GetValue());
+        }
+    }
+}
+
+std::string ZenAudioPluginImpl::SaveState() const {
+    QJsonObject extra;
+    extra.insert(QStringLiteral("bypass"), IsBypassed());
+    return zen::StateText::Save(m_descriptor->className, m_parameters, extra);
+}
+
+bool ZenAudioPluginImpl::LoadState(const std::string& state) {
+    zen::StateText::Contents contents;
+    if (!zen::StateText::Parse(state, m_descriptor->className, m_parameters, contents)) return false;
+    for (const auto& [index, value] : contents.values) SetParameter(index, value);
+    const QJsonValue bypass = contents.root.value(QStringLiteral("bypass"));
+    if (bypass.isBool()) SetBypass(bypass.toBool());
+    return true;
+}
+
+std::vector<std::string> ZenAudioPluginImpl::GetPresetNames() const {
+    return zen::StateText::PresetNames(m_descriptor->className);
+}
+
+bool ZenAudioPluginImpl::LoadPreset(const std::string& name) {
+    std::string text;
+    return zen::StateText::ReadPreset(m_descriptor->className, name, text) && LoadState(text);
+}
+
+void* ZenAudioPluginImpl::CreateEditor(void*) { return nullptr; }
+
+std::int32_t ZenAudioPluginImpl::FindParameter(const char* identifierOrLabel) const {
+    return identifierOrLabel != nullptr ? m_parameters.Find(QString::fromUtf8(identifierOrLabel)) : -1;
+}
+
+float ZenAudioPluginImpl::GetParameterPosition(std::uint32_t index) const {
+    return m_parameters.Contains(index) ? m_parameters[index].GetPosition() : 0.0f;
+}
+
+bool ZenAudioPluginImpl::SetParameterPosition(std::uint32_t index, float position) {
+    if (!m_parameters.Contains(index) || std::isnan(position)) return false;
+    return SetParameter(index, m_parameters[index].PositionToValue(position));
+}
+
+bool ZenAudioPluginImpl::AcceptsChannelConfiguration(std::uint32_t inputs, std::uint32_t outputs) const {
+    if (m_descriptor->inputChannelLimit == 0) return inputs == 0 && outputs >= 1;
+    return inputs >= 1 && inputs == outputs;
+}
+
+bool ZenAudioPluginImpl::ConfigureChannels(std::uint32_t inputs, std::uint32_t outputs) {
+    if (inputs > m_descriptor->inputChannelLimit || outputs > m_descriptor->outputChannelLimit) return false;
+    if (std::max(inputs, outputs) > kMaxChannels || !AcceptsChannelConfiguration(inputs, outputs)) return false;
+    if (inputs == m_inputs && outputs == m_outputs) return true;
+    m_inputs = inputs;
+    m_outputs = outputs;
+    if (IsPrepared()) return Prepare(static_cast<float>(m_sampleRate), static_cast<std::uint32_t>(m_blockSize));
+    return true;
+}
+
+void ZenAudioPluginImpl::PrepareProcessing(float, std::uint32_t) {}
+
+bool ZenAudioPluginImpl::Prepare(float sampleRate, std::uint32_t maxBlockSize) {
+    if (!(sampleRate >= kMinSampleRate && sampleRate <= kMaxSampleRate)) return false;
+    if (maxBlockSize < 1 || maxBlockSize > kMaxBlockSize) return false;
+    m_prepared.store(false, std::memory_order_release);
+    LeaveProcessing();
+    m_sampleRate = static_cast<int>(sampleRate);
+    m_blockSize = static_cast<int>(maxBlockSize);
+    zen::OnePoleSmoother::RefreshAll(sampleRate);
+    m_parameters.RefreshPositions();
+    try {
+        PrepareProcessing(sampleRate, maxBlockSize);
+        const std::uint32_t channels = GetProcessChannelCount();
+        m_bypassDelay.Dimension(channels, maxBlockSize, GetLatency());
+        m_dry.assign(static_cast<std::size_t>(channels) * maxBlockSize, 0.0f);
+    } catch (...) {  // allocation failures never reach the host
+        return false;
+    }
+    m_bypassFadeStep = static_cast<float>(1.0 / std::max(1.0, kBypassFadeSeconds * sampleRate));
+    m_bypassMix = IsBypassed() ? 1.0f : 0.0f;
+    // Every parameter is applied again to the freshly prepared algorithms.
+    for (std::uint32_t w = 0; w < m_pendingWords; ++w) {
+        const std::uint32_t bits = std::min(64u, m_parameters.GetCount() - w * 64);
+        m_pending[w].store(bits == 64 ? ~std::uint64_t{0} : (std::uint64_t{1} << bits) - 1);
+    }
+    m_prepared.store(true, std::memory_order_release);
+    return true;
+}
+
+void ZenAudioPluginImpl::Reset() {
+    ResetProcessing();
+    m_bypassDelay.Reset();
+    m_bypassMix = IsBypassed() ? 1.0f : 0.0f;
+}
+
+void ZenAudioPluginImpl::LeaveProcessing() {
+    if (m_processing.exchange(false)) zen::GlobalSmoothing::LeaveProcessing();
+}
+
+bool ZenAudioPluginImpl::Process(float* const* channels, std::uint64_t frames) noexcept {
+    if (!IsPrepared() || channels == nullptr) return false;
+    if (frames == 0) return true;
+    zen::ScopedDenormalFlush flushDenormals;
+    if (!m_processing.load(std::memory_order_relaxed)) {
+        m_processing.store(true, std::memory_order_release);
+        zen::GlobalSmoothing::EnterProcessing();
+    }
+    ApplyPendingParameters();
+
+    const std::uint32_t channelCount = GetProcessChannelCount();
+    const auto maxChunk = static_cast<std::uint64_t>(m_blockSize);
+    float* chunk[kMaxChannels];
+    for (std::uint64_t done = 0; done < frames;) {
+        const auto length = static_cast<std::uint32_t>(std::min(frames - done, maxChunk));
+        for (std::uint32_t c = 0; c < channelCount; ++c) chunk[c] = channels[c] + done;
+        ProcessChunk(chunk, channelCount, length);
+        done += length;
+    }
+    return true;
+}
+
+void ZenAudioPluginImpl::ProcessChunk(float* const* io, std::uint32_t channelCount, std::uint32_t frames) noexcept {
+    const float target = IsBypassed() ? 1.0f : 0.0f;
+    const bool settled = m_bypassMix == target;
+    if (settled && target == 0.0f && m_bypassDelay.GetDelay() == 0) {
+        ProcessBlock(io, channelCount, frames);
+        return;
+    }
+
+    // The dry path runs on every block, so a switch finds it already filled.
+    const std::size_t stride = static_cast<std::size_t>(m_blockSize);
+    for (std::uint32_t c = 0; c < channelCount; ++c) {
+        float* dry = m_dry.data() + c * stride;
+        std::copy(io[c], io[c] + frames, dry);
+        m_bypassDelay.ProcessChannel(c, dry, frames);
+    }
+    if (settled && target == 1.0f) {
+        for (std::uint32_t c = 0; c < channelCount; ++c) std::copy_n(m_dry.data() + c * stride, frames, io[c]);
+        return;
+    }
+    ProcessBlock(io, channelCount, frames);
+    if (settled) return;
+
+    const float step = target > m_bypassMix ? m_bypassFadeStep : -m_bypassFadeStep;
+    float mix = m_bypassMix;
+    for (std::uint32_t c = 0; c < channelCount; ++c) {
+        const float* dry = m_dry.data() + c * stride;
+        mix = m_bypassMix;
+        for (std::uint32_t i = 0; i < frames; ++i) {
+            mix = std::min(std::max(mix + step, 0.0f), 1.0f);
+            io[c][i] += (dry[i] - io[c][i]) * mix;
+        }
+    }
+    m_bypassMix = mix;
+    // Fully bypassed: drop state that would sound stale when switched back.
+    if (m_bypassMix == 1.0f) ResetProcessing();
+}
+

@@ -1,0 +1,157 @@
+// Common base of every audio plug-in class. It carries the host interfaces,
+// the host's context and services, the sample rate and block size, the
+// parameter table with its tapers, latency, bypass and the bookkeeping that
+// moves parameter changes to the audio thread without locks.
+//
+// A plug-in class derives from it and supplies:
+//   - a constructor that calls InitParameters with the class's table;
+//   - OnParameterChanged (any thread): call the base, then push derived
+//     values to smoothed value groups with SetTarget;
+//   - UpdateProcessingParameter (audio thread, before the next block, and for
+//     every parameter after Prepare): hand values to owned algorithms;
+//   - PrepareProcessing: prepare owned algorithms, size buffers, SetLatency;
+//   - ProcessBlock: the signal path, at most the prepared block size;
+//   - ResetProcessing, and the meters.
+// The class actually instantiated is ZenAudioPlugin<Class>.
+#pragma once
+
+#include <QObject>
+#include <atomic>
+#include <cstdint>
+#include <memory>
+#include <vector>
+
+#include "ParameterTable.h"
+#include "SmoothedValueGroup.h"
+#include "Algorithms/Delay.h"
+#include "zen/AudioPlugin.h"
+#include "zen/PluginInstance.h"
+#include "zen/ZenControlValueHost.h"
+
+class ZenAudioPluginImpl : public QObject,
+                           public zen::PluginInstance,
+                           public AudioPlugin,
+                           public ZenControlValueHost {
+    Q_OBJECT
+
+public:
+    // The largest channel limit of any plug-in of the library.
+    static constexpr std::uint32_t kMaxChannels = 32;
+    static constexpr int kDefaultSampleRate = 48000;
+    static constexpr int kDefaultBlockSize = 1024;
+    static constexpr float kMinSampleRate = 8000.0f;
+    static constexpr float kMaxSampleRate = 384000.0f;
+    static constexpr std::uint32_t kMaxBlockSize = 1u << 20;
+    // Length of the cross-fade when bypass is switched.
+    static constexpr double kBypassFadeSeconds = 0.010;
+
+    ~ZenAudioPluginImpl() override;
+
+    // Called once by the factory, right after construction.
+    void AttachToHost(const zen::PluginDescriptor* descriptor, void* hostContext, zen::HostServices* hostServices);
+    void* GetHostContext() const { return m_hostContext; }
+    zen::HostServices* GetHostServices() const { return m_hostServices; }
+    std::int64_t GetHostChannelIndex() const { return m_hostChannelIndex; }
+    std::int64_t GetHostSessionId() const { return m_hostSessionId; }
+
+    // zen::PluginInstance
+    int GetKind() const override { return zen::kAudioPluginKind; }
+    const zen::PluginDescriptor* GetDescriptor() const override { return m_descriptor; }
+    const char* GetName() const override;
+    void* QueryInterface(const char* interfaceName) override;
+
+    // zen::PluginParameters
+    std::uint32_t GetParameterCount() const override { return m_parameters.GetCount(); }
+    bool GetParameterInfo(std::uint32_t index, zen::ParameterInfo& info) const override;
+    bool SetParameter(std::uint32_t index, float value) override;
+    float GetParameter(std::uint32_t index) const override;
+    std::string SaveState() const override;
+    bool LoadState(const std::string& state) override;
+    std::vector<std::string> GetPresetNames() const override;
+    bool LoadPreset(const std::string& name) override;
+    void* CreateEditor(void* parentWidget) override;
+
+    // AudioPlugin
+    bool ConfigureChannels(std::uint32_t inputs, std::uint32_t outputs) override;
+    std::uint32_t GetInputChannelCount() const override { return m_inputs; }
+    std::uint32_t GetOutputChannelCount() const override { return m_outputs; }
+    bool Prepare(float sampleRate, std::uint32_t maxBlockSize) override;
+    bool Process(float* const* channels, std::uint64_t frames) noexcept override;
+    void Reset() override;
+    std::uint32_t GetLatency() const override { return m_latency.load(std::memory_order_acquire); }
+    void SetBypass(bool bypassed) override { m_bypass.store(bypassed, std::memory_order_release); }
+    bool IsBypassed() const override { return m_bypass.load(std::memory_order_acquire); }
+    std::uint32_t GetMeterCount() const override { return 0; }
+    bool GetMeterInfo(std::uint32_t, zen::MeterInfo&) const override { return false; }
+    float GetMeter(std::uint32_t) const override { return 0.0f; }
+
+    // ZenControlValueHost
+    std::int32_t FindParameter(const char* identifierOrLabel) const override;
+    float GetParameterPosition(std::uint32_t index) const override;
+    bool SetParameterPosition(std::uint32_t index, float position) override;
+
+    int GetSampleRate() const { return m_sampleRate; }
+    int GetBlockSize() const { return m_blockSize; }
+    bool IsPrepared() const { return m_prepared.load(std::memory_order_acquire); }
+    // Channels handed to ProcessBlock: max(inputs, outputs).
+    std::uint32_t GetProcessChannelCount() const { return m_inputs > m_outputs ? m_inputs : m_outputs; }
+    const zen::ParameterTable& Parameters() const { return m_parameters; }
+
+protected:
+    ZenAudioPluginImpl();
+
+    void InitParameters(const zen::ParameterTableDefinition& definitions);
+
+    // Base contract: false for an index out of range; else the value is
+    // exchanged atomically, its position refreshed and the parameter marked
+    // for UpdateProcessingParameter. Overrides call this first.
+    virtual bool OnParameterChanged(std::uint32_t index, float value);
+    virtual void UpdateProcessingParameter(std::uint32_t index, float value);
+
+    // Inputs and outputs within the descriptor's limits reach this check.
+    // Default: as many outputs as inputs, or outputs only for plug-ins
+    // without audio input.
+    virtual bool AcceptsChannelConfiguration(std::uint32_t inputs, std::uint32_t outputs) const;
+
+    virtual void PrepareProcessing(float sampleRate, std::uint32_t maxBlockSize);
+    virtual void ProcessBlock(float* const* channels, std::uint32_t channelCount, std::uint32_t frames) noexcept = 0;
+    virtual void ResetProcessing() {}
+
+    // Reports the latency; call from PrepareProcessing.
+    void SetLatency(std::uint32_t samples) { m_latency.store(samples, std::memory_order_release); }
+
+    // Smoothed values ramp only while this instance processes.
+    void AttachSmoothedValue(zen::SmoothedValueGroup& group) { group.SetRampingFlag(&m_processing); }
+
+private:
+    void ApplyPendingParameters() noexcept;
+    void ProcessChunk(float* const* channels, std::uint32_t channelCount, std::uint32_t frames) noexcept;
+    void LeaveProcessing();
+
+    const zen::PluginDescriptor* m_descriptor = nullptr;
+    void* m_hostContext = nullptr;
+    zen::HostServices* m_hostServices = nullptr;
+    std::int64_t m_hostChannelIndex = -1;
+    std::int64_t m_hostSessionId = 0;
+
+    int m_sampleRate = kDefaultSampleRate;
+    int m_blockSize = kDefaultBlockSize;
+    std::uint32_t m_inputs = 0;
+    std::uint32_t m_outputs = 0;
+
+    zen::ParameterTable m_parameters;
+    std::unique_ptr<std::atomic<std::uint64_t>[]> m_pending;  // one bit per parameter
+    std::uint32_t m_pendingWords = 0;
+
+    std::atomic<bool> m_prepared{false};
+    std::atomic<bool> m_processing{false};
+    std::atomic<std::uint32_t> m_latency{0};
+
+    // Bypass: the dry signal delayed by the latency, cross-faded on a switch.
+    std::atomic<bool> m_bypass{false};
+    float m_bypassMix = 0.0f;  // 0 processed .. 1 bypassed; audio thread
+    float m_bypassFadeStep = 1.0f;
+    zen::Delay m_bypassDelay;
+    std::vector<float> m_dry;  // channel-major scratch, kMaxChannels x block size at most
+};
+

@@ -1,0 +1,11 @@
+// Everything a host includes to use the library.
+#pragma once
+
+#include "AudioPlugin.h"
+#include "ControlPlugin.h"
+#include "ParameterInfo.h"
+#include "PluginInstance.h"
+#include "PluginInterface.h"
+#include "PluginParameters.h"
+#include "PluginTypes.h"
+#include "ZenControlValueHost.h"
