@@ -1,0 +1,129 @@
+#include "AudioFile.h"
+
+#include <algorithm>
+#include <cctype>
+#include <map>
+
+#include "ZenfxError.h"
+
+namespace zenfx {
+
+namespace {
+
+std::string Extension(const std::string& path) {
+    const std::size_t slash = path.find_last_of('/');
+    const std::size_t dot = path.find_last_of('.');
+    if (dot == std::string::npos || (slash != std::string::npos && dot < slash)) return {};
+    std::string ext = path.substr(dot + 1);
+    std::transform(ext.begin(), ext.end(), ext.begin(), [](unsigned char c) { return std::tolower(c); });
+    return ext;
+}
+
+const std::map<std::string, int>& Containers() {
+    static const std::map<std::string, int> containers = {
+        {"wav", SF_FORMAT_WAV}, {"w64", SF_FORMAT_W64}, {"flac", SF_FORMAT_FLAC}, {"aif", SF_FORMAT_AIFF},
+        {"aiff", SF_FORMAT_AIFF}, {"caf", SF_FORMAT_CAF}, {"au", SF_FORMAT_AU}, {"ogg", SF_FORMAT_OGG},
+    };
+    return containers;
+}
+
+const std::map<std::string, int>& SampleFormats() {
+    static const std::map<std::string, int> formats = {
+        {"pcm16", SF_FORMAT_PCM_16}, {"pcm24", SF_FORMAT_PCM_24}, {"pcm32", SF_FORMAT_PCM_32},
+        {"float", SF_FORMAT_FLOAT},  {"double", SF_FORMAT_DOUBLE},
+    };
+    return formats;
+}
+
+bool Storable(int format) {
+    SF_INFO info{};
+    info.samplerate = 48000;
+    info.channels = 2;
+    info.format = format;
+    return sf_format_check(&info) != 0;
+}
+
+}  // namespace
+
+AudioFileReader::AudioFileReader(const std::string& path) : m_path(path) {
+    m_file = sf_open(path.c_str(), SFM_READ, &m_info);
+    if (m_file == nullptr) throw ZenfxError("cannot read '" + path + "': " + sf_strerror(nullptr));
+    if (m_info.channels < 1) throw ZenfxError("cannot read '" + path + "': it has no audio channels");
+}
+
+AudioFileReader::~AudioFileReader() {
+    if (m_file != nullptr) sf_close(m_file);
+}
+
+std::int64_t AudioFileReader::Read(float* interleaved, std::int64_t frames) {
+    return sf_readf_float(m_file, interleaved, frames);
+}
+
+AudioFileWriter::AudioFileWriter(const std::string& path, int sampleRate, int channels, int format)
+    : m_path(path), m_temporary(path) {
+    SF_INFO info{};
+    info.samplerate = sampleRate;
+    info.channels = channels;
+    info.format = format;
+    if (sf_format_check(&info) == 0)
+        throw ZenfxError("cannot write '" + path + "': " + DescribeFormat(format) + " cannot hold " +
+                         std::to_string(channels) + " channels at " + std::to_string(sampleRate) + " Hz");
+    m_file = sf_open_fd(m_temporary.Descriptor(), SFM_WRITE, &info, SF_TRUE);
+    if (m_file == nullptr) throw ZenfxError("cannot write '" + path + "': " + sf_strerror(nullptr));
+    m_temporary.ReleaseDescriptor();
+    // Integer formats clip instead of wrapping around.
+    sf_command(m_file, SFC_SET_CLIPPING, nullptr, SF_TRUE);
+}
+
+AudioFileWriter::~AudioFileWriter() {
+    if (m_file != nullptr) sf_close(m_file);
+}
+
+void AudioFileWriter::Write(const float* interleaved, std::int64_t frames) {
+    if (sf_writef_float(m_file, interleaved, frames) != frames)
+        throw ZenfxError("cannot write '" + m_path + "': " + sf_strerror(m_file));
+}
+
+void AudioFileWriter::Commit() {
+    const int status = sf_close(m_file);
+    m_file = nullptr;
+    if (status != 0) throw ZenfxError("cannot write '" + m_path + "': " + sf_error_number(status));
+    m_temporary.Commit();
+}
+
+int ChooseOutputFormat(const std::string& outputPath, int inputFormat, const std::string& formatOption) {
+    const std::string ext = Extension(outputPath);
+    const auto container = Containers().find(ext);
+    if (container == Containers().end())
+        throw ZenfxError("cannot write '" + outputPath + "': unknown file type '." + ext +
+                         "' (use .wav, .flac, .aiff, .w64, .caf, .au or .ogg)");
+    if (container->second == SF_FORMAT_OGG) {
+        if (!formatOption.empty()) throw ZenfxError("--format does not apply to Ogg Vorbis output");
+        return SF_FORMAT_OGG | SF_FORMAT_VORBIS;
+    }
+    if (!formatOption.empty()) {
+        const auto sample = SampleFormats().find(formatOption);
+        if (sample == SampleFormats().end())
+            throw ZenfxError("unknown --format '" + formatOption + "' (pcm16, pcm24, pcm32, float or double)");
+        const int format = container->second | sample->second;
+        if (!Storable(format))
+            throw ZenfxError("cannot write '" + outputPath + "': ." + ext + " files cannot hold " + formatOption +
+                             " samples");
+        return format;
+    }
+    const int same = container->second | (inputFormat & SF_FORMAT_SUBMASK);
+    if ((inputFormat & SF_FORMAT_SUBMASK) != 0 && Storable(same)) return same;
+    return container->second | SF_FORMAT_PCM_24;
+}
+
+std::string DescribeFormat(int format) {
+    SF_FORMAT_INFO info{};
+    info.format = format & SF_FORMAT_TYPEMASK;
+    std::string text = sf_command(nullptr, SFC_GET_FORMAT_INFO, &info, sizeof(info)) == 0 ? info.name : "audio";
+    SF_FORMAT_INFO sub{};
+    sub.format = format & SF_FORMAT_SUBMASK;
+    if (sf_command(nullptr, SFC_GET_FORMAT_INFO, &sub, sizeof(sub)) == 0) text += std::string(", ") + sub.name;
+    return text;
+}
+
+}  // namespace zenfx

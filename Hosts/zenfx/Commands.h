@@ -1,0 +1,39 @@
+// The zenfx subcommands.
+#pragma once
+
+#include <cstdint>
+#include <string>
+#include <vector>
+
+#include "PluginLibrary.h"
+
+namespace zenfx {
+
+struct InfoOptions {
+    std::string plugin;
+    bool json = false;
+    int sampleRate = 48000;
+};
+
+struct StageSpec {
+    std::string plugin;
+    // In command-line order: {"--preset", name} or {"--set", "PARAM=VALUE"}.
+    std::vector<std::pair<std::string, std::string>> actions;
+};
+
+struct ProcessOptions {
+    std::string input;  // empty: the demo material
+    std::string output;
+    std::vector<StageSpec> stages;
+    std::uint32_t block = 512;
+    bool compensateLatency = true;
+    std::string format;
+    std::string metersJson;
+};
+
+int RunList(PluginLibrary& library, bool json);
+int RunInfo(PluginLibrary& library, const InfoOptions& options);
+int RunProcess(PluginLibrary& library, const ProcessOptions& options);
+int RunDemo(const std::string& output, const std::string& format);
+
+}  // namespace zenfx

@@ -1,0 +1,108 @@
+// zenfx: the command-line host of the ZenAudioPlugins library.
+#include <CLI/CLI.hpp>
+#include <iostream>
+
+#include "Commands.h"
+#include "ZenfxError.h"
+
+namespace {
+
+// Walks the process options in command-line order, so that every --set and
+// --preset belongs to the --plugin named before it.
+std::vector<zenfx::StageSpec> CollectStages(const CLI::App& process, const CLI::Option* plugin,
+                                            const CLI::Option* set, const CLI::Option* preset) {
+    std::vector<zenfx::StageSpec> stages;
+    std::size_t pluginIndex = 0, setIndex = 0, presetIndex = 0;
+    for (const CLI::Option* option : process.parse_order()) {
+        if (option == plugin) {
+            stages.push_back({option->results().at(pluginIndex++), {}});
+            continue;
+        }
+        const bool isSet = option == set;
+        if (!isSet && option != preset) continue;
+        const std::string& value = isSet ? option->results().at(setIndex++) : option->results().at(presetIndex++);
+        const std::string name = isSet ? "--set" : "--preset";
+        if (stages.empty())
+            throw zenfx::ZenfxError(name + " " + value + " comes before any --plugin", zenfx::kExitUsage);
+        stages.back().actions.emplace_back(name, value);
+    }
+    return stages;
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+    CLI::App app{"zenfx: runs ZenAudioPlugins over audio files"};
+    app.require_subcommand(1);
+    std::string libraryPath;
+    app.add_option("--library", libraryPath, "Path of libZenAudioPlugins.so (default: beside zenfx)");
+
+    bool listJson = false;
+    CLI::App* list = app.add_subcommand("list", "List every plug-in of the library");
+    list->add_flag("--json", listJson, "Print JSON");
+
+    zenfx::InfoOptions info;
+    CLI::App* infoCommand = app.add_subcommand("info", "Show a plug-in's parameters, meters and latency");
+    infoCommand->add_option("PLUGIN", info.plugin, "Display name or key, case-insensitive")->required();
+    infoCommand->add_flag("--json", info.json, "Print JSON");
+    infoCommand->add_option("--rate", info.sampleRate, "Sample rate for the latency (Hz)")
+        ->check(CLI::Range(8000, 384000));
+
+    zenfx::ProcessOptions process;
+    std::vector<std::string> plugins, sets, presets;
+    CLI::App* processCommand = app.add_subcommand("process", "Run a chain of plug-ins over an audio file");
+    processCommand->add_option("INPUT", process.input, "Input file (WAV, FLAC, AIFF, ...); none: demo material");
+    processCommand->add_option("-o,--output", process.output, "Output file; its extension picks the type")
+        ->required();
+    CLI::Option* pluginOption =
+        processCommand->add_option("--plugin", plugins, "Plug-in by name or key; repeat for a chain")
+            ->expected(1)
+            ->multi_option_policy(CLI::MultiOptionPolicy::TakeAll)
+            ->allow_extra_args(false);
+    CLI::Option* setOption =
+        processCommand->add_option("--set", sets, "PARAM=VALUE for the plug-in named before it")
+            ->expected(1)
+            ->multi_option_policy(CLI::MultiOptionPolicy::TakeAll)
+            ->allow_extra_args(false);
+    CLI::Option* presetOption =
+        processCommand->add_option("--preset", presets, "Factory preset of the plug-in named before it")
+            ->expected(1)
+            ->multi_option_policy(CLI::MultiOptionPolicy::TakeAll)
+            ->allow_extra_args(false);
+    processCommand->add_option("--block", process.block, "Block size in frames (default 512)");
+    bool noCompensation = false;
+    processCommand->add_flag("--no-latency-compensation", noCompensation,
+                             "Keep the chain's delay instead of aligning output with input");
+    processCommand->add_option("--format", process.format, "Sample format: pcm16, pcm24, pcm32, float, double");
+    processCommand->add_option("--meters-json", process.metersJson, "Write every plug-in's final meters here");
+
+    std::string demoOutput, demoFormat;
+    CLI::App* demo = app.add_subcommand("demo", "Write the built-in demo material to a file");
+    demo->add_option("-o,--output", demoOutput, "Output file")->required();
+    demo->add_option("--format", demoFormat, "Sample format: pcm16, pcm24, pcm32, float, double");
+
+    try {
+        app.parse(argc, argv);
+    } catch (const CLI::Success& e) {
+        return app.exit(e);
+    } catch (const CLI::ParseError& e) {
+        std::cerr << "zenfx: " << e.what() << " (zenfx --help shows the usage)\n";
+        return zenfx::kExitUsage;
+    }
+
+    try {
+        if (*demo) return zenfx::RunDemo(demoOutput, demoFormat);
+        zenfx::PluginLibrary library(libraryPath);
+        if (*list) return zenfx::RunList(library, listJson);
+        if (*infoCommand) return zenfx::RunInfo(library, info);
+        process.stages = CollectStages(*processCommand, pluginOption, setOption, presetOption);
+        process.compensateLatency = !noCompensation;
+        return zenfx::RunProcess(library, process);
+    } catch (const zenfx::ZenfxError& e) {
+        std::cerr << "zenfx: " << e.what() << "\n";
+        return e.ExitCode();
+    } catch (const std::exception& e) {
+        std::cerr << "zenfx: " << e.what() << "\n";
+        return zenfx::kExitFailure;
+    }
+}
