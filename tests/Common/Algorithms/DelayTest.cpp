@@ -1,0 +1,72 @@
+#include <gtest/gtest.h>
+
+#include "Common/Algorithms/Delay.h"
+#include "Support/Signals.h"
+
+TEST(Delay, DelaysEachChannelBySetLength) {
+    zen::Delay delay;
+    delay.Dimension(2, 64, 5);
+    std::vector<float> a = zentest::Noise(100, 1.0, 1), b = zentest::Noise(100, 1.0, 2);
+    const auto a0 = a, b0 = b;
+    float* channels[2] = {a.data(), b.data()};
+    ASSERT_TRUE(delay.Process(channels, 100));
+    for (std::size_t n = 0; n < 100; ++n) {
+        EXPECT_EQ(a[n], n < 5 ? 0.0f : a0[n - 5]);
+        EXPECT_EQ(b[n], n < 5 ? 0.0f : b0[n - 5]);
+    }
+}
+
+TEST(Delay, AnyBlockSplitGivesTheSameOutput) {
+    const std::vector<float> input = zentest::Noise(1000);
+    std::vector<float> whole = input;
+    zen::Delay reference;
+    reference.Dimension(1, 1000, 37);
+    reference.ProcessChannel(0, whole.data(), whole.size());
+
+    for (std::size_t block : {1u, 3u, 36u, 37u, 38u, 512u}) {
+        zen::Delay delay;
+        delay.Dimension(1, static_cast<std::uint32_t>(block), 37);
+        std::vector<float> split = input;
+        for (std::size_t done = 0; done < split.size(); done += block)
+            delay.ProcessChannel(0, split.data() + done, std::min(block, split.size() - done));
+        EXPECT_EQ(split, whole) << "block " << block;
+    }
+}
+
+TEST(Delay, ReadWriteMatchesBlockProcessing) {
+    const std::vector<float> input = zentest::Noise(300);
+    zen::Delay perSample, perBlock;
+    perSample.Dimension(1, 1, 11);
+    perBlock.Dimension(1, 300, 11);
+    std::vector<float> block = input;
+    perBlock.ProcessChannel(0, block.data(), block.size());
+    for (std::size_t n = 0; n < input.size(); ++n) EXPECT_EQ(perSample.ReadWrite(0, input[n]), block[n]);
+}
+
+TEST(Delay, ZeroLengthPassesThrough) {
+    zen::Delay delay;
+    delay.Dimension(1, 8, 0);
+    std::vector<float> x = {1, 2, 3};
+    delay.ProcessChannel(0, x.data(), 3);
+    EXPECT_EQ(x, (std::vector<float>{1, 2, 3}));
+    EXPECT_EQ(delay.ReadWrite(0, 4.0f), 4.0f);
+}
+
+TEST(Delay, ResetClearsEveryLine) {
+    zen::Delay delay;
+    delay.Dimension(1, 8, 4);
+    for (float x : {1.0f, 2.0f, 3.0f}) delay.ReadWrite(0, x);
+    delay.Reset();
+    for (int i = 0; i < 4; ++i) EXPECT_EQ(delay.ReadWrite(0, 9.0f), 0.0f);
+}
+
+TEST(Delay, GrowingTheChannelCountKeepsExistingLines) {
+    zen::Delay delay;
+    delay.Dimension(1, 8, 2);
+    delay.ReadWrite(0, 5.0f);
+    delay.SetChannelCount(3);
+    EXPECT_EQ(delay.ReadWrite(2, 1.0f), 0.0f);  // new channel starts silent
+    EXPECT_EQ(delay.ReadWrite(0, 6.0f), 0.0f);
+    EXPECT_EQ(delay.ReadWrite(0, 7.0f), 5.0f);
+    EXPECT_FALSE(delay.ProcessChannel(3, nullptr, 0));
+}

@@ -1,0 +1,181 @@
+// The entry, the registries and the interface object, as a host sees them.
+#include <gtest/gtest.h>
+
+#include "Common/AudioPluginRegistry.h"
+#include "Common/ZenAudioPluginImpl.h"
+#include "Common/ZenControlPlugin.h"
+#include "Support/AssertionRecorder.h"
+#include "zen/Zen.h"
+
+namespace {
+
+// A control plug-in that exists only in the tests.
+class TestConsoleSettings : public ZenControlPluginImpl {
+public:
+    static constexpr const char* kName = "Test Console Settings";
+    static constexpr const char* kClassName = "TestConsoleSettings";
+    TestConsoleSettings() {
+        static const zen::ParameterTableDefinition table = zen::MakeParameterTable(
+            kClassName, {zen::ContinuousParameter("TRIM", "Trim", -12.0f, 12.0f, 0.0f, 0.1f, "dB"),
+                         zen::SwitchParameter("MUTE", "Mute", 0.0f)});
+        InitParameters(table);
+    }
+};
+
+zen::PluginInstance* CreateNothing(void*, zen::HostServices*, const zen::PluginDescriptor*) { return nullptr; }
+
+}  // namespace
+
+template class ZenControlPlugin<TestConsoleSettings>;
+
+TEST(PluginInterface, OneObjectWithVersion100) {
+    zen::PluginInterface* library = GetZenPluginInterface();
+    ASSERT_NE(library, nullptr);
+    EXPECT_EQ(library, GetZenPluginInterface());
+    EXPECT_EQ(library->GetInterfaceVersion(), 100);
+}
+
+TEST(PluginInterface, KeysAreNameColonDecimalCode) {
+    EXPECT_EQ(zen::MakePluginCode('Z', 'n', 'S', 'c'), 1517179747);
+    EXPECT_EQ(zen::MakePluginCode('Z', 'e', 'n', 'a'), 1516596833);
+    EXPECT_EQ(zen::PluginCodeToString(1517177970), "ZnLr");
+    EXPECT_EQ(zen::AudioPluginRegistry::MakeKey("Soft Clipper", 1517179747).toStdString(), "Soft Clipper:1517179747");
+    EXPECT_EQ(zen::MakePluginKey("Limiter", 1517177970), "Limiter:1517177970");
+}
+
+TEST(PluginInterface, ListsAudioPluginsByKeyWithTheirEntries) {
+    const auto list = GetZenPluginInterface()->GetPluginList(zen::kAudioPluginKind);
+    const auto it = list.find("Soft Clipper:1517179747");
+    ASSERT_NE(it, list.end());
+    EXPECT_EQ(it->second.name, "Soft Clipper");
+    EXPECT_EQ(it->second.channelCount, 32u);
+    EXPECT_EQ(it->second.reserved0, 0u);
+    EXPECT_EQ(it->second.reserved1, 0u);
+    EXPECT_EQ(it->second.listFlags, 0u);
+    for (const auto& [key, entry] : list) EXPECT_EQ(key.rfind(entry.name + ":", 0), 0u) << key;
+}
+
+TEST(PluginInterface, ListsControlPluginsByName) {
+    const auto list = GetZenPluginInterface()->GetPluginList(zen::kControlPluginKind);
+    const auto it = list.find("Test Console Settings");
+    ASSERT_NE(it, list.end());
+    EXPECT_EQ(it->second.name, "Test Console Settings");
+    EXPECT_EQ(it->second.channelCount, 0u);
+}
+
+TEST(PluginInterface, OtherKindsAreEmptyAndCreateNothing) {
+    zen::PluginInterface* library = GetZenPluginInterface();
+    for (int kind : {-1, 1, 3, 100}) {
+        EXPECT_TRUE(library->GetPluginList(kind).empty()) << kind;
+        EXPECT_EQ(library->CreatePlugin(kind, "Soft Clipper:1517179747"), nullptr) << kind;
+    }
+}
+
+TEST(PluginInterface, CreatesByExactKeyOnly) {
+    zen::PluginInterface* library = GetZenPluginInterface();
+    EXPECT_EQ(library->CreatePlugin(zen::kAudioPluginKind, "soft clipper:1517179747"), nullptr);
+    EXPECT_EQ(library->CreatePlugin(zen::kAudioPluginKind, "Soft Clipper"), nullptr);
+    EXPECT_EQ(library->CreatePlugin(zen::kAudioPluginKind, "Blur:1517175404"), nullptr);
+    EXPECT_EQ(library->CreatePlugin(zen::kAudioPluginKind, "Krush:1517177714"), nullptr);
+    std::unique_ptr<zen::PluginInstance> clipper(library->CreatePlugin(zen::kAudioPluginKind, "Soft Clipper:1517179747"));
+    ASSERT_NE(clipper, nullptr);
+    EXPECT_EQ(clipper->GetKind(), zen::kAudioPluginKind);
+    EXPECT_STREQ(clipper->GetName(), "Soft Clipper");
+    // The factory hands over the registry's own descriptor.
+    EXPECT_EQ(clipper->GetDescriptor(), &zen::AudioPluginRegistry::Instance().Find("Soft Clipper:1517179747")->descriptor);
+    EXPECT_STREQ(clipper->GetDescriptor()->className, "ZenSoftClipper");
+}
+
+TEST(PluginInterface, CastsByInterfaceName) {
+    std::unique_ptr<zen::PluginInstance> clipper(
+        GetZenPluginInterface()->CreatePlugin(zen::kAudioPluginKind, "Soft Clipper:1517179747"));
+    EXPECT_EQ(clipper->QueryInterface("zen::PluginInstance"), clipper.get());
+    EXPECT_NE(zen::InterfaceCast<AudioPlugin>(clipper.get()), nullptr);
+    EXPECT_NE(zen::InterfaceCast<ZenControlValueHost>(clipper.get()), nullptr);
+    EXPECT_EQ(zen::InterfaceCast<ControlPlugin>(clipper.get()), nullptr);
+    EXPECT_NE(clipper->QueryInterface("QObject"), nullptr);  // passed on to the toolkit
+    EXPECT_EQ(clipper->QueryInterface("NoSuchInterface"), nullptr);
+    EXPECT_EQ(clipper->QueryInterface(nullptr), nullptr);
+}
+
+TEST(PluginInterface, HostServicesReachNewInstances) {
+    struct Services : zen::HostServices {
+        int calls = 0;
+    } services;
+    services.GetChannelIndex = [](zen::HostServices* self) -> std::int64_t {
+        ++static_cast<Services*>(self)->calls;
+        return 7;
+    };
+    services.GetSessionId = [](zen::HostServices* self) -> std::int64_t {
+        ++static_cast<Services*>(self)->calls;
+        return 99;
+    };
+    zen::PluginInterface* library = GetZenPluginInterface();
+    int context = 0;
+    library->SetHostContext(&context);
+    library->SetHostServices(&services);
+    std::unique_ptr<zen::PluginInstance> clipper(library->CreatePlugin(zen::kAudioPluginKind, "Soft Clipper:1517179747"));
+    library->SetHostServices(nullptr);
+    library->SetHostContext(nullptr);
+    auto* impl = dynamic_cast<ZenAudioPluginImpl*>(clipper.get());
+    ASSERT_NE(impl, nullptr);
+    EXPECT_EQ(services.calls, 2);
+    EXPECT_EQ(impl->GetHostContext(), &context);
+    EXPECT_EQ(impl->GetHostChannelIndex(), 7);
+    EXPECT_EQ(impl->GetHostSessionId(), 99);
+}
+
+TEST(AudioPluginRegistry, WithheldDescriptorsAreNeverEntered) {
+    const zen::PluginDescriptor blur = {"Blur", 0.2, zen::kPluginStateWithheld, zen::MakePluginCode('Z', 'n', 'B', 'l'),
+                                        8, 8, "ZenBlur", 0, 0, -1, nullptr};
+    EXPECT_EQ(blur.code, 1517175404);
+    EXPECT_FALSE(zen::AudioPluginRegistry::Instance().Register(blur, &CreateNothing));
+    EXPECT_EQ(zen::AudioPluginRegistry::Instance().Find("Blur:1517175404"), nullptr);
+}
+
+TEST(AudioPluginRegistry, FirstRegistrationWinsWithAnAssertion) {
+    zentest::AssertionRecorder assertions;
+    auto& registry = zen::AudioPluginRegistry::Instance();
+    const zen::AudioPluginRegistry::Node* before = registry.Find("Soft Clipper:1517179747");
+    ASSERT_NE(before, nullptr);
+    const zen::AudioPluginFactory original = before->factory;
+    zen::PluginDescriptor copy = before->descriptor;
+    EXPECT_FALSE(registry.Register(copy, &CreateNothing));
+    ASSERT_EQ(assertions.Assertions().size(), 1u);
+    EXPECT_EQ(assertions.Assertions()[0].message, "0");
+    EXPECT_NE(assertions.Assertions()[0].file.find("Common/AudioPluginRegistry"), std::string::npos);
+    EXPECT_EQ(registry.Find("Soft Clipper:1517179747")->factory, original);
+}
+
+TEST(ControlPluginRegistry, FirstRegistrationWinsWithAnAssertion) {
+    zentest::AssertionRecorder assertions;
+    EXPECT_FALSE(zen::ControlPluginRegistry::Instance().Register(
+        "Test Console Settings", [](zen::HostServices*) -> zen::PluginInstance* { return nullptr; }));
+    EXPECT_EQ(assertions.Assertions().size(), 1u);
+    std::unique_ptr<zen::PluginInstance> settings(
+        GetZenPluginInterface()->CreatePlugin(zen::kControlPluginKind, "Test Console Settings"));
+    EXPECT_NE(settings, nullptr);
+}
+
+TEST(ControlPlugin, ParametersStateAndCasts) {
+    std::unique_ptr<zen::PluginInstance> settings(
+        GetZenPluginInterface()->CreatePlugin(zen::kControlPluginKind, "Test Console Settings"));
+    ASSERT_NE(settings, nullptr);
+    EXPECT_EQ(settings->GetKind(), zen::kControlPluginKind);
+    EXPECT_EQ(settings->GetDescriptor(), nullptr);
+    EXPECT_EQ(zen::InterfaceCast<AudioPlugin>(settings.get()), nullptr);
+    ControlPlugin* control = zen::InterfaceCast<ControlPlugin>(settings.get());
+    ASSERT_NE(control, nullptr);
+    ASSERT_EQ(control->GetParameterCount(), 2u);
+    EXPECT_TRUE(control->SetParameter(0, -4.5f));
+    EXPECT_TRUE(control->SetParameter(1, 1.0f));
+    EXPECT_FALSE(control->SetParameter(2, 1.0f));
+    const std::string state = control->SaveState();
+
+    std::unique_ptr<zen::PluginInstance> other(
+        GetZenPluginInterface()->CreatePlugin(zen::kControlPluginKind, "Test Console Settings"));
+    ControlPlugin* restored = zen::InterfaceCast<ControlPlugin>(other.get());
+    ASSERT_TRUE(restored->LoadState(state));
+    EXPECT_FLOAT_EQ(restored->GetParameter(0), -4.5f);
+    EXPECT_FLOAT_EQ(restored->GetParameter(1), 1.0f);
+}

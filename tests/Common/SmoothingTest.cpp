@@ -1,0 +1,102 @@
+// One-pole smoothers, the shared 200 ms smoother and smoothed value groups.
+#include <gtest/gtest.h>
+
+#include <atomic>
+#include <cmath>
+
+#include "Common/GlobalSmoothing.h"
+#include "Common/OnePoleSmoother.h"
+#include "Common/SmoothedValueGroup.h"
+
+namespace {
+constexpr double kTwoPi = 6.283185307179586;
+}
+
+TEST(OnePoleSmoother, CoefficientsFollowTheTimeConstant) {
+    zen::OnePoleSmoother smoother(10);
+    smoother.SetSampleRate(48000.0);
+    EXPECT_DOUBLE_EQ(smoother.GetA(), std::exp(-kTwoPi / (48.0 * 10.0)));
+    EXPECT_DOUBLE_EQ(smoother.GetA() + smoother.GetB(), 1.0);
+}
+
+TEST(OnePoleSmoother, FreshSmootherFollowsItsInputAtOnce) {
+    zen::OnePoleSmoother smoother(50);
+    EXPECT_EQ(smoother.GetA(), 0.0);
+    EXPECT_EQ(smoother.GetB(), 1.0);
+    EXPECT_EQ(smoother.Next(0.7), 0.7);
+}
+
+TEST(OnePoleSmoother, RefreshAllUpdatesEveryRegisteredSmoother) {
+    zen::OnePoleSmoother a(5), b(400);
+    zen::OnePoleSmoother::RefreshAll(96000.0);
+    EXPECT_DOUBLE_EQ(a.GetA(), std::exp(-kTwoPi / (96.0 * 5.0)));
+    EXPECT_DOUBLE_EQ(b.GetA(), std::exp(-kTwoPi / (96.0 * 400.0)));
+    EXPECT_DOUBLE_EQ(zen::GlobalSmoothing::SharedSmoother().GetA(), std::exp(-kTwoPi / (96.0 * 200.0)));
+    zen::OnePoleSmoother::RefreshAll(48000.0);
+    EXPECT_DOUBLE_EQ(zen::GlobalSmoothing::SharedSmoother().GetA(), std::exp(-kTwoPi / 9600.0));
+}
+
+TEST(OnePoleSmoother, ReachesTheExpectedFractionAfterOneTimeConstant) {
+    zen::OnePoleSmoother smoother(200);
+    smoother.SetSampleRate(48000.0);
+    // The coefficient's time constant is T / (2 pi): 1 - 1/e of a step after that many samples.
+    const int samples = static_cast<int>(std::lround(48000.0 * 0.2 / kTwoPi));
+    double y = 0.0;
+    for (int i = 0; i < samples; ++i) y = smoother.Next(1.0);
+    EXPECT_NEAR(y, 1.0 - std::exp(-1.0), 1e-3);
+}
+
+TEST(SmoothedValueGroup, TargetTakesEffectAtOnceWhenNotProcessing) {
+    ASSERT_FALSE(zen::GlobalSmoothing::IsRunning());
+    zen::SmoothedValueGroup group(3, 1.0f);
+    group.SetTarget(0.25f);
+    for (std::size_t i = 0; i < group.GetSize(); ++i) {
+        EXPECT_EQ(group[i].target.load(), 0.25f);
+        EXPECT_EQ(group[i].current.load(), 0.25);
+    }
+}
+
+TEST(SmoothedValueGroup, RampsWhileItsOwnerProcesses) {
+    zen::OnePoleSmoother::RefreshAll(48000.0);
+    std::atomic<bool> processing{true};
+    zen::SmoothedValueGroup group(1, 0.0f);
+    group.SetRampingFlag(&processing);
+    zen::GlobalSmoothing::EnterProcessing();
+    group.SetTarget(1.0f);
+    zen::GlobalSmoothing::LeaveProcessing();
+    EXPECT_EQ(group[0].current.load(), 0.0);
+
+    const double a = std::exp(-kTwoPi / 9600.0);
+    {
+        auto cursor = group.Track(0);
+        EXPECT_NEAR(cursor.Next(), 1.0 - a, 1e-12);
+        EXPECT_NEAR(cursor.Next(), a * (1.0 - a) + (1.0 - a), 1e-12);
+    }
+    EXPECT_NEAR(group[0].current.load(), a * (1.0 - a) + (1.0 - a), 1e-12);  // stored back
+}
+
+TEST(SmoothedValueGroup, StaysStillWhenItsOwnerIsNotProcessing) {
+    std::atomic<bool> processing{false};
+    zen::SmoothedValueGroup group(1, 0.0f);
+    group.SetRampingFlag(&processing);
+    zen::GlobalSmoothing::EnterProcessing();  // another instance runs
+    group.SetTarget(1.0f);
+    zen::GlobalSmoothing::LeaveProcessing();
+    EXPECT_EQ(group[0].current.load(), 1.0);
+}
+
+TEST(SmoothedValueGroup, SettlesExactlyOnItsTarget) {
+    zen::OnePoleSmoother::RefreshAll(48000.0);
+    std::atomic<bool> processing{true};
+    zen::SmoothedValueGroup group(1, 1.0f);
+    group.SetRampingFlag(&processing);
+    zen::GlobalSmoothing::EnterProcessing();
+    group.SetTarget(0.0f);
+    zen::GlobalSmoothing::LeaveProcessing();
+    for (int block = 0; block < 2000; ++block) {
+        auto cursor = group.Track(0);
+        for (int i = 0; i < 512; ++i) cursor.Next();
+    }
+    // No creeping toward denormals: the value lands on the target.
+    EXPECT_EQ(group[0].current.load(), 0.0);
+}

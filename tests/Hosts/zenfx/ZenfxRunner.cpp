@@ -1,0 +1,106 @@
+#include "ZenfxRunner.h"
+
+#include <dirent.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <cstdio>
+#include <cstdlib>
+#include <fstream>
+#include <sstream>
+#include <stdexcept>
+
+namespace zentest {
+
+namespace {
+
+std::string Quote(const std::string& s) {
+    std::string quoted = "'";
+    for (char c : s) quoted += c == '\'' ? std::string("'\\''") : std::string(1, c);
+    return quoted + "'";
+}
+
+std::string Slurp(const std::string& path) {
+    std::ifstream in(path);
+    std::stringstream text;
+    text << in.rdbuf();
+    return text.str();
+}
+
+}  // namespace
+
+ZenfxResult RunZenfx(const std::vector<std::string>& arguments) {
+    char outPath[] = "/tmp/zenfx-out-XXXXXX";
+    char errPath[] = "/tmp/zenfx-err-XXXXXX";
+    close(mkstemp(outPath));
+    close(mkstemp(errPath));
+    std::string command = Quote(ZENFX_PATH);
+    for (const std::string& a : arguments) command += " " + Quote(a);
+    command += " </dev/null >" + std::string(outPath) + " 2>" + errPath;
+    const int status = std::system(command.c_str());
+    ZenfxResult result;
+    result.exitCode = WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+    result.out = Slurp(outPath);
+    result.err = Slurp(errPath);
+    unlink(outPath);
+    unlink(errPath);
+    return result;
+}
+
+std::vector<float> AudioData::Channel(int c) const {
+    std::vector<float> channel;
+    for (std::size_t i = static_cast<std::size_t>(c); i < samples.size(); i += static_cast<std::size_t>(info.channels))
+        channel.push_back(samples[i]);
+    return channel;
+}
+
+void WriteAudio(const std::string& path, const std::vector<std::vector<float>>& channels, int sampleRate,
+                int format) {
+    SF_INFO info{};
+    info.samplerate = sampleRate;
+    info.channels = static_cast<int>(channels.size());
+    info.format = format;
+    SNDFILE* file = sf_open(path.c_str(), SFM_WRITE, &info);
+    if (file == nullptr) throw std::runtime_error("cannot write test file " + path);
+    const std::size_t frames = channels[0].size();
+    std::vector<float> interleaved(frames * channels.size());
+    for (std::size_t n = 0; n < frames; ++n)
+        for (std::size_t c = 0; c < channels.size(); ++c) interleaved[n * channels.size() + c] = channels[c][n];
+    sf_writef_float(file, interleaved.data(), static_cast<sf_count_t>(frames));
+    sf_close(file);
+}
+
+AudioData ReadAudio(const std::string& path) {
+    AudioData data;
+    SNDFILE* file = sf_open(path.c_str(), SFM_READ, &data.info);
+    if (file == nullptr) throw std::runtime_error("cannot read test file " + path);
+    data.samples.resize(static_cast<std::size_t>(data.info.frames * data.info.channels));
+    sf_readf_float(file, data.samples.data(), data.info.frames);
+    sf_close(file);
+    return data;
+}
+
+TempFolder::TempFolder() {
+    char path[] = "/tmp/zenfx-test-XXXXXX";
+    if (mkdtemp(path) == nullptr) throw std::runtime_error("mkdtemp failed");
+    m_path = path;
+}
+
+TempFolder::~TempFolder() {
+    for (const std::string& name : Files()) unlink((m_path + "/" + name).c_str());
+    rmdir(m_path.c_str());
+}
+
+std::vector<std::string> TempFolder::Files() const {
+    std::vector<std::string> names;
+    if (DIR* dir = opendir(m_path.c_str())) {
+        while (dirent* entry = readdir(dir)) {
+            const std::string name = entry->d_name;
+            if (name != "." && name != "..") names.push_back(name);
+        }
+        closedir(dir);
+    }
+    return names;
+}
+
+}  // namespace zentest

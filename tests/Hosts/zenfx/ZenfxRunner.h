@@ -1,0 +1,43 @@
+// Runs the zenfx binary as a user does and reads what it wrote.
+#pragma once
+
+#include <sndfile.h>
+
+#include <string>
+#include <vector>
+
+namespace zentest {
+
+struct ZenfxResult {
+    int exitCode = -1;
+    std::string out;
+    std::string err;
+};
+
+// Arguments are quoted for the shell; stdin is empty, stdout and stderr are
+// captured separately (so no terminal: no progress bar).
+ZenfxResult RunZenfx(const std::vector<std::string>& arguments);
+
+struct AudioData {
+    SF_INFO info{};
+    std::vector<float> samples;  // interleaved
+    std::vector<float> Channel(int c) const;
+};
+
+void WriteAudio(const std::string& path, const std::vector<std::vector<float>>& channels, int sampleRate,
+                int format = SF_FORMAT_WAV | SF_FORMAT_FLOAT);
+AudioData ReadAudio(const std::string& path);
+
+// A fresh folder, removed with everything in it at the end of the test.
+class TempFolder {
+public:
+    TempFolder();
+    ~TempFolder();
+    std::string operator/(const std::string& name) const { return m_path + "/" + name; }
+    std::vector<std::string> Files() const;
+
+private:
+    std::string m_path;
+};
+
+}  // namespace zentest
