@@ -65,6 +65,15 @@ int PhysicalCoreCount() {
     return Forced() ? DispatchSettings::Instance().GetForcedPhysicalCores() : Cpu().physicalCores;
 }
 
+int HighestStandardLeaf() {
+    return Forced() ? DispatchSettings::Instance().GetForcedHighestStandardLeaf()
+                    : static_cast<int>(Cpu().highestStandardLeaf);
+}
+
+int InitialApicId() {
+    return Forced() ? DispatchSettings::Instance().GetForcedInitialApicId() : static_cast<int>(Cpu().initialApicId);
+}
+
 KernelForm ChooseKernelForm() {
     if (HasAVX() && HasFMA()) return KernelForm::M256Fma;
     if (HasAVX()) return KernelForm::M256;
@@ -73,8 +82,26 @@ KernelForm ChooseKernelForm() {
     return KernelForm::Ref;
 }
 
+KernelForm ChooseKernelFormWithoutFma() {
+    switch (ChooseKernelForm()) {
+        case KernelForm::M256Fma:
+        case KernelForm::M256: return KernelForm::M256;
+        case KernelForm::M128Fma:
+        case KernelForm::M128: return KernelForm::M128;
+        default: return KernelForm::Ref;
+    }
+}
+
+KernelForm ChooseIntegerKernelForm() {
+    if (HasAVX2()) return KernelForm::M256Avx2;
+    if (HasSSE41()) return KernelForm::M128Sse41;
+    return KernelForm::Ref;
+}
+
 const char* KernelFormName(KernelForm form) {
     switch (form) {
+        case KernelForm::M256Avx2: return "m256_avx2";
+        case KernelForm::M128Sse41: return "m128_sse41";
         case KernelForm::M256Fma: return "m256_fma";
         case KernelForm::M256: return "m256";
         case KernelForm::M128Fma: return "m128_fma";
