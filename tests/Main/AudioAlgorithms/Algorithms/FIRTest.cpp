@@ -27,12 +27,6 @@ double FusedBound(const std::vector<float>& h, const std::vector<float>& x, std:
 
 std::vector<float> Taps(std::size_t count, std::uint32_t seed) { return Noise(count, seed); }
 
-std::size_t AwkwardTotal() {
-    std::size_t total = 0;
-    for (std::size_t n : AwkwardLengths()) total += n;
-    return total;
-}
-
 std::vector<float> Symmetric(const std::vector<float>& half, std::size_t length) {
     std::vector<float> h(length);
     for (std::size_t k = 0; k < length; ++k) h[k] = half[std::min(k, length - 1 - k)];

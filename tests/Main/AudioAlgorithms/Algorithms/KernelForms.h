@@ -113,3 +113,26 @@ inline std::vector<float> Noise(std::size_t n, std::uint32_t seed) {
 }
 
 }  // namespace kerneltest
+
+namespace kerneltest {
+
+// Runs `body` once per runnable floating-point form, forced, with the name
+// the family should report (families without fused forms report the plain
+// form of the width).
+template <class Body>
+void ForEachForm(bool hasFusedForms, Body body) {
+    for (const Form& form : FloatForms()) {
+        if (!Runnable(form)) continue;
+        ora::system::ScopedDispatch forced(form.level, form.fma);
+        body(form, hasFusedForms ? std::string(form.name) : PlainName(form));
+    }
+}
+
+// The sum of AwkwardLengths(): a signal long enough to walk them all.
+inline std::size_t AwkwardTotal() {
+    std::size_t total = 0;
+    for (std::size_t n : AwkwardLengths()) total += n;
+    return total;
+}
+
+}  // namespace kerneltest

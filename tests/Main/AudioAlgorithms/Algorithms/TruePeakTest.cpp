@@ -220,8 +220,7 @@ TEST(UpsamplerTruePeak_x4, InterpolatesBandLimitedSignalsBetweenSamples) {
 }
 
 TEST(UpsamplerTruePeak_x4, EveryFormGivesTheReferenceResult) {
-    std::size_t total = 0;
-    for (std::size_t n : AwkwardLengths()) total += n;
+    const std::size_t total = AwkwardTotal();
     const std::vector<float> x = Noise(total, 9);
     for (TruePeakFilter filter : {TruePeakFilter::Standard, TruePeakFilter::Wideband}) {
         const UpsamplerTruePeakConfig config{1, filter};
