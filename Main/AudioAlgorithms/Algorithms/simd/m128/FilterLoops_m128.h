@@ -31,20 +31,29 @@ struct FusedMulAdd {
 template <class MulAdd>
 void FirOne(const float* run, const float* reversed, std::size_t taps, float* out, std::size_t frames) {
     std::size_t n = 0;
-    for (; n + 8 <= frames; n += 8) {
+    // Four independent sums hide the latency of the multiply-add.
+    for (; n + 16 <= frames; n += 16) {
         __m128 a0 = _mm_setzero_ps();
         __m128 a1 = _mm_setzero_ps();
+        __m128 a2 = _mm_setzero_ps();
+        __m128 a3 = _mm_setzero_ps();
         for (std::size_t j = 0; j < taps; ++j) {
             const __m128 h = _mm_load1_ps(reversed + j);
-            a0 = MulAdd::Vector(h, _mm_loadu_ps(run + n + j), a0);
-            a1 = MulAdd::Vector(h, _mm_loadu_ps(run + n + j + 4), a1);
+            const float* x = run + n + j;
+            a0 = MulAdd::Vector(h, _mm_loadu_ps(x), a0);
+            a1 = MulAdd::Vector(h, _mm_loadu_ps(x + 4), a1);
+            a2 = MulAdd::Vector(h, _mm_loadu_ps(x + 8), a2);
+            a3 = MulAdd::Vector(h, _mm_loadu_ps(x + 12), a3);
         }
         _mm_storeu_ps(out + n, a0);
         _mm_storeu_ps(out + n + 4, a1);
+        _mm_storeu_ps(out + n + 8, a2);
+        _mm_storeu_ps(out + n + 12, a3);
     }
     for (; n + 4 <= frames; n += 4) {
         __m128 a0 = _mm_setzero_ps();
-        for (std::size_t j = 0; j < taps; ++j) a0 = MulAdd::Vector(_mm_load1_ps(reversed + j), _mm_loadu_ps(run + n + j), a0);
+        for (std::size_t j = 0; j < taps; ++j)
+            a0 = MulAdd::Vector(_mm_load1_ps(reversed + j), _mm_loadu_ps(run + n + j), a0);
         _mm_storeu_ps(out + n, a0);
     }
     for (; n < frames; ++n) {

@@ -31,16 +31,24 @@ struct FusedMulAdd {
 template <class MulAdd>
 void FirOne(const float* run, const float* reversed, std::size_t taps, float* out, std::size_t frames) {
     std::size_t n = 0;
-    for (; n + 16 <= frames; n += 16) {
+    // Four independent sums hide the latency of the multiply-add.
+    for (; n + 32 <= frames; n += 32) {
         __m256 a0 = _mm256_setzero_ps();
         __m256 a1 = _mm256_setzero_ps();
+        __m256 a2 = _mm256_setzero_ps();
+        __m256 a3 = _mm256_setzero_ps();
         for (std::size_t j = 0; j < taps; ++j) {
             const __m256 h = _mm256_broadcast_ss(reversed + j);
-            a0 = MulAdd::Vector(h, _mm256_loadu_ps(run + n + j), a0);
-            a1 = MulAdd::Vector(h, _mm256_loadu_ps(run + n + j + 8), a1);
+            const float* x = run + n + j;
+            a0 = MulAdd::Vector(h, _mm256_loadu_ps(x), a0);
+            a1 = MulAdd::Vector(h, _mm256_loadu_ps(x + 8), a1);
+            a2 = MulAdd::Vector(h, _mm256_loadu_ps(x + 16), a2);
+            a3 = MulAdd::Vector(h, _mm256_loadu_ps(x + 24), a3);
         }
         _mm256_storeu_ps(out + n, a0);
         _mm256_storeu_ps(out + n + 8, a1);
+        _mm256_storeu_ps(out + n + 16, a2);
+        _mm256_storeu_ps(out + n + 24, a3);
     }
     for (; n + 8 <= frames; n += 8) {
         __m256 a0 = _mm256_setzero_ps();
