@@ -89,7 +89,8 @@ private:
 };
 
 FIR::FIR(const FIRConfig& config)
-    : m_config(config), m_form(ChooseForm(config.channels)),
+    : m_config(config),
+      m_form(ChooseForm(config.channels)),
       m_impl(std::make_unique<FIRImpl>(m_form, config, FilterHistory())) {}
 
 FIR::~FIR() = default;

@@ -96,7 +96,8 @@ private:
 };
 
 FIRS::FIRS(const FIRSConfig& config)
-    : m_config(Normalised(config)), m_form(ChooseForm(m_config.channels)),
+    : m_config(Normalised(config)),
+      m_form(ChooseForm(m_config.channels)),
       m_impl(std::make_unique<FIRSImpl>(m_form, m_config, FilterHistory())) {}
 
 FIRS::~FIRS() = default;

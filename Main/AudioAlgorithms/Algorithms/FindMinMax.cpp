@@ -80,7 +80,8 @@ private:
 };
 
 FindMinMax::FindMinMax(const FindMinMaxConfig& config)
-    : m_config(config), m_form(ChooseForm(config.channels)),
+    : m_config(config),
+      m_form(ChooseForm(config.channels)),
       m_impl(std::make_unique<FindMinMaxImpl>(m_form, std::max(config.channels, 0), FindMinMaxImpl::State())) {}
 
 FindMinMax::~FindMinMax() = default;
@@ -92,7 +93,9 @@ void FindMinMax::Reconfigure(const FindMinMaxConfig& config) {
     m_config = config;
 }
 
-void FindMinMax::Process(const float* interleaved, std::size_t frames) noexcept { m_impl->Process(interleaved, frames); }
+void FindMinMax::Process(const float* interleaved, std::size_t frames) noexcept {
+    m_impl->Process(interleaved, frames);
+}
 
 void FindMinMax::Reset() noexcept { m_impl->Reset(); }
 

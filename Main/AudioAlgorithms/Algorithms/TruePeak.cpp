@@ -116,7 +116,8 @@ private:
 };
 
 TruePeak::TruePeak(const TruePeakConfig& config)
-    : m_config(config), m_form(ChooseForm(config.channels)),
+    : m_config(config),
+      m_form(ChooseForm(config.channels)),
       m_impl(std::make_unique<TruePeakImpl>(m_form, config.channels, config.filter, TruePeakImpl::State())) {}
 
 TruePeak::~TruePeak() = default;

@@ -11,8 +11,7 @@ namespace ora::numeric {
 
 namespace kernels {
 
-void UpsamplerTruePeak_x4_ref(const float* run, const float* phases, std::size_t taps, float* out,
-                              std::size_t frames) {
+void UpsamplerTruePeak_x4_ref(const float* run, const float* phases, std::size_t taps, float* out, std::size_t frames) {
     const std::size_t identity = taps / 2 - 1;
     for (std::size_t n = 0; n < frames; ++n) {
         out[4 * n] = run[n + identity];
@@ -107,7 +106,8 @@ private:
 };
 
 UpsamplerTruePeak_x4::UpsamplerTruePeak_x4(const UpsamplerTruePeakConfig& config)
-    : m_config(config), m_form(ChooseForm(config.channels)),
+    : m_config(config),
+      m_form(ChooseForm(config.channels)),
       m_impl(std::make_unique<UpsamplerTruePeakImpl>(m_form, config, FilterHistory())) {}
 
 UpsamplerTruePeak_x4::~UpsamplerTruePeak_x4() = default;

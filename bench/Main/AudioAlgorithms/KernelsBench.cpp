@@ -44,7 +44,7 @@ struct Level {
 };
 
 const Level kLevels[] = {
-    {"ref", InstructionLevel::None, false, false},     {"m128", InstructionLevel::SSE2, false, false},
+    {"ref", InstructionLevel::None, false, false},      {"m128", InstructionLevel::SSE2, false, false},
     {"m128_fma", InstructionLevel::SSE42, true, false}, {"m256", InstructionLevel::AVX, false, false},
     {"m256_fma", InstructionLevel::AVX, true, false},   {"m128_sse41", InstructionLevel::SSE41, false, true},
     {"m256_avx2", InstructionLevel::AVX2, false, true},
@@ -85,99 +85,107 @@ std::vector<Family> Families() {
     auto out2 = std::make_shared<std::vector<float>>(8 * kFrames);
     std::vector<Family> families;
     families.push_back({"FIR/64 taps", true, false, [=] {
-        auto f = std::make_shared<FIR>(FIRConfig{1, Noise(64, 3)});
-        return std::function<void()>([=] { f->Process(a->data(), out->data(), kFrames); });
-    }});
+                            auto f = std::make_shared<FIR>(FIRConfig{1, Noise(64, 3)});
+                            return std::function<void()>([=] { f->Process(a->data(), out->data(), kFrames); });
+                        }});
     families.push_back({"FIR/64 taps, 2 ch", true, false, [=] {
-        auto f = std::make_shared<FIR>(FIRConfig{2, Noise(64, 3)});
-        return std::function<void()>([=] {
-            const float* in[2] = {a->data(), b->data()};
-            float* o[2] = {out->data(), out2->data()};
-            f->Process(in, o, kFrames);
-        });
-    }});
+                            auto f = std::make_shared<FIR>(FIRConfig{2, Noise(64, 3)});
+                            return std::function<void()>([=] {
+                                const float* in[2] = {a->data(), b->data()};
+                                float* o[2] = {out->data(), out2->data()};
+                                f->Process(in, o, kFrames);
+                            });
+                        }});
     families.push_back({"FIRS/65 taps", true, false, [=] {
-        auto f = std::make_shared<FIRS>(FIRSConfig{1, Noise(33, 4), 65});
-        return std::function<void()>([=] { f->Process(a->data(), out->data(), kFrames); });
-    }});
+                            auto f = std::make_shared<FIRS>(FIRSConfig{1, Noise(33, 4), 65});
+                            return std::function<void()>([=] { f->Process(a->data(), out->data(), kFrames); });
+                        }});
     for (TruePeakFilter filter : {TruePeakFilter::Standard, TruePeakFilter::Wideband}) {
         const bool wide = filter == TruePeakFilter::Wideband;
         families.push_back({wide ? "UpsamplerTruePeak_x4/wideband" : "UpsamplerTruePeak_x4/standard", true, false, [=] {
-            auto f = std::make_shared<UpsamplerTruePeak_x4>(UpsamplerTruePeakConfig{1, filter});
-            return std::function<void()>([=] { f->Process(a->data(), out->data(), kFrames); });
-        }});
+                                auto f = std::make_shared<UpsamplerTruePeak_x4>(UpsamplerTruePeakConfig{1, filter});
+                                return std::function<void()>([=] { f->Process(a->data(), out->data(), kFrames); });
+                            }});
         families.push_back({wide ? "TruePeak/wideband" : "TruePeak/standard", true, false, [=] {
-            auto f = std::make_shared<TruePeak>(TruePeakConfig{1, 1.0f, filter});
-            return std::function<void()>([=] { benchmark::DoNotOptimize(f->Process(a->data(), kFrames)); });
-        }});
+                                auto f = std::make_shared<TruePeak>(TruePeakConfig{1, 1.0f, filter});
+                                return std::function<void()>(
+                                    [=] { benchmark::DoNotOptimize(f->Process(a->data(), kFrames)); });
+                            }});
     }
     families.push_back({"FindMinMax/1 ch", false, false, [=] {
-        auto f = std::make_shared<FindMinMax>();
-        return std::function<void()>([=] { f->Process(a->data(), kFrames); });
-    }});
+                            auto f = std::make_shared<FindMinMax>();
+                            return std::function<void()>([=] { f->Process(a->data(), kFrames); });
+                        }});
     families.push_back({"FindMinMax/2 ch interleaved", false, false, [=] {
-        auto f = std::make_shared<FindMinMax>(FindMinMaxConfig{2});
-        return std::function<void()>([=] { f->Process(a->data(), kFrames); });
-    }});
+                            auto f = std::make_shared<FindMinMax>(FindMinMaxConfig{2});
+                            return std::function<void()>([=] { f->Process(a->data(), kFrames); });
+                        }});
     families.push_back({"LR2MS", false, false, [=] {
-        auto f = std::make_shared<LR2MS>();
-        return std::function<void()>([=] { f->Process(a->data(), b->data(), out->data(), out2->data(), kFrames); });
-    }});
+                            auto f = std::make_shared<LR2MS>();
+                            return std::function<void()>(
+                                [=] { f->Process(a->data(), b->data(), out->data(), out2->data(), kFrames); });
+                        }});
     families.push_back({"MS2LR", false, false, [=] {
-        auto f = std::make_shared<MS2LR>();
-        return std::function<void()>([=] { f->Process(a->data(), b->data(), out->data(), out2->data(), kFrames); });
-    }});
-    families.push_back({"Mix/4 sources", false, false, [=] {
-        auto f = std::make_shared<Mix>(MixConfig{{0.5f, -0.25f, 0.125f, 0.7f}});
-        return std::function<void()>([=] {
-            const float* sources[4] = {a->data(), b->data(), a->data() + kFrames, b->data() + kFrames};
-            f->Process(sources, out->data(), kFrames);
-        });
-    }});
+                            auto f = std::make_shared<MS2LR>();
+                            return std::function<void()>(
+                                [=] { f->Process(a->data(), b->data(), out->data(), out2->data(), kFrames); });
+                        }});
+    families.push_back(
+        {"Mix/4 sources", false, false, [=] {
+             auto f = std::make_shared<Mix>(MixConfig{{0.5f, -0.25f, 0.125f, 0.7f}});
+             return std::function<void()>([=] {
+                 const float* sources[4] = {a->data(), b->data(), a->data() + kFrames, b->data() + kFrames};
+                 f->Process(sources, out->data(), kFrames);
+             });
+         }});
     families.push_back({"Vec/Multiply", false, false, [=] {
-        auto f = std::make_shared<Vec>();
-        return std::function<void()>([=] { f->Multiply(a->data(), b->data(), out->data(), kFrames); });
-    }});
+                            auto f = std::make_shared<Vec>();
+                            return std::function<void()>(
+                                [=] { f->Multiply(a->data(), b->data(), out->data(), kFrames); });
+                        }});
     families.push_back({"Vec/Clamp", false, false, [=] {
-        auto f = std::make_shared<Vec>();
-        return std::function<void()>([=] { f->Clamp(a->data(), -0.5f, 0.5f, out->data(), kFrames); });
-    }});
+                            auto f = std::make_shared<Vec>();
+                            return std::function<void()>(
+                                [=] { f->Clamp(a->data(), -0.5f, 0.5f, out->data(), kFrames); });
+                        }});
     families.push_back({"Blas1/Dot", false, false, [=] {
-        auto f = std::make_shared<Blas1>();
-        return std::function<void()>([=] { benchmark::DoNotOptimize(f->Dot(a->data(), b->data(), kFrames)); });
-    }});
+                            auto f = std::make_shared<Blas1>();
+                            return std::function<void()>(
+                                [=] { benchmark::DoNotOptimize(f->Dot(a->data(), b->data(), kFrames)); });
+                        }});
     families.push_back({"Blas2/Gemv 16x16", false, false, [=] {
-        auto f = std::make_shared<Blas2>();
-        auto matrix = std::make_shared<std::vector<float>>(Noise(256, 5));
-        return std::function<void()>([=] {
-            // One product per frame, as a 16-line mixing matrix runs.
-            for (std::size_t n = 0; n + 16 <= kFrames; n += 16)
-                f->Gemv(matrix->data(), 16, 16, 16, a->data() + n, out->data() + n);
-        });
-    }});
+                            auto f = std::make_shared<Blas2>();
+                            auto matrix = std::make_shared<std::vector<float>>(Noise(256, 5));
+                            return std::function<void()>([=] {
+                                // One product per frame, as a 16-line mixing matrix runs.
+                                for (std::size_t n = 0; n + 16 <= kFrames; n += 16)
+                                    f->Gemv(matrix->data(), 16, 16, 16, a->data() + n, out->data() + n);
+                            });
+                        }});
     families.push_back({"Interleave/2 ch", false, false, [=] {
-        auto f = std::make_shared<Interleave>(InterleaveConfig{2});
-        return std::function<void()>([=] {
-            const float* in[2] = {a->data(), b->data()};
-            f->Process(in, out->data(), kFrames);
-        });
-    }});
+                            auto f = std::make_shared<Interleave>(InterleaveConfig{2});
+                            return std::function<void()>([=] {
+                                const float* in[2] = {a->data(), b->data()};
+                                f->Process(in, out->data(), kFrames);
+                            });
+                        }});
     families.push_back({"Deinterleave/2 ch", false, false, [=] {
-        auto f = std::make_shared<Deinterleave>(DeinterleaveConfig{2});
-        return std::function<void()>([=] {
-            float* o[2] = {out->data(), out2->data()};
-            f->Process(a->data(), o, kFrames);
-        });
-    }});
+                            auto f = std::make_shared<Deinterleave>(DeinterleaveConfig{2});
+                            return std::function<void()>([=] {
+                                float* o[2] = {out->data(), out2->data()};
+                                f->Process(a->data(), o, kFrames);
+                            });
+                        }});
     families.push_back({"CastFloatInt32/ToInt32", false, false, [=] {
-        auto f = std::make_shared<CastFloatInt32>();
-        auto ints = std::make_shared<std::vector<std::int32_t>>(kFrames);
-        return std::function<void()>([=] { f->ToInt32(a->data(), ints->data(), kFrames, CastFloatInt32::kPcm32Scale); });
-    }});
+                            auto f = std::make_shared<CastFloatInt32>();
+                            auto ints = std::make_shared<std::vector<std::int32_t>>(kFrames);
+                            return std::function<void()>(
+                                [=] { f->ToInt32(a->data(), ints->data(), kFrames, CastFloatInt32::kPcm32Scale); });
+                        }});
     families.push_back({"random::LCG", false, true, [=] {
-        auto f = std::make_shared<random::LCG>();
-        return std::function<void()>([=] { f->Generate(out->data(), kFrames); });
-    }});
+                            auto f = std::make_shared<random::LCG>();
+                            return std::function<void()>([=] { f->Generate(out->data(), kFrames); });
+                        }});
     return families;
 }
 

@@ -21,8 +21,8 @@ OversampledPeak::OversampledPeak() : m_taps(static_cast<std::size_t>(kFactor * 2
             const double tau = static_cast<double>(p) / kFactor - (j - kHalfWidth + 1);
             const double sinc = tau == 0.0 ? 1.0 : std::sin(kPi * tau) / (kPi * tau);
             const double r = tau / kHalfWidth;
-            const double window = std::cyl_bessel_i(0.0, kBeta * std::sqrt(std::max(0.0, 1.0 - r * r))) /
-                                  std::cyl_bessel_i(0.0, kBeta);
+            const double window =
+                std::cyl_bessel_i(0.0, kBeta * std::sqrt(std::max(0.0, 1.0 - r * r))) / std::cyl_bessel_i(0.0, kBeta);
             m_taps[static_cast<std::size_t>(p * 2 * kHalfWidth + j)] = sinc * window;
             sum += sinc * window;
         }

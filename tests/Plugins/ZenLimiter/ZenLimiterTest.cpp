@@ -139,8 +139,8 @@ double ExpectCeilingHolds(const std::string& name, const std::function<std::vect
             const std::vector<float> output = Limit(make(rate), settings, rate, block);
             const double peak = Db(OutputTruePeak(output));
             closest = std::max(closest, peak - ceiling);
-            EXPECT_LE(peak, ceiling + 1e-4) << name << " at " << rate << " Hz, ceiling " << ceiling << " dBTP, blocks of "
-                                            << block << ": true peak " << peak << " dBTP";
+            EXPECT_LE(peak, ceiling + 1e-4) << name << " at " << rate << " Hz, ceiling " << ceiling
+                                            << " dBTP, blocks of " << block << ": true peak " << peak << " dBTP";
         }
     }
     return closest;
@@ -189,7 +189,8 @@ TEST(ZenLimiter, DescriptorParametersAndMeters) {
 
     plugin.Prepare(2);
     ASSERT_EQ(plugin.Audio().GetMeterCount(), 5u);
-    const char* meters[] = {"Gain Reduction", "Input True Peak 1", "Output Peak 1", "Input True Peak 2", "Output Peak 2"};
+    const char* meters[] = {"Gain Reduction", "Input True Peak 1", "Output Peak 1", "Input True Peak 2",
+                            "Output Peak 2"};
     const char* units[] = {"dB", "dBTP", "dBFS", "dBTP", "dBFS"};
     for (std::uint32_t i = 0; i < 5; ++i) {
         zen::MeterInfo info;
@@ -233,9 +234,10 @@ TEST(ZenLimiter, LowAndMiddleSinesStayUnderTheCeiling) {
     double closest = -100.0;
     for (double frequency : {50.0, 1000.0, 5000.0}) {
         for (double phase : {0.7, kPi / 4}) {
-            closest = std::max(closest, ExpectCeilingHolds("sine " + std::to_string(frequency) + " Hz", [&](double rate) {
-                return zentest::Sine(frequency, rate, kFrames, 1.5, phase);
-            }));
+            closest =
+                std::max(closest, ExpectCeilingHolds("sine " + std::to_string(frequency) + " Hz", [&](double rate) {
+                             return zentest::Sine(frequency, rate, kFrames, 1.5, phase);
+                         }));
         }
     }
     ReportClosest(closest);
@@ -246,9 +248,10 @@ TEST(ZenLimiter, HighSinesUpTo15kHzStayUnderTheCeiling) {
     double closest = -100.0;
     for (double frequency : {11025.0, 12000.0, 14700.0, 15000.0}) {
         for (double phase : {0.7, kPi / 4}) {
-            closest = std::max(closest, ExpectCeilingHolds("sine " + std::to_string(frequency) + " Hz", [&](double rate) {
-                return zentest::Sine(frequency, rate, kFrames, 1.5, phase);
-            }));
+            closest =
+                std::max(closest, ExpectCeilingHolds("sine " + std::to_string(frequency) + " Hz", [&](double rate) {
+                             return zentest::Sine(frequency, rate, kFrames, 1.5, phase);
+                         }));
         }
     }
     ReportClosest(closest);
@@ -257,16 +260,19 @@ TEST(ZenLimiter, HighSinesUpTo15kHzStayUnderTheCeiling) {
 TEST(ZenLimiter, SquaresImpulsesAndInterSamplePeaksStayUnderTheCeiling) {
     ReportClosest(std::max(
         {ExpectCeilingHolds("square 1 kHz", [](double rate) { return Square(1000.0, rate, kFrames, 1.0); }),
-         ExpectCeilingHolds("square 7 kHz", [](double rate) { return Square(7000.0, rate, kFrames, 0.8); }, 6.0f),
+         ExpectCeilingHolds(
+             "square 7 kHz", [](double rate) { return Square(7000.0, rate, kFrames, 0.8); }, 6.0f),
          ExpectCeilingHolds("impulses", [](double) { return Impulses(kFrames); }),
          ExpectCeilingHolds("inter-sample peaks", [](double rate) { return InterSamplePeaks(rate, kFrames); })}));
 }
 
 TEST(ZenLimiter, NoiseAndMusicLikeMaterialStayUnderTheCeiling) {
-    ReportClosest(std::max(
-        {ExpectCeilingHolds("full-scale noise", [](double) { return zentest::Noise(kFrames, 1.0, 3); }),
-         ExpectCeilingHolds("full-scale noise +12 dB", [](double) { return zentest::Noise(kFrames, 1.0, 4); }, 12.0f),
-         ExpectCeilingHolds("music-like", [](double rate) { return MusicLike(rate, kFrames); }, 6.0f)}));
+    ReportClosest(
+        std::max({ExpectCeilingHolds("full-scale noise", [](double) { return zentest::Noise(kFrames, 1.0, 3); }),
+                  ExpectCeilingHolds(
+                      "full-scale noise +12 dB", [](double) { return zentest::Noise(kFrames, 1.0, 4); }, 12.0f),
+                  ExpectCeilingHolds(
+                      "music-like", [](double rate) { return MusicLike(rate, kFrames); }, 6.0f)}));
 }
 
 TEST(ZenLimiter, SinesAbove15kHzOvershootByLittle) {
@@ -277,7 +283,9 @@ TEST(ZenLimiter, SinesAbove15kHzOvershootByLittle) {
     double worst = -100.0;
     std::string where;
     for (float rate : {44100.0f, 48000.0f, 96000.0f}) {
-        for (double frequency = 15500.0; frequency < rate / 2; frequency += frequency > rate / 2 - 700.0 ? 100.0 : (rate < 50000.0f ? 1000.0 : 4000.0)) {
+        for (double frequency = 15500.0; frequency<rate / 2; frequency += frequency> rate / 2 - 700.0
+                                             ? 100.0
+                                             : (rate < 50000.0f ? 1000.0 : 4000.0)) {
             for (double phase : {0.0, 1.1}) {
                 Settings settings;
                 settings.ceilingDb = -1.0f;
@@ -288,11 +296,13 @@ TEST(ZenLimiter, SinesAbove15kHzOvershootByLittle) {
                 const std::vector<float> output = plugin.Run(input, 1, 512)[0];
                 double gain = 0.0;
                 for (std::size_t n = 12000; n < output.size(); ++n)
-                    if (std::fabs(input[n - latency]) > 0.5) gain = std::max(gain, double(output[n] / input[n - latency]));
+                    if (std::fabs(input[n - latency]) > 0.5)
+                        gain = std::max(gain, double(output[n] / input[n - latency]));
                 const double over = Db(gain * amplitude) - settings.ceilingDb;
                 if (over > worst) {
                     worst = over;
-                    where = std::to_string(static_cast<int>(frequency)) + " Hz at " + std::to_string(static_cast<int>(rate)) + " Hz";
+                    where = std::to_string(static_cast<int>(frequency)) + " Hz at " +
+                            std::to_string(static_cast<int>(rate)) + " Hz";
                 }
             }
         }
@@ -414,7 +424,8 @@ TEST(ZenLimiter, SoftShapesOnlyBlocksOverTheCeilingWithItsKnee) {
     std::vector<double> ratios;
     for (std::size_t n = 40000; n < 40100; ++n) {
         const float x = input[n - latency];
-        const float shaped = std::fabs(x) >= knee ? std::copysign(knee * std::tanh(std::fabs(x) / knee) / 0.7615942f, x) : x;
+        const float shaped =
+            std::fabs(x) >= knee ? std::copysign(knee * std::tanh(std::fabs(x) / knee) / 0.7615942f, x) : x;
         if (std::fabs(shaped) > 0.1f) ratios.push_back(output[n] / shaped);
     }
     for (double r : ratios) EXPECT_NEAR(r, ratios.front(), 1e-5);
@@ -428,7 +439,8 @@ TEST(ZenLimiter, AnyBlockSplitGivesTheSameOutputAndResetReproduces) {
     settings.soft = true;
     const std::vector<float> input = MusicLike(48000.0, 20000);
     const std::vector<float> whole = Limit(input, settings, 48000.0f, 20000);
-    for (std::uint32_t block : {1u, 7u, 256u, 8192u}) EXPECT_EQ(Limit(input, settings, 48000.0f, block), whole) << block;
+    for (std::uint32_t block : {1u, 7u, 256u, 8192u})
+        EXPECT_EQ(Limit(input, settings, 48000.0f, block), whole) << block;
 
     PluginHarness plugin = Limiter(settings, 1, 48000.0f, 512);
     plugin.Run(zentest::Noise(9000, 1.0, 2), 1, 512);

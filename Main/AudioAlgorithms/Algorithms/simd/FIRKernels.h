@@ -36,12 +36,12 @@ void FIRS_c1_m128(const float* run, const float* half, std::size_t length, float
 void FIRS_c1_m128_fma(const float* run, const float* half, std::size_t length, float* out, std::size_t frames);
 void FIRS_c1_m256(const float* run, const float* half, std::size_t length, float* out, std::size_t frames);
 void FIRS_c1_m256_fma(const float* run, const float* half, std::size_t length, float* out, std::size_t frames);
-void FIRS_c2_m128(const float* run0, const float* run1, const float* half, std::size_t length, float* out0,
-                  float* out1, std::size_t frames);
+void FIRS_c2_m128(const float* run0, const float* run1, const float* half, std::size_t length, float* out0, float* out1,
+                  std::size_t frames);
 void FIRS_c2_m128_fma(const float* run0, const float* run1, const float* half, std::size_t length, float* out0,
                       float* out1, std::size_t frames);
-void FIRS_c2_m256(const float* run0, const float* run1, const float* half, std::size_t length, float* out0,
-                  float* out1, std::size_t frames);
+void FIRS_c2_m256(const float* run0, const float* run1, const float* half, std::size_t length, float* out0, float* out1,
+                  std::size_t frames);
 void FIRS_c2_m256_fma(const float* run0, const float* run1, const float* half, std::size_t length, float* out0,
                       float* out1, std::size_t frames);
 

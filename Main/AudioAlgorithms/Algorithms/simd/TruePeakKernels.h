@@ -23,16 +23,13 @@ using UpsampleTruePeakKernel = void (*)(const float* run, const float* phases, s
 // `peak`.
 using ScanTruePeakKernel = float (*)(const float* points, std::size_t middles, float peak);
 
-void UpsamplerTruePeak_x4_ref(const float* run, const float* phases, std::size_t taps, float* out,
-                                  std::size_t frames);
-void UpsamplerTruePeak_x4_m128(const float* run, const float* phases, std::size_t taps, float* out,
-                                  std::size_t frames);
+void UpsamplerTruePeak_x4_ref(const float* run, const float* phases, std::size_t taps, float* out, std::size_t frames);
+void UpsamplerTruePeak_x4_m128(const float* run, const float* phases, std::size_t taps, float* out, std::size_t frames);
 void UpsamplerTruePeak_x4_m128_fma(const float* run, const float* phases, std::size_t taps, float* out,
-                                  std::size_t frames);
-void UpsamplerTruePeak_x4_m256(const float* run, const float* phases, std::size_t taps, float* out,
-                                  std::size_t frames);
+                                   std::size_t frames);
+void UpsamplerTruePeak_x4_m256(const float* run, const float* phases, std::size_t taps, float* out, std::size_t frames);
 void UpsamplerTruePeak_x4_m256_fma(const float* run, const float* phases, std::size_t taps, float* out,
-                                  std::size_t frames);
+                                   std::size_t frames);
 
 float TruePeakScan_ref(const float* points, std::size_t middles, float peak);
 float TruePeakScan_m128(const float* points, std::size_t middles, float peak);

@@ -23,6 +23,21 @@ constexpr double kReleaseFactor = 4.0;
 
 float LevelDb(float peak, float silence) { return peak > 0.0f ? 20.0f * std::log10(peak) : silence; }
 
+// A raised-cosine window of `length` taps summing to 1, symmetric: its first
+// half, the middle included.
+std::vector<float> RampHalf(std::size_t length) {
+    std::vector<double> window(length);
+    double sum = 0.0;
+    for (std::size_t k = 0; k < length; ++k) {
+        const double s = std::sin(kPi * static_cast<double>(k + 1) / static_cast<double>(length + 1));
+        window[k] = s * s;
+        sum += window[k];
+    }
+    std::vector<float> half((length + 1) / 2);
+    for (std::size_t k = 0; k < half.size(); ++k) half[k] = static_cast<float>(window[k] / sum);
+    return half;
+}
+
 }  // namespace
 
 ZenLimiter::ZenLimiter() : m_ceiling(1, zen::DbToGainFloored(-kCeilingMarginDb)) {
@@ -81,7 +96,7 @@ void ZenLimiter::PrepareProcessing(float sampleRate, std::uint32_t maxBlockSize)
     const std::uint32_t channels = GetProcessChannelCount();
     const double scale = sampleRate / kReferenceRate;
     const ora::numeric::TruePeakConfig truePeak{1, 1.0f, ora::numeric::TruePeakFilter::Wideband};
-    m_truePeakLatency = static_cast<std::uint32_t>(ora::numeric::TruePeak(truePeak).GetLatency());
+    m_truePeakLatency = static_cast<std::uint32_t>(ora::numeric::UpsamplerTruePeak_x4::Latency(truePeak.filter));
     m_lookAheadLength = std::max(1u, static_cast<std::uint32_t>(std::lround(kLookAheadAt48k * scale)));
     m_blockLength = kHoldsPerBlock * static_cast<std::uint32_t>(kHoldFactor * (m_truePeakLatency + m_lookAheadLength));
 
@@ -94,21 +109,11 @@ void ZenLimiter::PrepareProcessing(float sampleRate, std::uint32_t maxBlockSize)
         m_samplePeaks.push_back(std::make_unique<ora::numeric::FindMinMax>(ora::numeric::FindMinMaxConfig{1}));
     }
     m_gains.assign(m_blockLength, 1.0f);
-    // A raised-cosine window as long as the look-ahead: a drop ends just as
-    // the block that caused it arrives, and without the splatter of a step,
-    // whose band-limited waveform would overshoot the ceiling between samples.
+    // A drop spreads over the look-ahead and ends just as the block that
+    // caused it arrives: a step would splatter, and its band-limited
+    // waveform overshoot the ceiling between samples.
     const std::size_t rampLength = m_lookAheadLength + 1;
-    std::vector<float> ramp((rampLength + 1) / 2);
-    double sum = 0.0;
-    for (std::size_t k = 0; k < rampLength; ++k) {
-        const double s = std::sin(kPi * static_cast<double>(k + 1) / static_cast<double>(rampLength + 1));
-        sum += s * s;
-    }
-    for (std::size_t k = 0; k < ramp.size(); ++k) {
-        const double s = std::sin(kPi * static_cast<double>(k + 1) / static_cast<double>(rampLength + 1));
-        ramp[k] = static_cast<float>(s * s / sum);
-    }
-    m_gainRamp.Reconfigure(ora::numeric::FIRSConfig{1, ramp, rampLength});
+    m_gainRamp.Reconfigure(ora::numeric::FIRSConfig{1, RampHalf(rampLength), rampLength});
     m_lastChannelCount = channels;
     SetLatency(m_blockLength + m_truePeakLatency + m_lookAheadLength);
     Clear();
@@ -126,11 +131,10 @@ void ZenLimiter::Clear() noexcept {
     m_gain = 1.0f;
     m_target = 1.0f;
     m_hold = 0;
-    // The ramp starts from unity gain.
     m_appliedGain = 1.0f;
     m_gainRamp.Reset();
-    // The first block ends once the true-peak latency has passed, so that
-    // every later block boundary of the measurement meets one of the buffer.
+    // The first block ends once the true-peak latency has passed: from then
+    // on a block's reading is complete as its first sample leaves the buffer.
     m_position = m_blockLength - m_truePeakLatency;
     for (std::uint32_t c = 0; c < kMaxChannels; ++c) {
         m_inputTruePeak[c].store(0.0f, std::memory_order_relaxed);
@@ -177,7 +181,8 @@ void ZenLimiter::ApplyGain(float* const* channels, std::uint32_t channelCount, s
     m_gainRamp.Process(m_gains.data(), m_gains.data(), frames);
     for (std::size_t i = 0; i < frames; ++i) m_gains[i] = 1.0f - m_gains[i];
     m_appliedGain = m_gains[frames - 1];
-    for (std::uint32_t c = 0; c < channelCount; ++c) m_vec.Multiply(channels[c] + offset, m_gains.data(), channels[c] + offset, frames);
+    for (std::uint32_t c = 0; c < channelCount; ++c)
+        m_vec.Multiply(channels[c] + offset, m_gains.data(), channels[c] + offset, frames);
 }
 
 void ZenLimiter::ProcessBlock(float* const* channels, std::uint32_t channelCount, std::uint32_t frames) noexcept {

@@ -1,7 +1,8 @@
 // "Limiter": a true-peak brick-wall limiter. Input gain, an optional tanh
-// soft stage, and one gain for all channels that drops at once to the value
-// bringing a block's true peak to the ceiling, holds, and recovers with a
-// one-pole release; it is applied to a delayed copy of the signal.
+// soft stage, and one gain for all channels that drops to the value bringing
+// a block's true peak to the ceiling before the block arrives, holds, and
+// recovers with a one-pole release; it is applied to a delayed copy of the
+// signal.
 //
 // The gain is decided on a fixed grid of internal blocks (GetBlockLength()
 // samples, whatever the host's block size), so the sound does not depend on
@@ -113,9 +114,9 @@ private:
     std::vector<float> m_gains;     // per sample of a segment
 
     struct ChannelBlock {
-        float truePeak = 0.0f;           // running, of the block being measured
-        float samplePeak = 0.0f;         // of the block being measured, once complete
-        bool soft = false;               // the block leaving the buffer takes the soft stage
+        float truePeak = 0.0f;    // running, of the block being measured
+        float samplePeak = 0.0f;  // of the block being measured, once complete
+        bool soft = false;        // the block leaving the buffer takes the soft stage
     };
     std::array<ChannelBlock, kMaxChannels> m_blocks{};
     float m_knee = kSoftKneeMax;  // of the block leaving the buffer

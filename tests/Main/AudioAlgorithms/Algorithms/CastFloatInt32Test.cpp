@@ -12,12 +12,22 @@ using namespace kerneltest;
 using ora::numeric::CastFloatInt32;
 
 TEST(CastFloatInt32, RoundsTiesToEvenSaturatesAndSendsNaNToZero) {
-    const std::vector<float> in = {0.5f, 1.5f, 2.5f, -0.5f, -1.5f, 1.4999999f, 3e9f, -3e9f, 1.0f, -1.0f, std::nanf(""), INFINITY};
+    const std::vector<float> in = {0.5f, 1.5f,  2.5f, -0.5f, -1.5f,         1.4999999f,
+                                   3e9f, -3e9f, 1.0f, -1.0f, std::nanf(""), INFINITY};
     std::vector<std::int32_t> out(in.size());
     const CastFloatInt32 cast;
     cast.ToInt32(in.data(), out.data(), in.size(), 1.0f);
-    const std::vector<std::int32_t> want = {0, 2, 2, 0, -2, 1, std::numeric_limits<std::int32_t>::max() - 127,
-                                            std::numeric_limits<std::int32_t>::min(), 1, -1, 0,
+    const std::vector<std::int32_t> want = {0,
+                                            2,
+                                            2,
+                                            0,
+                                            -2,
+                                            1,
+                                            std::numeric_limits<std::int32_t>::max() - 127,
+                                            std::numeric_limits<std::int32_t>::min(),
+                                            1,
+                                            -1,
+                                            0,
                                             std::numeric_limits<std::int32_t>::max() - 127};
     EXPECT_EQ(out, want);
     // Full scale at the PCM scale: +1.0 saturates just below 2^31, -1.0 is exact.
@@ -30,7 +40,8 @@ TEST(CastFloatInt32, RoundsTiesToEvenSaturatesAndSendsNaNToZero) {
 
 TEST(CastFloatInt32, TwentyFourBitSamplesRoundTripExactly) {
     std::vector<float> in(4096);
-    for (std::size_t i = 0; i < in.size(); ++i) in[i] = static_cast<float>(static_cast<int>(i * 4093 % 16777216) - 8388608) / 8388608.0f;
+    for (std::size_t i = 0; i < in.size(); ++i)
+        in[i] = static_cast<float>(static_cast<int>(i * 4093 % 16777216) - 8388608) / 8388608.0f;
     std::vector<std::int32_t> pcm(in.size());
     std::vector<float> back(in.size());
     const CastFloatInt32 cast;

@@ -97,7 +97,8 @@ TEST(FIR, EveryFormGivesTheReferenceResult) {
                                 ASSERT_LE(std::fabs(double(out[c][i]) - expected), bound)
                                     << form.name << " taps " << taps << " at " << position + i;
                             } else {
-                                ASSERT_EQ(out[c][i], expected) << form.name << " taps " << taps << " at " << position + i;
+                                ASSERT_EQ(out[c][i], expected)
+                                    << form.name << " taps " << taps << " at " << position + i;
                             }
                         }
                     }
@@ -156,7 +157,8 @@ TEST(FIRS, MatchesTheFullFilterForOddAndEvenLengths) {
         std::vector<float> ys(x.size()), yf(x.size());
         symmetric.Process(x.data(), ys.data(), x.size());
         full.Process(x.data(), yf.data(), x.size());
-        for (std::size_t n = 0; n < x.size(); ++n) EXPECT_NEAR(ys[n], yf[n], 1e-5) << "length " << length << " at " << n;
+        for (std::size_t n = 0; n < x.size(); ++n)
+            EXPECT_NEAR(ys[n], yf[n], 1e-5) << "length " << length << " at " << n;
         EXPECT_EQ(symmetric.GetLatency(), (length - 1) / 2);
     }
 }
@@ -195,8 +197,7 @@ TEST(FIRS, EveryFormGivesTheReferenceResult) {
                             const float got = c == 0 ? o0[i] : o1[i];
                             const float want = c == 0 ? r0[position + i] : r1[position + i];
                             if (form.fused)
-                                ASSERT_LE(std::fabs(double(got) - want),
-                                          FusedBound(h, c == 0 ? x0 : x1, position + i))
+                                ASSERT_LE(std::fabs(double(got) - want), FusedBound(h, c == 0 ? x0 : x1, position + i))
                                     << form.name;
                             else
                                 ASSERT_EQ(got, want) << form.name << " length " << length << " at " << position + i;

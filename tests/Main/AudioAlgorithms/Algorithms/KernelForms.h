@@ -5,10 +5,10 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cmath>
 #include <cstdint>
 #include <cstring>
-#include <algorithm>
 #include <string>
 #include <vector>
 
@@ -29,7 +29,7 @@ struct Form {
 // The floating-point ladder's forms, each forced by the settings that pick it.
 inline const std::vector<Form>& FloatForms() {
     static const std::vector<Form> forms = {
-        {"ref", InstructionLevel::None, false, false},   {"m128", InstructionLevel::SSE2, false, false},
+        {"ref", InstructionLevel::None, false, false},     {"m128", InstructionLevel::SSE2, false, false},
         {"m128_fma", InstructionLevel::SSE42, true, true}, {"m256", InstructionLevel::AVX, false, false},
         {"m256_fma", InstructionLevel::AVX, true, true},
     };
@@ -53,8 +53,8 @@ inline bool Runnable(const Form& form) {
 }
 
 inline const std::vector<std::size_t>& AwkwardLengths() {
-    static const std::vector<std::size_t> lengths = {0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15, 16, 17,
-                                                     65, 999, 4095};
+    static const std::vector<std::size_t> lengths = {0,  1,  2,  3,  4,  5,  6,  7,  8,   9,   10,
+                                                     11, 12, 13, 14, 15, 16, 17, 65, 999, 4095};
     return lengths;
 }
 

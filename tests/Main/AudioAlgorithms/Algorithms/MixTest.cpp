@@ -54,7 +54,8 @@ TEST(Mix, EveryFormGivesTheReferenceResult) {
                 Guarded<> out(n);
                 mix.Process(ip.data(), out.data(), n);
                 ASSERT_TRUE(out.GuardsIntact()) << name;
-                for (std::size_t i = 0; i < n; ++i) ASSERT_EQ(out[i], want[position + i]) << name << " at " << position + i;
+                for (std::size_t i = 0; i < n; ++i)
+                    ASSERT_EQ(out[i], want[position + i]) << name << " at " << position + i;
                 position += n;
             }
         });

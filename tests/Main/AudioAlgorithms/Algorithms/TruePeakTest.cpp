@@ -19,8 +19,8 @@ using namespace kerneltest;
 using ora::numeric::TruePeak;
 using ora::numeric::TruePeakConfig;
 using ora::numeric::TruePeakFilter;
-using ora::numeric::UpsamplerTruePeakConfig;
 using ora::numeric::UpsamplerTruePeak_x4;
+using ora::numeric::UpsamplerTruePeakConfig;
 using ora::system::ScopedDispatch;
 
 namespace {
@@ -87,7 +87,8 @@ std::vector<Case> Tech3341Cases() {
     // fs/6, crest halfway between samples: samples at -7.27 dBFS.
     cases.push_back({"8 kHz, crest between samples, -6 dBTP", Sine(8000, rate, frames, 0.5, kPi / 3), -6.0206});
     // Samples 1, 1, -1, -1: a 0 dBFS sample peak, +3.01 dBTP.
-    cases.push_back({"12 kHz at 45 degrees, samples at 0 dBFS", Sine(12000, rate, frames, std::sqrt(2.0), kPi / 4), 3.0103});
+    cases.push_back(
+        {"12 kHz at 45 degrees, samples at 0 dBFS", Sine(12000, rate, frames, std::sqrt(2.0), kPi / 4), 3.0103});
     cases.push_back({"1 kHz, 0 dBTP", Sine(1000, rate, frames, 1.0, 0.37), 0.0});
     // A 6 kHz burst of 10 ms with 2 ms raised-cosine edges, -3 dBTP.
     std::vector<float> burst(frames, 0.0f);
@@ -123,17 +124,18 @@ TEST(TruePeak, SinesUpTo15kHzReadWithinAFewHundredthsOfADecibel) {
     // points miss the crest the most.
     double worst = 0.0;
     for (TruePeakFilter filter : {TruePeakFilter::Standard, TruePeakFilter::Wideband})
-    for (double rate : {44100.0, 48000.0, 96000.0}) {
-        for (double frequency : {100.0, 997.0, 5000.0, 11025.0, 12000.0, 14700.0, 15000.0, rate / 3.0, rate / 4.0}) {
-            if (frequency > 15000.0) continue;
-            for (int k = 0; k < 8; ++k) {
-                const double phase = 2.0 * kPi * k / 8.0 + 0.05;
-                const double reading = Db(Reading(Sine(frequency, rate, 4096, 0.5, phase), 0, filter));
-                worst = std::max(worst, std::fabs(reading - Db(0.5)));
-                EXPECT_NEAR(reading, Db(0.5), 0.03) << frequency << " Hz at " << rate << ", phase " << k;
+        for (double rate : {44100.0, 48000.0, 96000.0}) {
+            for (double frequency :
+                 {100.0, 997.0, 5000.0, 11025.0, 12000.0, 14700.0, 15000.0, rate / 3.0, rate / 4.0}) {
+                if (frequency > 15000.0) continue;
+                for (int k = 0; k < 8; ++k) {
+                    const double phase = 2.0 * kPi * k / 8.0 + 0.05;
+                    const double reading = Db(Reading(Sine(frequency, rate, 4096, 0.5, phase), 0, filter));
+                    worst = std::max(worst, std::fabs(reading - Db(0.5)));
+                    EXPECT_NEAR(reading, Db(0.5), 0.03) << frequency << " Hz at " << rate << ", phase " << k;
+                }
             }
         }
-    }
     std::printf("worst true-peak error of sines up to 15 kHz: %.4f dB\n", worst);
 }
 

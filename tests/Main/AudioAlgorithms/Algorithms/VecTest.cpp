@@ -14,16 +14,23 @@ using ora::numeric::Vec;
 namespace {
 
 // Each operation on (a, b) into out, by name.
-const std::vector<std::pair<const char*, std::function<void(const Vec&, const float*, const float*, float*, std::size_t)>>>&
+const std::vector<
+    std::pair<const char*, std::function<void(const Vec&, const float*, const float*, float*, std::size_t)>>>&
 Operations() {
-    static const std::vector<std::pair<const char*, std::function<void(const Vec&, const float*, const float*, float*, std::size_t)>>> ops = {
-        {"add", [](const Vec& v, const float* a, const float* b, float* o, std::size_t n) { v.Add(a, b, o, n); }},
-        {"subtract", [](const Vec& v, const float* a, const float* b, float* o, std::size_t n) { v.Subtract(a, b, o, n); }},
-        {"multiply", [](const Vec& v, const float* a, const float* b, float* o, std::size_t n) { v.Multiply(a, b, o, n); }},
-        {"scale", [](const Vec& v, const float* a, const float*, float* o, std::size_t n) { v.Scale(a, -1.7f, o, n); }},
-        {"abs", [](const Vec& v, const float* a, const float*, float* o, std::size_t n) { v.Abs(a, o, n); }},
-        {"clamp", [](const Vec& v, const float* a, const float*, float* o, std::size_t n) { v.Clamp(a, -0.5f, 0.25f, o, n); }},
-    };
+    static const std::vector<
+        std::pair<const char*, std::function<void(const Vec&, const float*, const float*, float*, std::size_t)>>>
+        ops = {
+            {"add", [](const Vec& v, const float* a, const float* b, float* o, std::size_t n) { v.Add(a, b, o, n); }},
+            {"subtract",
+             [](const Vec& v, const float* a, const float* b, float* o, std::size_t n) { v.Subtract(a, b, o, n); }},
+            {"multiply",
+             [](const Vec& v, const float* a, const float* b, float* o, std::size_t n) { v.Multiply(a, b, o, n); }},
+            {"scale",
+             [](const Vec& v, const float* a, const float*, float* o, std::size_t n) { v.Scale(a, -1.7f, o, n); }},
+            {"abs", [](const Vec& v, const float* a, const float*, float* o, std::size_t n) { v.Abs(a, o, n); }},
+            {"clamp", [](const Vec& v, const float* a, const float*, float* o,
+                         std::size_t n) { v.Clamp(a, -0.5f, 0.25f, o, n); }},
+        };
     return ops;
 }
 
@@ -39,7 +46,8 @@ TEST(Vec, OperationsFollowTheirDefinitions) {
     for (int i = 0; i < 37; ++i) EXPECT_EQ(out[i], a[i] * b[i]);
     vec.Clamp(a.data(), -0.5f, 0.25f, out.data(), 37);
     for (int i = 0; i < 37; ++i) EXPECT_EQ(out[i], std::min(std::max(a[i], -0.5f), 0.25f));
-    const std::vector<float> special = {std::nanf(""), -0.0f, INFINITY, -INFINITY, 0.3f, -2.0f, 1.0f, 0.0f, std::nanf("")};
+    const std::vector<float> special = {std::nanf(""), -0.0f, INFINITY, -INFINITY,    0.3f,
+                                        -2.0f,         1.0f,  0.0f,     std::nanf("")};
     vec.Clamp(special.data(), -0.5f, 0.25f, out.data(), special.size());
     EXPECT_EQ(out[0], -0.5f);  // NaN goes to the low bound
     EXPECT_EQ(out[2], 0.25f);

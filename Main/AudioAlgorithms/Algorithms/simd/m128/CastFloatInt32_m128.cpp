@@ -29,7 +29,8 @@ void Int32ToFloat_m128(const std::int32_t* in, float* out, std::size_t n, float 
     const __m128 factor = _mm_set1_ps(scale);
     std::size_t i = 0;
     for (; i + 4 <= n; i += 4)
-        _mm_storeu_ps(out + i, _mm_mul_ps(_mm_cvtepi32_ps(_mm_loadu_si128(reinterpret_cast<const __m128i*>(in + i))), factor));
+        _mm_storeu_ps(out + i,
+                      _mm_mul_ps(_mm_cvtepi32_ps(_mm_loadu_si128(reinterpret_cast<const __m128i*>(in + i))), factor));
     for (; i < n; ++i) out[i] = static_cast<float>(in[i]) * scale;
 }
 

@@ -8,8 +8,8 @@ void FIRS_c1_m128(const float* run, const float* half, std::size_t length, float
     FirSymmetricOne<SeparateMulAdd>(run, half, length, out, frames);
 }
 
-void FIRS_c2_m128(const float* run0, const float* run1, const float* half, std::size_t length, float* out0,
-                  float* out1, std::size_t frames) {
+void FIRS_c2_m128(const float* run0, const float* run1, const float* half, std::size_t length, float* out0, float* out1,
+                  std::size_t frames) {
     FirSymmetricTwo<SeparateMulAdd>(run0, run1, half, length, out0, out1, frames);
 }
 

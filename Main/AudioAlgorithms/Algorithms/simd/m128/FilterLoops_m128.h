@@ -12,7 +12,6 @@
 
 #include <cstddef>
 
-
 namespace {
 
 struct SeparateMulAdd {
@@ -109,7 +108,8 @@ void FirSymmetricOne(const float* run, const float* half, std::size_t length, fl
     }
     for (; n < frames; ++n) {
         float acc = 0.0f;
-        for (std::size_t j = 0; j < pairs; ++j) acc = MulAdd::Scalar(half[j], run[n + j] + run[n + length - 1 - j], acc);
+        for (std::size_t j = 0; j < pairs; ++j)
+            acc = MulAdd::Scalar(half[j], run[n + j] + run[n + length - 1 - j], acc);
         if (middle) acc = MulAdd::Scalar(half[pairs], run[n + pairs], acc);
         out[n] = acc;
     }

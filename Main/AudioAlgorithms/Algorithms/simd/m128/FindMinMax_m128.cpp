@@ -45,7 +45,8 @@ void FindMinMax_c1_m128(const float* x, std::size_t frames, float* mn, float* mx
 void FindMinMax_c2_m128(const float* x, std::size_t frames, float* mn, float* mx) {
     __m128 lo, hi;
     std::size_t done;
-    Run(x, 2 * frames, _mm_setr_ps(mn[0], mn[1], mn[0], mn[1]), _mm_setr_ps(mx[0], mx[1], mx[0], mx[1]), &lo, &hi, &done);
+    Run(x, 2 * frames, _mm_setr_ps(mn[0], mn[1], mn[0], mn[1]), _mm_setr_ps(mx[0], mx[1], mx[0], mx[1]), &lo, &hi,
+        &done);
     lo = _mm_min_ps(lo, _mm_movehl_ps(lo, lo));
     hi = _mm_max_ps(hi, _mm_movehl_ps(hi, hi));
     mn[0] = _mm_cvtss_f32(lo);

@@ -29,7 +29,9 @@ void Int32ToFloat_m256(const std::int32_t* in, float* out, std::size_t n, float 
     const __m256 factor = _mm256_set1_ps(scale);
     std::size_t i = 0;
     for (; i + 8 <= n; i += 8)
-        _mm256_storeu_ps(out + i, _mm256_mul_ps(_mm256_cvtepi32_ps(_mm256_loadu_si256(reinterpret_cast<const __m256i*>(in + i))), factor));
+        _mm256_storeu_ps(
+            out + i,
+            _mm256_mul_ps(_mm256_cvtepi32_ps(_mm256_loadu_si256(reinterpret_cast<const __m256i*>(in + i))), factor));
     for (; i < n; ++i) out[i] = static_cast<float>(in[i]) * scale;
 }
 

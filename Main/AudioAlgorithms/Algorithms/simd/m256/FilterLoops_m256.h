@@ -12,7 +12,6 @@
 
 #include <cstddef>
 
-
 namespace {
 
 struct SeparateMulAdd {
@@ -109,7 +108,8 @@ void FirSymmetricOne(const float* run, const float* half, std::size_t length, fl
     }
     for (; n < frames; ++n) {
         float acc = 0.0f;
-        for (std::size_t j = 0; j < pairs; ++j) acc = MulAdd::Scalar(half[j], run[n + j] + run[n + length - 1 - j], acc);
+        for (std::size_t j = 0; j < pairs; ++j)
+            acc = MulAdd::Scalar(half[j], run[n + j] + run[n + length - 1 - j], acc);
         if (middle) acc = MulAdd::Scalar(half[pairs], run[n + pairs], acc);
         out[n] = acc;
     }
@@ -126,8 +126,10 @@ void FirSymmetricTwo(const float* run0, const float* run1, const float* half, st
         __m256 a1 = _mm256_setzero_ps();
         for (std::size_t j = 0; j < pairs; ++j) {
             const __m256 h = _mm256_broadcast_ss(half + j);
-            a0 = MulAdd::Vector(h, _mm256_add_ps(_mm256_loadu_ps(run0 + n + j), _mm256_loadu_ps(run0 + n + length - 1 - j)), a0);
-            a1 = MulAdd::Vector(h, _mm256_add_ps(_mm256_loadu_ps(run1 + n + j), _mm256_loadu_ps(run1 + n + length - 1 - j)), a1);
+            a0 = MulAdd::Vector(
+                h, _mm256_add_ps(_mm256_loadu_ps(run0 + n + j), _mm256_loadu_ps(run0 + n + length - 1 - j)), a0);
+            a1 = MulAdd::Vector(
+                h, _mm256_add_ps(_mm256_loadu_ps(run1 + n + j), _mm256_loadu_ps(run1 + n + length - 1 - j)), a1);
         }
         if (middle) {
             const __m256 h = _mm256_broadcast_ss(half + pairs);
@@ -200,8 +202,9 @@ inline float ScanTruePeak(const float* points, std::size_t middles, float peak) 
         const __m256 d = _mm256_add_ps(_mm256_sub_ps(b, a), _mm256_sub_ps(b, c));
         const __m256 t = _mm256_sub_ps(c, a);
         const __m256 vertex = _mm256_add_ps(b, _mm256_div_ps(_mm256_mul_ps(t, t), _mm256_mul_ps(eight, d)));
-        const __m256 isPeak = _mm256_and_ps(_mm256_and_ps(_mm256_cmp_ps(b, a, _CMP_GE_OQ), _mm256_cmp_ps(b, c, _CMP_GE_OQ)),
-                                            _mm256_cmp_ps(d, zero, _CMP_GT_OQ));
+        const __m256 isPeak =
+            _mm256_and_ps(_mm256_and_ps(_mm256_cmp_ps(b, a, _CMP_GE_OQ), _mm256_cmp_ps(b, c, _CMP_GE_OQ)),
+                          _mm256_cmp_ps(d, zero, _CMP_GT_OQ));
         best = _mm256_max_ps(_mm256_blendv_ps(b, vertex, isPeak), best);
     }
     __m128 half = _mm_max_ps(_mm256_castps256_ps128(best), _mm256_extractf128_ps(best, 1));

@@ -44,7 +44,8 @@ void Clamp(const float* a, float lo, float hi, float* out, std::size_t n) {
     const __m256 low = _mm256_set1_ps(lo);
     const __m256 high = _mm256_set1_ps(hi);
     std::size_t i = 0;
-    for (; i + 8 <= n; i += 8) _mm256_storeu_ps(out + i, _mm256_min_ps(_mm256_max_ps(_mm256_loadu_ps(a + i), low), high));
+    for (; i + 8 <= n; i += 8)
+        _mm256_storeu_ps(out + i, _mm256_min_ps(_mm256_max_ps(_mm256_loadu_ps(a + i), low), high));
     for (; i < n; ++i) {
         float v = a[i] > lo ? a[i] : lo;
         out[i] = v < hi ? v : hi;

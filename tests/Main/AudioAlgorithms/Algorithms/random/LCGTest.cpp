@@ -4,8 +4,8 @@
 
 #include <cmath>
 
-#include "Algorithms/random/LCG.h"
 #include "../KernelForms.h"
+#include "Algorithms/random/LCG.h"
 
 using namespace kerneltest;
 using ora::numeric::random::LCG;
@@ -46,7 +46,9 @@ TEST(LCG, EveryFormGivesTheSameSequenceInAnySplit) {
     struct IntegerForm {
         const char* name;
         InstructionLevel level;
-    } forms[] = {{"ref", InstructionLevel::SSE2}, {"m128_sse41", InstructionLevel::SSE41}, {"m256_avx2", InstructionLevel::AVX2}};
+    } forms[] = {{"ref", InstructionLevel::SSE2},
+                 {"m128_sse41", InstructionLevel::SSE41},
+                 {"m256_avx2", InstructionLevel::AVX2}};
     for (const IntegerForm& form : forms) {
         if (!Runnable(Form{form.name, form.level, false, false})) continue;
         ora::system::ScopedDispatch forced(form.level, false);
@@ -57,7 +59,8 @@ TEST(LCG, EveryFormGivesTheSameSequenceInAnySplit) {
             Guarded<> out(n);
             lcg.Generate(out.data(), n);
             ASSERT_TRUE(out.GuardsIntact()) << form.name;
-            for (std::size_t i = 0; i < n; ++i) ASSERT_EQ(out[i], want[position + i]) << form.name << " at " << position + i;
+            for (std::size_t i = 0; i < n; ++i)
+                ASSERT_EQ(out[i], want[position + i]) << form.name << " at " << position + i;
             position += n;
         }
     }
