@@ -143,12 +143,43 @@ void FirSymmetricTwo(const float* run0, const float* run1, const float* half, st
     }
 }
 
+// The four points of four inputs, phase by phase, stored in time order:
+// (p0 p1 p2 p3) of each input, in input order.
+inline void StoreTimeOrdered(__m128 p0, __m128 p1, __m128 p2, __m128 p3, float* out) {
+    _MM_TRANSPOSE4_PS(p0, p1, p2, p3);
+    _mm_storeu_ps(out, p0);
+    _mm_storeu_ps(out + 4, p1);
+    _mm_storeu_ps(out + 8, p2);
+    _mm_storeu_ps(out + 12, p3);
+}
+
 // Four points per input in time order: the input itself, delayed, then the
 // three interpolating phases.
 template <class MulAdd>
 void UpsampleTruePeak(const float* run, const float* phases, std::size_t taps, float* out, std::size_t frames) {
     const std::size_t identity = taps / 2 - 1;
     std::size_t n = 0;
+    // Two groups of inputs at once: six independent sums hide the latency of
+    // the multiply-add.
+    for (; n + 8 <= frames; n += 8) {
+        __m128 a1 = _mm_setzero_ps(), a2 = _mm_setzero_ps(), a3 = _mm_setzero_ps();
+        __m128 b1 = _mm_setzero_ps(), b2 = _mm_setzero_ps(), b3 = _mm_setzero_ps();
+        for (std::size_t j = 0; j < taps; ++j) {
+            const __m128 x = _mm_loadu_ps(run + n + j);
+            const __m128 y = _mm_loadu_ps(run + n + 4 + j);
+            const __m128 h1 = _mm_load1_ps(phases + j);
+            const __m128 h2 = _mm_load1_ps(phases + taps + j);
+            const __m128 h3 = _mm_load1_ps(phases + 2 * taps + j);
+            a1 = MulAdd::Vector(h1, x, a1);
+            b1 = MulAdd::Vector(h1, y, b1);
+            a2 = MulAdd::Vector(h2, x, a2);
+            b2 = MulAdd::Vector(h2, y, b2);
+            a3 = MulAdd::Vector(h3, x, a3);
+            b3 = MulAdd::Vector(h3, y, b3);
+        }
+        StoreTimeOrdered(_mm_loadu_ps(run + n + identity), a1, a2, a3, out + 4 * n);
+        StoreTimeOrdered(_mm_loadu_ps(run + n + 4 + identity), b1, b2, b3, out + 4 * (n + 4));
+    }
     for (; n + 4 <= frames; n += 4) {
         __m128 p1 = _mm_setzero_ps();
         __m128 p2 = _mm_setzero_ps();
@@ -159,13 +190,7 @@ void UpsampleTruePeak(const float* run, const float* phases, std::size_t taps, f
             p2 = MulAdd::Vector(_mm_load1_ps(phases + taps + j), x, p2);
             p3 = MulAdd::Vector(_mm_load1_ps(phases + 2 * taps + j), x, p3);
         }
-        __m128 p0 = _mm_loadu_ps(run + n + identity);
-        _MM_TRANSPOSE4_PS(p0, p1, p2, p3);
-        float* o = out + 4 * n;
-        _mm_storeu_ps(o, p0);
-        _mm_storeu_ps(o + 4, p1);
-        _mm_storeu_ps(o + 8, p2);
-        _mm_storeu_ps(o + 12, p3);
+        StoreTimeOrdered(_mm_loadu_ps(run + n + identity), p1, p2, p3, out + 4 * n);
     }
     for (; n < frames; ++n) {
         out[4 * n] = run[n + identity];

@@ -145,12 +145,50 @@ void FirSymmetricTwo(const float* run0, const float* run1, const float* half, st
     }
 }
 
+// The four points of eight inputs, phase by phase, stored in time order:
+// (p0 p1 p2 p3) of each input, in input order.
+inline void StoreTimeOrdered(__m256 p0, __m256 p1, __m256 p2, __m256 p3, float* out) {
+    const __m256 t0 = _mm256_unpacklo_ps(p0, p1);
+    const __m256 t1 = _mm256_unpackhi_ps(p0, p1);
+    const __m256 t2 = _mm256_unpacklo_ps(p2, p3);
+    const __m256 t3 = _mm256_unpackhi_ps(p2, p3);
+    const __m256 u0 = _mm256_shuffle_ps(t0, t2, _MM_SHUFFLE(1, 0, 1, 0));
+    const __m256 u1 = _mm256_shuffle_ps(t0, t2, _MM_SHUFFLE(3, 2, 3, 2));
+    const __m256 u2 = _mm256_shuffle_ps(t1, t3, _MM_SHUFFLE(1, 0, 1, 0));
+    const __m256 u3 = _mm256_shuffle_ps(t1, t3, _MM_SHUFFLE(3, 2, 3, 2));
+    _mm256_storeu_ps(out, _mm256_permute2f128_ps(u0, u1, 0x20));
+    _mm256_storeu_ps(out + 8, _mm256_permute2f128_ps(u2, u3, 0x20));
+    _mm256_storeu_ps(out + 16, _mm256_permute2f128_ps(u0, u1, 0x31));
+    _mm256_storeu_ps(out + 24, _mm256_permute2f128_ps(u2, u3, 0x31));
+}
+
 // Four points per input in time order: the input itself, delayed, then the
 // three interpolating phases.
 template <class MulAdd>
 void UpsampleTruePeak(const float* run, const float* phases, std::size_t taps, float* out, std::size_t frames) {
     const std::size_t identity = taps / 2 - 1;
     std::size_t n = 0;
+    // Two groups of inputs at once: six independent sums hide the latency of
+    // the multiply-add.
+    for (; n + 16 <= frames; n += 16) {
+        __m256 a1 = _mm256_setzero_ps(), a2 = _mm256_setzero_ps(), a3 = _mm256_setzero_ps();
+        __m256 b1 = _mm256_setzero_ps(), b2 = _mm256_setzero_ps(), b3 = _mm256_setzero_ps();
+        for (std::size_t j = 0; j < taps; ++j) {
+            const __m256 x = _mm256_loadu_ps(run + n + j);
+            const __m256 y = _mm256_loadu_ps(run + n + 8 + j);
+            const __m256 h1 = _mm256_broadcast_ss(phases + j);
+            const __m256 h2 = _mm256_broadcast_ss(phases + taps + j);
+            const __m256 h3 = _mm256_broadcast_ss(phases + 2 * taps + j);
+            a1 = MulAdd::Vector(h1, x, a1);
+            b1 = MulAdd::Vector(h1, y, b1);
+            a2 = MulAdd::Vector(h2, x, a2);
+            b2 = MulAdd::Vector(h2, y, b2);
+            a3 = MulAdd::Vector(h3, x, a3);
+            b3 = MulAdd::Vector(h3, y, b3);
+        }
+        StoreTimeOrdered(_mm256_loadu_ps(run + n + identity), a1, a2, a3, out + 4 * n);
+        StoreTimeOrdered(_mm256_loadu_ps(run + n + 8 + identity), b1, b2, b3, out + 4 * (n + 8));
+    }
     for (; n + 8 <= frames; n += 8) {
         __m256 p1 = _mm256_setzero_ps();
         __m256 p2 = _mm256_setzero_ps();
@@ -161,21 +199,7 @@ void UpsampleTruePeak(const float* run, const float* phases, std::size_t taps, f
             p2 = MulAdd::Vector(_mm256_broadcast_ss(phases + taps + j), x, p2);
             p3 = MulAdd::Vector(_mm256_broadcast_ss(phases + 2 * taps + j), x, p3);
         }
-        const __m256 p0 = _mm256_loadu_ps(run + n + identity);
-        // 4 x 8 to time order: (p0 p1 p2 p3) of each input, in input order.
-        const __m256 t0 = _mm256_unpacklo_ps(p0, p1);
-        const __m256 t1 = _mm256_unpackhi_ps(p0, p1);
-        const __m256 t2 = _mm256_unpacklo_ps(p2, p3);
-        const __m256 t3 = _mm256_unpackhi_ps(p2, p3);
-        const __m256 u0 = _mm256_shuffle_ps(t0, t2, _MM_SHUFFLE(1, 0, 1, 0));
-        const __m256 u1 = _mm256_shuffle_ps(t0, t2, _MM_SHUFFLE(3, 2, 3, 2));
-        const __m256 u2 = _mm256_shuffle_ps(t1, t3, _MM_SHUFFLE(1, 0, 1, 0));
-        const __m256 u3 = _mm256_shuffle_ps(t1, t3, _MM_SHUFFLE(3, 2, 3, 2));
-        float* o = out + 4 * n;
-        _mm256_storeu_ps(o, _mm256_permute2f128_ps(u0, u1, 0x20));
-        _mm256_storeu_ps(o + 8, _mm256_permute2f128_ps(u2, u3, 0x20));
-        _mm256_storeu_ps(o + 16, _mm256_permute2f128_ps(u0, u1, 0x31));
-        _mm256_storeu_ps(o + 24, _mm256_permute2f128_ps(u2, u3, 0x31));
+        StoreTimeOrdered(_mm256_loadu_ps(run + n + identity), p1, p2, p3, out + 4 * n);
     }
     for (; n < frames; ++n) {
         out[4 * n] = run[n + identity];
