@@ -378,6 +378,35 @@ TEST(ZenLimiter, ReleaseRecoversSlowerForLongerTimes) {
     EXPECT_NEAR(slow / fast, 4.0, 0.4);
 }
 
+TEST(ZenLimiter, ReleaseFollowsItsOnePoleLaw) {
+    // After a loud burst, a steady quiet level: where the gain moves, the
+    // reduction (1 - g) shrinks by c = exp(-1 / (4 max(n, 1))) per sample,
+    // n the release time in samples (0 ms counts as one sample).
+    for (float releaseMs : {0.0f, 1.0f, 10.0f}) {
+        Settings settings;
+        settings.ceilingDb = -12.0f;
+        settings.releaseMs = releaseMs;
+        std::vector<float> input(30000, 0.05f);
+        for (std::size_t n = 1000; n < 1100; ++n) input[n] = 1.0f;
+        PluginHarness plugin = Limiter(settings, 1, 48000.0f, 512);
+        const std::uint32_t latency = plugin.Audio().GetLatency();
+        const std::vector<float> output = plugin.Run(input, 1, 512)[0];
+        const double samples = std::max(1.0, std::trunc(48.0 * releaseMs));
+        const double c = std::exp(-1.0 / (4.0 * samples));
+        int checked = 0;
+        const auto reduction = [&](std::size_t n) { return 1.0 - output[n] / 0.05; };
+        for (std::size_t n = 1100 + latency; n + 8 < output.size(); ++n) {
+            // Inside a stretch of release, away from the holds and the ramp:
+            // the reduction falls geometrically over eight samples.
+            const double first = reduction(n + 1) / reduction(n), last = reduction(n + 8) / reduction(n + 7);
+            if (reduction(n + 8) < 1e-3 || !(first < 1.0 - 1e-5) || std::fabs(first - last) > 1e-5) continue;
+            EXPECT_NEAR(reduction(n + 8) / reduction(n), std::pow(c, 8), 1e-3) << releaseMs << " ms at " << n;
+            ++checked;
+        }
+        EXPECT_GT(checked, 5) << releaseMs;
+    }
+}
+
 TEST(ZenLimiter, SoftShapesOnlyBlocksOverTheCeilingWithItsKnee) {
     // The soft stage changes the waveform (adds harmonics) only when it is
     // on and the block's true peak is over the ceiling, and only samples at
