@@ -25,13 +25,13 @@ const zen::ParameterTableDefinition& DePop::Definitions() {
     static const zen::ParameterTableDefinition table = zen::MakeParameterTable(
         "DePop",
         {
-            zen::ContinuousParameter("THRES", QT_TRANSLATE_NOOP("DePop", "Threshold"), -50.0f, 0.0f, -20.0f, 0.1f,
+            zen::ContinuousParameter("THRES", QT_TRANSLATE_NOOP("DePop", "Threshold"), -50.0f, 0.0f, -24.0f, 0.1f,
                                      "dB"),
-            zen::ContinuousParameter("RATIO", QT_TRANSLATE_NOOP("DePop", "Ratio"), 1.2f, 20.0f, 4.0f, 0.1f),
+            zen::ContinuousParameter("RATIO", QT_TRANSLATE_NOOP("DePop", "Ratio"), 1.2f, 20.0f, 6.0f, 0.1f),
             zen::LogarithmicParameter("FREQUENCY", QT_TRANSLATE_NOOP("DePop", "Frequency"), 40.0f, 400.0f, 120.0f,
                                       1.0f, "Hz"),
-            zen::ContinuousParameter("ATTACK", QT_TRANSLATE_NOOP("DePop", "Attack"), 0.1f, 20.0f, 0.5f, 0.1f, "ms"),
-            zen::ContinuousParameter("RELEASE", QT_TRANSLATE_NOOP("DePop", "Release"), 20.0f, 500.0f, 60.0f, 1.0f,
+            zen::ContinuousParameter("ATTACK", QT_TRANSLATE_NOOP("DePop", "Attack"), 0.1f, 20.0f, 0.2f, 0.1f, "ms"),
+            zen::ContinuousParameter("RELEASE", QT_TRANSLATE_NOOP("DePop", "Release"), 20.0f, 500.0f, 40.0f, 1.0f,
                                      "ms"),
         });
     return table;
