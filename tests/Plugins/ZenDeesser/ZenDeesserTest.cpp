@@ -138,3 +138,21 @@ TEST(ZenDeesser, NoLatencyMonoOrStereoAndSplitsDoNotMatter) {
     EXPECT_FALSE(plugin.Audio().ConfigureChannels(3, 3));
     EXPECT_FALSE(plugin.Audio().ConfigureChannels(1, 2));
 }
+
+TEST(ZenDeesser, NonFiniteInputDoesNotPoisonLaterSamples) {
+    const zentest::SpeechLike speech = zentest::MakeSpeechLike(48000.0, 4);
+    PluginHarness reference("De-Esser");
+    reference.Prepare(1);
+    const std::vector<float> clean = reference.Run(speech.samples)[0];
+    for (float bad : {NAN, INFINITY}) {
+        std::vector<float> input = speech.samples;
+        const std::size_t at = speech.sibilants[1].first + 500;  // inside a burst
+        input[at] = bad;
+        PluginHarness plugin("De-Esser");
+        plugin.Prepare(1);
+        const std::vector<float> out = plugin.Run(input, 1, 512)[0];
+        const std::size_t later = speech.vowels[2].first;
+        for (std::size_t n = at + 1; n < out.size(); ++n) ASSERT_TRUE(std::isfinite(out[n])) << n;
+        EXPECT_NEAR(zentest::ToDb(zentest::Rms(out, later) / zentest::Rms(clean, later)), 0.0, 0.1) << bad;
+    }
+}

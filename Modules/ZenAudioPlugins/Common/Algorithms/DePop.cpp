@@ -2,6 +2,7 @@
 
 #include <QCoreApplication>
 #include <algorithm>
+#include <cmath>
 
 namespace {
 
@@ -93,6 +94,9 @@ bool DePop::Process(float* const* channels, std::uint64_t count) {
             lanes[channelCount + c] = m_scratch.data() + c * m_scratchFrames;
         }
         m_filter.Process(lanes, lanes + channelCount, length);
+        // A non-finite input would stay in the filter's state for good.
+        for (std::uint64_t c = 0; c < channelCount; ++c)
+            if (!std::isfinite(lanes[channelCount + c][length - 1])) m_filter.Reset();
         if (!m_compressor.Process(lanes, length)) return false;
         done += length;
     }

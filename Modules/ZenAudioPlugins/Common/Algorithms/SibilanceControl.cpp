@@ -2,6 +2,7 @@
 
 #include <QCoreApplication>
 #include <algorithm>
+#include <cmath>
 
 #include "../Decibels.h"
 
@@ -138,6 +139,14 @@ bool SibilanceControl::Process(float* const* channels, std::uint64_t count) {
 void SibilanceControl::ProcessPiece(float* const* channels, std::uint64_t channelCount, std::uint64_t count) noexcept {
     float* filtered[kMaxChannels] = {m_scratch.data(), m_scratch.data() + m_scratchFrames};
     m_band.Process(channels, filtered, count);
+    // A non-finite input would stay in the band's state for good and starve
+    // the band tracker; where the copy went bad, the input stands in for it.
+    for (std::uint64_t c = 0; c < channelCount; ++c) {
+        if (std::isfinite(filtered[c][count - 1])) continue;
+        m_band.Reset();
+        for (std::uint64_t n = 0; n < count; ++n)
+            if (!std::isfinite(filtered[c][n])) filtered[c][n] = channels[c][n];
+    }
     const float listen = m_listen / m_bandGain;
     for (std::uint64_t n = 0; n < count; ++n) {
         for (std::uint64_t c = 0; c < channelCount; ++c) {
