@@ -30,8 +30,9 @@ inline float LogUnitsToGain(float g) { return std::exp2(g * kLog2Of10); }
 
 // Hold length: trunc(fs * t / 1000) samples, never negative.
 inline std::int32_t HoldSamples(int sampleRate, float milliseconds) {
+    constexpr float kLongest = 2.0e9f;  // keeps the count inside 32 bits
     const float samples = static_cast<float>(sampleRate) * milliseconds / 1000.0f;
-    return samples > 0.0f ? static_cast<std::int32_t>(samples) : 0;
+    return samples > 0.0f ? static_cast<std::int32_t>(std::min(samples, kLongest)) : 0;
 }
 
 // One-pole envelope step E <- a*E + (1 - a)*L, with a = exp(-1 / (fs * t / 1000)).

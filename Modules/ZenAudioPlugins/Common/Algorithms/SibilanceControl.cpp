@@ -86,7 +86,7 @@ bool SibilanceControl::SetParameter(std::uint64_t index, float value) {
         case kFrequency: m_band.SetParameter(BiQuad::kFreq, value); break;
         case kGain:
             m_band.SetParameter(BiQuad::kGain, value);
-            m_bandGain = zen::DbToGain(value);
+            m_bandGain = zen::DbToGainFloored(value);  // divided by when listening
             break;
         case kQ: m_band.SetParameter(BiQuad::kQ, value); break;
         case kAttack:
