@@ -4,6 +4,7 @@
 #include <lv2/buf-size/buf-size.h>
 
 #include <algorithm>
+#include <cmath>
 #include <stdexcept>
 
 namespace zentest {
@@ -16,6 +17,15 @@ std::string AsString(const LilvNode* node) {
 }
 
 }  // namespace
+
+float ParameterValueAt(const zen::ParameterInfo& info, float fraction) {
+    if (info.kind == zen::ParameterKind::Switch) return fraction >= 0.5f ? 1.0f : 0.0f;
+    if (info.kind == zen::ParameterKind::List && info.choices.size() > 1) {
+        const auto last = static_cast<float>(info.choices.size() - 1);
+        return info.minimum + std::round(fraction * last) * info.step;
+    }
+    return info.minimum + fraction * (info.maximum - info.minimum);
+}
 
 bool Lv2Port::Has(const char* propertyUri) const {
     return std::find(properties.begin(), properties.end(), propertyUri) != properties.end();

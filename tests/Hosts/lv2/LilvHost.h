@@ -12,7 +12,13 @@
 #include <utility>
 #include <vector>
 
+#include "zen/ParameterInfo.h"
+
 namespace zentest {
+
+// A value at `fraction` of a parameter's range, on a step for switches and
+// lists: the settings the LV2 tests give every plug-in.
+float ParameterValueAt(const zen::ParameterInfo& info, float fraction);
 
 struct Lv2Port {
     std::uint32_t index = 0;

@@ -56,17 +56,6 @@ Direct CreateDirect(const std::string& uri) {
     return {};
 }
 
-// A value inside the parameter's range at `fraction` of it, on a step for
-// switches and lists.
-float ValueAt(const zen::ParameterInfo& info, float fraction) {
-    if (info.kind == zen::ParameterKind::Switch) return fraction >= 0.5f ? 1.0f : 0.0f;
-    if (info.kind == zen::ParameterKind::List && info.choices.size() > 1) {
-        const auto last = static_cast<float>(info.choices.size() - 1);
-        return info.minimum + std::round(fraction * last) * info.step;
-    }
-    return info.minimum + fraction * (info.maximum - info.minimum);
-}
-
 // Control inputs by parameter index, found by label as a host author would.
 std::map<std::uint32_t, std::uint32_t> ParameterPorts(const LilvRun& run, Direct& direct) {
     std::map<std::uint32_t, std::uint32_t> ports;  // port -> parameter index
@@ -179,7 +168,7 @@ TEST(Lv2Bundle, PortsCarryTheParameterTableMetersAndLatency) {
                       info.taper == zen::ParameterTaper::Logarithmic && info.minimum > 0.0f);
             ASSERT_EQ(port.scalePoints.size(), info.choices.size());
             for (std::size_t i = 0; i < info.choices.size(); ++i) {
-                EXPECT_EQ(port.scalePoints[i].first, ValueAt(info, static_cast<float>(i) / (info.choices.size() - 1)));
+                EXPECT_EQ(port.scalePoints[i].first, zentest::ParameterValueAt(info, static_cast<float>(i) / (info.choices.size() - 1)));
                 EXPECT_EQ(port.scalePoints[i].second, info.choices[i]);
             }
         }
@@ -203,7 +192,7 @@ TEST(Lv2Bundle, ProcessesLikeTheLibraryAtBothRatesThroughChangingBlocksAndSettin
                     zen::ParameterInfo info;
                     direct.audio->GetParameterInfo(parameter, info);
                     const float f = edges ? static_cast<float>(random() % 2) : fraction(random);
-                    run.Control(port) = ValueAt(info, f);
+                    run.Control(port) = zentest::ParameterValueAt(info, f);
                     direct.audio->SetParameter(parameter, run.Control(port));
                 }
             };
