@@ -14,17 +14,5 @@ TEST(Lv2Catalog, UrisAreFixedByKeyAndLayout) {
               Catalog::MakeUri("Dialogue Leveler:1516596844", "stereo"));
     EXPECT_EQ(Catalog::MakeUri("De-Esser:1516596851", "mono"), "urn:zenaudioplugins:De-Esser:1516596851:mono");
     EXPECT_EQ(Catalog::MakeUri("A/B \"x\":-5", "mono"), "urn:zenaudioplugins:A%2FB%20%22x%22:-5:mono");
-}
-
-TEST(Lv2Catalog, PercentEncodingKeepsOnlyUnreservedCharacters) {
-    EXPECT_EQ(Catalog::PercentEncode("Az09-._~"), "Az09-._~");
-    EXPECT_EQ(Catalog::PercentEncode("a b:c#d%"), "a%20b%3Ac%23d%25");
-    EXPECT_EQ(Catalog::PercentEncode("\xC3\xA9"), "%C3%A9");  // UTF-8 bytes one by one
-}
-
-TEST(Lv2Catalog, LayoutNames) {
-    EXPECT_EQ(Catalog::LayoutName(1, 1), "mono");
-    EXPECT_EQ(Catalog::LayoutName(2, 2), "stereo");
-    EXPECT_EQ(Catalog::LayoutName(1, 2), "mono-to-stereo");
-    EXPECT_EQ(Catalog::LayoutName(0, 2), "stereo");  // no audio input: named by its outputs
+    EXPECT_EQ(Catalog::MakeUri("Caf\xC3\xA9#1:7", "mono-to-stereo"), "urn:zenaudioplugins:Caf%C3%A9%231:7:mono-to-stereo");
 }

@@ -109,18 +109,22 @@ TEST(Lv2Tools, Lv2lsAndLv2infoShowEveryPluginWithItsPorts) {
 }
 
 // Every plug-in of the shipped bundle, and those only the test library has
-// ("Test Delay", with latency), in every layout: the same file, the same
-// settings, one frame per block as lv2apply runs, and the delay kept.
+// ("Test Delay", with latency), in its widest layout (the lilv test covers
+// every layout): the same file, the same settings, one frame per block as
+// lv2apply runs, and the delay kept.
 TEST(Lv2Tools, Lv2applyProcessesAWavFileAsZenfxDoes) {
     zentest::TempFolder folder;
     std::set<std::string> done;
     for (const Bundle& bundle : {kShipped, kTest}) {
         zentest::LilvHost host(bundle.folder);
         zenlv2::Library library({bundle.library});
-        for (const zenlv2::Variant& variant : zenlv2::Catalog::Build(library)) {
-            if (!done.insert(variant.uri).second) continue;
+        const std::vector<zenlv2::Variant> variants = zenlv2::Catalog::Build(library);
+        for (std::size_t v = 0; v < variants.size(); ++v) {
+            const zenlv2::Variant& variant = variants[v];
+            const bool widest = v + 1 == variants.size() || variants[v + 1].key != variant.key;
+            if (!widest || !done.insert(variant.key).second) continue;
             SCOPED_TRACE(variant.uri);
-            constexpr std::size_t kFrames = 3000;
+            constexpr std::size_t kFrames = 2000;
             std::vector<std::vector<float>> channels;
             for (std::uint32_t c = 0; c < std::max(variant.inputs, 1u); ++c) {
                 std::vector<float> x(kFrames);
@@ -168,5 +172,5 @@ TEST(Lv2Tools, Lv2applyProcessesAWavFileAsZenfxDoes) {
             }
         }
     }
-    EXPECT_GE(done.size(), 4u);
+    EXPECT_GE(done.size(), 2u);
 }
