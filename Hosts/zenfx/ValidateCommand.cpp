@@ -5,6 +5,7 @@
 #include <nlohmann/json.hpp>
 
 #include "Commands.h"
+#include "ValidationContext.h"
 #include "Validator.h"
 #include "ZenfxError.h"
 
@@ -24,8 +25,8 @@ struct Counts {
         }
     }
     std::string Text() const {
-        return std::to_string(passed) + " checks passed, " + std::to_string(failed) + " failed, " +
-               std::to_string(skipped) + " skipped";
+        return Count(static_cast<std::uint64_t>(passed), "check") + " passed, " + std::to_string(failed) +
+               " failed, " + std::to_string(skipped) + " skipped";
     }
 };
 
