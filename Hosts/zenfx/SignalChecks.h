@@ -11,7 +11,7 @@ public:
     // A tail or latency longer than this is not believed.
     static constexpr double kLongestTailSeconds = 60.0;
     // Denormal-range input may cost at most this many times normal input.
-    static constexpr double kDenormalSlowdownLimit = 4.0;
+    static constexpr double kDenormalSlowdownLimit = 2.0;
 
     explicit SignalChecks(ValidationContext& context) : m_context(context) {}
     void Run();
