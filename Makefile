@@ -48,11 +48,11 @@ test-asan: setup
 	    ctest --output-on-failure -j $(JOBS)
 
 # The validator's thread checks under ThreadSanitizer; only the library, zenfx
-# and the test library are built.
+# and the test libraries are built.
 test-tsan: setup
 	@$(CMAKE) -S . -B $(TSAN_DIR) $(COMMON_FLAGS) -DZEN_SANITIZE_THREAD=ON -DZEN_BUILD_BENCHMARKS=OFF \
 	    -DCMAKE_BUILD_TYPE=Debug "-DCMAKE_CXX_FLAGS_DEBUG=-g -O1" >/dev/null
-	@$(CMAKE) --build $(TSAN_DIR) -j $(JOBS) --target zenfx ZenTestPlugins
+	@$(CMAKE) --build $(TSAN_DIR) -j $(JOBS) --target zenfx ZenTestPlugins ZenFaultyPlugins
 	cd $(TSAN_DIR) && ctest --output-on-failure -j $(JOBS)
 
 bench: build

@@ -99,6 +99,7 @@ void SignalChecks::Run() {
 }
 
 CheckOutcome SignalChecks::Silence() {
+    if (!m_context.NewInstance()->HasAudioInput()) return Skip("no audio input");
     std::vector<std::vector<float>> settings = {m_context.Defaults()};
     for (int i = 0; i < m_context.Level(); ++i) settings.push_back(m_context.RandomSetting());
     for (double rate : m_context.CheckRates()) {

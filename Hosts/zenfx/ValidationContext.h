@@ -22,8 +22,8 @@ public:
 
     // The rate most checks run at.
     static constexpr double kSampleRate = 48000.0;
-    // The largest block most checks prepare for: odd on purpose, and below
-    // 4096 so that the base's splitting of long blocks is exercised.
+    // The largest block most checks prepare for: not a power of two, and
+    // below 4096 so that the base's splitting of long blocks is exercised.
     static constexpr std::uint32_t kMaxBlock = 1500;
     static constexpr std::uint32_t kBlock = 512;
     // Level of the test signals: -6 dBFS.

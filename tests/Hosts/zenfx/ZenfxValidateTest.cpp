@@ -24,8 +24,14 @@ nlohmann::json ValidateJson(const std::vector<std::string>& arguments, int expec
     return nlohmann::json::parse(result.out, nullptr, false);
 }
 
+// "Test Delay" is healthy and lives in the test library; the plug-ins with a
+// fault each live in a library of their own.
 std::vector<std::string> TestLibrary(const std::string& plugin) {
     return {"--library", ZEN_TEST_LIBRARY_PATH, "validate", plugin};
+}
+
+std::vector<std::string> FaultyLibrary(const std::string& plugin) {
+    return {"--library", ZEN_FAULTY_LIBRARY_PATH, "validate", plugin};
 }
 
 std::set<std::string> WithStatus(const nlohmann::json& plugin, const std::string& status) {
@@ -95,7 +101,7 @@ class ZenfxValidateFault : public testing::TestWithParam<Fault> {};
 
 TEST_P(ZenfxValidateFault, FailsTheMatchingCheck) {
     const Fault& fault = GetParam();
-    const auto report = ValidateJson(TestLibrary(fault.plugin), 1);
+    const auto report = ValidateJson(FaultyLibrary(fault.plugin), 1);
     ASSERT_EQ(report["plugins"].size(), 1u);
     const auto& plugin = report["plugins"][0];
     EXPECT_FALSE(plugin["passed"].get<bool>());
@@ -123,7 +129,7 @@ INSTANTIATE_TEST_SUITE_P(
     });
 
 TEST(ZenfxValidate, TextReportHasOneLinePerCheckWithItsReason) {
-    auto args = TestLibrary("Test Wrong Latency");
+    auto args = FaultyLibrary("Test Wrong Latency");
     args.insert(args.end(), {"--level", kQuick, "--check", "latency", "--check", "lifecycle.reset"});
     const auto result = RunZenfx(args);
     EXPECT_EQ(result.exitCode, 1);

@@ -1,7 +1,7 @@
 // Base of the faulty test plug-ins: a smoothed "Gain" in dB, up to two
 // channels. Each subclass adds one deliberate fault, so that the validator's
 // tests can show the matching check failing. Never registered itself, and
-// only ever linked into the test copy of the library.
+// only ever linked into libZenFaultyPlugins.so, a test library of its own.
 #pragma once
 
 #include "Common/SmoothedValueGroup.h"
