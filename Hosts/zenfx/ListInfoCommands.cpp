@@ -90,6 +90,9 @@ int RunInfo(PluginLibrary& library, const InfoOptions& options) {
     nlohmann::json row = DescribePlugin(plugin, *instance);
     row["sampleRate"] = options.sampleRate;
     row["latency"] = audio.GetLatency();
+    row["tail"] = audio.GetTailLength();
+    row["blockBased"] = audio.IsBlockBased();
+    row["locksAudioPath"] = audio.LocksAudioPath();
     row["configuredChannels"] = channels;
     nlohmann::json parameters = nlohmann::json::array();
     for (std::uint32_t i = 0; i < audio.GetParameterCount(); ++i) {
@@ -131,6 +134,9 @@ int RunInfo(PluginLibrary& library, const InfoOptions& options) {
               << "  channels   up to " << d.inputChannelLimit << " in, " << d.outputChannelLimit << " out\n"
               << "  list flags " << d.listFlags << "\n"
               << "  latency    " << audio.GetLatency() << " samples at " << options.sampleRate << " Hz\n"
+              << "  tail       " << audio.GetTailLength() << " samples\n"
+              << "  processing " << (audio.IsBlockBased() ? "block-based" : "sample by sample")
+              << (audio.LocksAudioPath() ? ", takes a lock on the audio path" : "") << "\n"
               << "\nParameters:\n";
     for (std::uint32_t i = 0; i < audio.GetParameterCount(); ++i) {
         zen::ParameterInfo p;
