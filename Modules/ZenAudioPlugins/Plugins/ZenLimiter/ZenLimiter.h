@@ -14,7 +14,9 @@
 //
 // The true peak is read with the wideband 4x interpolator: the standard
 // 48-tap one misses much of what content near Nyquist (noise, squares,
-// clipped material) adds between samples.
+// clipped material) adds between samples. With "Soft" on, a block over the
+// ceiling is softened and then held to the ceiling by its largest sample, so
+// its peaks between samples may pass the ceiling.
 #pragma once
 
 #include <array>
