@@ -192,9 +192,13 @@ TEST(zn_reverb_u15, NewRoomFadesTheTailOutResetsAndFadesItIn) {
     EXPECT_FALSE(rig.processor->Control().Idle());
     const std::uint32_t fade = rig.processor->Control().FadeLength();
     EXPECT_EQ(fade, 960u);  // 20 ms
-    io = {zentest::Noise(3 * fade, 0.5, 9)};
+    // Out, reset, silent while the emptied lines fill, in.
+    const std::uint32_t longest = rig.engine.Param().tail.core.lengths(0);
+    io = {zentest::Noise(fade + 256, 0.5, 9)};
     rig.Process(io);
     EXPECT_NE(rig.processor->Tail().Lines().Length(0), before);
+    io = {zentest::Noise(longest + fade + 256, 0.5, 10)};
+    rig.Process(io);
     EXPECT_EQ(rig.processor->Tail().Lines().Length(0), rig.engine.Param().tail.core.lengths(0));
     EXPECT_TRUE(rig.processor->Control().Idle());
     EXPECT_LT(zentest::LargestStep(io[0]), 0.5f);

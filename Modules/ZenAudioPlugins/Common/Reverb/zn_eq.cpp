@@ -70,10 +70,20 @@ bool zn_eq::Glide(zn_eq_param::Band& current, const zn_eq_param::Band& target, s
 }
 
 bool zn_eq::Process(float* const* channels, std::uint64_t count) {
-    if (Glide(m_current.low, m_target.low, count)) Design(m_low, m_current.low);
-    if (Glide(m_current.high, m_target.high, count)) Design(m_high, m_current.high);
-    m_low.Process(channels, count);
-    m_high.Process(channels, count);
+    const std::uint64_t channelCount = std::min<std::uint64_t>(GetChannelCount(), kMaxChannels);
+    for (std::uint64_t done = 0; done < count;) {
+        std::uint64_t n = count - done;
+        if (m_current.low != m_target.low || m_current.high != m_target.high) {
+            n = std::min(n, kGlideChunk);
+            if (Glide(m_current.low, m_target.low, n)) Design(m_low, m_current.low);
+            if (Glide(m_current.high, m_target.high, n)) Design(m_high, m_current.high);
+        }
+        float* part[kMaxChannels];
+        for (std::uint64_t c = 0; c < channelCount; ++c) part[c] = channels[c] + done;
+        m_low.Process(part, n);
+        m_high.Process(part, n);
+        done += n;
+    }
     return true;
 }
 

@@ -1,7 +1,8 @@
 // The reverb's two-band tone control: a low shelf then a high shelf, each a
 // BiQuad on every channel. A band is redesigned only when its values change;
-// a change glides (gain in dB, frequency in octaves, at a bounded rate per
-// second of audio) so that a jump in the settings does not click.
+// a change glides (gain in dB, frequency in octaves, at a bounded rate, the
+// band redesigned every kGlideChunk samples) so that a jump in the settings
+// does not click.
 #pragma once
 
 #include <cstdint>
@@ -16,8 +17,10 @@ class zn_eq : public ZenAudioAlgorithm {
     Q_OBJECT
 
 public:
-    static constexpr double kGlideDbPerSecond = 240.0;
-    static constexpr double kGlideOctavesPerSecond = 20.0;
+    static constexpr double kGlideDbPerSecond = 120.0;
+    static constexpr double kGlideOctavesPerSecond = 12.0;
+    static constexpr std::uint64_t kGlideChunk = 16;
+    static constexpr std::uint64_t kMaxChannels = 16;
     static constexpr float kMinimumGain = 1e-6f;  // -120 dB
 
     zn_eq();

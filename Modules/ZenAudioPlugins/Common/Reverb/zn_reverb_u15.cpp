@@ -39,7 +39,7 @@ void zn_reverb_u15::Dimension(std::uint32_t inputs, std::uint32_t outputs, float
     m_direct.Dimension(m_inputs, m_outputs);
     m_reflections.Dimension(m_inputs, m_engineRate);
     m_early.Dimension(kTaps, m_outputs);
-    m_tail.Dimension(m_outputs, maxLaneLength, m_engineFrames);
+    m_tail.Dimension(m_outputs, maxLaneLength, m_engineFrames, m_engineRate);
     m_pendingTail = zn_reverberant_u15_param(m_outputs);
     m_pendingLengths = false;
     m_control.SetSampleRate(m_engineRate);
@@ -111,7 +111,9 @@ void zn_reverb_u15::ApplyPendingLengths() noexcept {
     if (m_pendingLengths) m_tail.Configure(m_pendingTail, true);
     m_pendingLengths = false;
     m_tail.Reset();
-    m_control.ActionDone();
+    std::uint32_t longest = 0;
+    for (std::uint32_t i = 0; i < zn_reverberant_u15::kLines; ++i) longest = std::max(longest, m_tail.Lines().Length(i));
+    m_control.ActionDone(longest);
 }
 
 void zn_reverb_u15::Reset() {

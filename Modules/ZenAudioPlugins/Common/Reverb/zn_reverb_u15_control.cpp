@@ -13,12 +13,14 @@ void zn_reverb_u15_control::SetSampleRate(float sampleRate) {
 void zn_reverb_u15_control::Request(timed_action action) noexcept {
     if (action != timed_action::fadeout_end_reset_and_fadein) return;
     if (m_state == State::Idle) m_position = m_length;
-    if (m_state != State::Silent) m_state = State::FadingOut;
+    if (m_state != State::Silent && m_state != State::Holding) m_state = State::FadingOut;
+    if (m_state == State::Holding) m_state = State::Silent;  // act again: the lines are not full yet
 }
 
-void zn_reverb_u15_control::ActionDone() noexcept {
+void zn_reverb_u15_control::ActionDone(std::uint32_t holdSamples) noexcept {
     if (m_state != State::Silent) return;
-    m_state = State::FadingIn;
+    m_state = holdSamples > 0 ? State::Holding : State::FadingIn;
+    m_hold = holdSamples;
     m_position = 0;
 }
 
@@ -42,6 +44,10 @@ bool zn_reverb_u15_control::Gains(float* gains, std::size_t count) noexcept {
                 gains[i] = GainAt(m_position);
                 break;
             case State::Silent: gains[i] = 0.0f; break;
+            case State::Holding:
+                gains[i] = 0.0f;
+                if (--m_hold == 0) m_state = State::FadingIn;
+                break;
             case State::FadingIn:
                 if (m_position < m_length) ++m_position;
                 if (m_position == m_length) m_state = State::Idle;

@@ -1,7 +1,9 @@
 // Timed actions around the running network. `fadeout_end_reset_and_fadein`
 // fades the late output out along a half cosine, holds it silent until the
-// owner has done the action (a reset with new line lengths), then fades it
-// back in. A request during the fade-in turns it around from where it is.
+// owner has done the action (a reset with new line lengths) and for as long
+// as the owner asks (until the emptied lines have filled again, so that no
+// line starts abruptly in the output), then fades it back in. A request
+// during the fade-in turns it around from where it is.
 #pragma once
 
 #include <cstddef>
@@ -19,8 +21,9 @@ public:
     void Request(timed_action action) noexcept;
     // The action is due: the output is silent and the owner may act now.
     bool ActionDue() const { return m_state == State::Silent; }
-    // Called by the owner once it has acted; the fade-in starts.
-    void ActionDone() noexcept;
+    // Called by the owner once it has acted; the fade-in starts after
+    // `holdSamples` more samples of silence.
+    void ActionDone(std::uint32_t holdSamples = 0) noexcept;
     // Back to unity at once, nothing pending.
     void Clear() noexcept;
 
@@ -31,12 +34,13 @@ public:
     std::uint32_t FadeLength() const { return m_length; }
 
 private:
-    enum class State { Idle, FadingOut, Silent, FadingIn };
+    enum class State { Idle, FadingOut, Silent, Holding, FadingIn };
     float GainAt(std::uint32_t position) const noexcept;
 
     State m_state = State::Idle;
     std::uint32_t m_length = 960;
     std::uint32_t m_position = 0;  // 0 silent .. m_length unity
+    std::uint32_t m_hold = 0;
 };
 
 }  // namespace zen::reverb

@@ -21,13 +21,19 @@ class zn_reverberant_u15 {
 public:
     static constexpr std::uint32_t kLanes = zn_reverberant_u15_core_param::kLanes;
     static constexpr std::uint32_t kLines = zn_reverberant_u15_core_param::kLines;
+    // New gains and damping glide in (a one-pole over about 10 ms, stepped
+    // every kGlideChunk frames), so a change of decay never steps the lines'
+    // output.
+    static constexpr double kGlideSeconds = 0.01;
+    static constexpr std::uint32_t kGlideChunk = 32;
 
     // Lines able to hold `maxLength` samples, `channels` outputs (at most 16)
     // and chunks of up to `maxFrames`. Allocates.
-    void Dimension(std::uint32_t channels, std::uint32_t maxLength, std::uint32_t maxFrames);
-    // Gains, damping and the output stage. New lengths (when `withLengths`)
-    // clear the lines: owners fade the output around that. Lengths beyond
-    // the dimensioned ones grow the lines (this allocates).
+    void Dimension(std::uint32_t channels, std::uint32_t maxLength, std::uint32_t maxFrames, float sampleRate);
+    // Gains, damping and the output stage; the first settings after
+    // Dimension or Reset apply at once, later ones glide. New lengths (when
+    // `withLengths`) clear the lines: owners fade the output around that.
+    // Lengths beyond the dimensioned ones grow the lines (this allocates).
     void Configure(const zn_reverberant_u15_param& param, bool withLengths = true);
     bool LengthsDiffer(const zn_reverberant_u15_core_param& core) const;
     void Reset() noexcept;
@@ -46,7 +52,14 @@ private:
     zn_reverberant_u16_out m_out;
     ora::AlignedBuffer<float> m_d;  // delay outputs, lane 15 = 0
     ora::AlignedBuffer<float> m_m;  // mixed, then damped
+    void Glide(std::size_t frames) noexcept;
+
     std::uint32_t m_maxFrames = 0;
+    float m_c[kLanes] = {}, m_g[kLanes] = {};  // running
+    float m_targetC[kLanes] = {}, m_targetG[kLanes] = {};
+    bool m_gliding = false;
+    bool m_settled = true;  // the next settings apply at once
+    double m_glideFrames = 480.0;
 };
 
 }  // namespace zen::reverb
