@@ -78,7 +78,28 @@ public:
             for (std::size_t j = 0; j < L; ++j) xe[base + n * L + j] = in[n];
         const std::size_t outputs = frames * L;
         const float* table = st.table.data();
-        for (std::size_t o0 = 0; o0 < outputs; o0 += W) {
+        // Four groups of outputs at once: four independent sums keep the
+        // pipeline busy, and each output is still summed tap by tap.
+        std::size_t o0 = 0;
+        for (; o0 + 4 * W <= outputs; o0 += 4 * W) {
+            typename V::T a0 = V::Zero(), a1 = V::Zero(), a2 = V::Zero(), a3 = V::Zero();
+            const float* c0 = table + o0 % w;
+            const float* c1 = table + (o0 + W) % w;
+            const float* c2 = table + (o0 + 2 * W) % w;
+            const float* c3 = table + (o0 + 3 * W) % w;
+            const float* x = xe + base + o0;
+            for (std::size_t k = 0; k < P; ++k, c0 += w, c1 += w, c2 += w, c3 += w, x -= L) {
+                a0 = V::MulAdd(V::Load(c0), V::Load(x), a0);
+                a1 = V::MulAdd(V::Load(c1), V::Load(x + W), a1);
+                a2 = V::MulAdd(V::Load(c2), V::Load(x + 2 * W), a2);
+                a3 = V::MulAdd(V::Load(c3), V::Load(x + 3 * W), a3);
+            }
+            V::Store(out + o0, a0);
+            V::Store(out + o0 + W, a1);
+            V::Store(out + o0 + 2 * W, a2);
+            V::Store(out + o0 + 3 * W, a3);
+        }
+        for (; o0 < outputs; o0 += W) {
             const float* coefficients = table + o0 % w;
             const float* x = xe + base + o0;
             typename V::T acc = V::Zero();
@@ -117,7 +138,27 @@ public:
             }
         }
         const float* table = st.table.data();
-        for (std::size_t n0 = 0; n0 < outputs; n0 += W) {
+        // Four groups of outputs at once, each summed phase by phase, tap by tap.
+        std::size_t n0 = 0;
+        for (; n0 + 4 * W <= outputs; n0 += 4 * W) {
+            typename V::T a0 = V::Zero(), a1 = V::Zero(), a2 = V::Zero(), a3 = V::Zero();
+            for (std::size_t p = 0; p < M; ++p) {
+                const float* x = streams + p * stride + n0 + Q - 1;
+                const float* h = table + p * Q;
+                for (std::size_t q = 0; q < Q; ++q, --x) {
+                    const typename V::T c = V::Set1(h[q]);
+                    a0 = V::MulAdd(c, V::Load(x), a0);
+                    a1 = V::MulAdd(c, V::Load(x + W), a1);
+                    a2 = V::MulAdd(c, V::Load(x + 2 * W), a2);
+                    a3 = V::MulAdd(c, V::Load(x + 3 * W), a3);
+                }
+            }
+            V::Store(out + n0, a0);
+            V::Store(out + n0 + W, a1);
+            V::Store(out + n0 + 2 * W, a2);
+            V::Store(out + n0 + 3 * W, a3);
+        }
+        for (; n0 < outputs; n0 += W) {
             typename V::T acc = V::Zero();
             for (std::size_t p = 0; p < M; ++p) {
                 const float* x = streams + p * stride + n0 + Q - 1;
