@@ -84,22 +84,35 @@ TEST(ZenReverb, ParametersReachTheEngineInItsUnits) {
     EXPECT_EQ(engine.Dirty(), 0);
 }
 
-TEST(ZenReverb, LengthWidthAreaAndRatioStayConsistent) {
+TEST(ZenReverb, LengthWidthAreaAndRatioMakeOneRoomInAnyOrder) {
+    auto floor = [](const std::vector<std::pair<const char*, float>>& settings) {
+        PluginHarness plugin("Reverb");
+        plugin.Prepare(1);
+        for (const auto& [name, value] : settings) plugin.Set(name, value);
+        plugin.Run(std::vector<float>(16, 0.0f));
+        const zn_reverb& engine = *Impl(plugin).Engine();
+        return std::make_pair(engine.Get(zn_reverb::kRoomLength), engine.Get(zn_reverb::kRoomWidth));
+    };
+    // Agreeing descriptions: exactly that room, whatever the order.
+    const auto agreed = floor({{"Room Length", 10.0f}, {"Room Width", 40.0f}, {"Room Size", 400.0f}, {"Room Ratio", 4.0f}});
+    EXPECT_NEAR(agreed.first, 10.0f, 1e-4f);
+    EXPECT_NEAR(agreed.second, 40.0f, 1e-4f);
+    EXPECT_EQ(floor({{"Room Ratio", 4.0f}, {"Room Size", 400.0f}, {"Room Width", 40.0f}, {"Room Length", 10.0f}}), agreed);
+    const auto defaults = floor({});
+    EXPECT_NEAR(defaults.first, 12.430144f, 1e-4f);
+    EXPECT_NEAR(defaults.second, 20.112396f, 1e-4f);
+    // A larger area alone: a larger room of the same shape.
+    const auto larger = floor({{"Room Size", 1000.0f}});
+    EXPECT_NEAR(larger.first * larger.second, std::sqrt(250.0f * 1000.0f), 0.5f);
+    EXPECT_NEAR(larger.second / larger.first, 1.618034f, 1e-4f);
+    // A parameter never writes another.
     PluginHarness plugin("Reverb");
-    plugin.Set("Room Size", 400.0f);  // the ratio is kept
-    EXPECT_NEAR(plugin.Get("Room Length"), std::sqrt(400.0f / 1.618034f), 1e-3f);
-    EXPECT_NEAR(plugin.Get("Room Width"), std::sqrt(400.0f * 1.618034f), 1e-3f);
-    plugin.Set("Room Ratio", 1.0f);  // the area is kept
-    EXPECT_NEAR(plugin.Get("Room Length"), 20.0f, 1e-3f);
-    EXPECT_NEAR(plugin.Get("Room Width"), 20.0f, 1e-3f);
-    plugin.Set("Room Length", 10.0f);
-    EXPECT_NEAR(plugin.Get("Room Size"), 200.0f, 1e-2f);
-    EXPECT_NEAR(plugin.Get("Room Ratio"), 2.0f, 1e-5f);
-    plugin.Set("Room Size", 10000.0f);  // at ratio 2 the width stops at 100 m: area and ratio follow
-    EXPECT_NEAR(plugin.Get("Room Width"), 100.0f, 1e-3f);
-    EXPECT_NEAR(plugin.Get("Room Length"), std::sqrt(5000.0f), 1e-3f);
-    EXPECT_NEAR(plugin.Get("Room Size"), 100.0f * std::sqrt(5000.0f), 0.1f);
-    EXPECT_NEAR(plugin.Get("Room Ratio"), 100.0f / std::sqrt(5000.0f), 1e-4f);
+    plugin.Set("Room Size", 1000.0f);
+    EXPECT_NEAR(plugin.Get("Room Length"), 12.430144f, 1e-5f);
+    // The extremes stay inside the room the lines were sized for.
+    const auto extreme = floor({{"Room Width", 100.0f}, {"Room Size", 10000.0f}, {"Room Ratio", 100.0f}});
+    EXPECT_LE(extreme.second, ZenReverb::kMaxRoomLength);
+    EXPECT_GE(extreme.first, ZenReverb::kMinRoomDimension);
 }
 
 TEST(ZenReverb, DryWetZeroPassesTheDrySignalUnchangedAtEveryRate) {

@@ -55,6 +55,7 @@ zn_reverb::zn_reverb(float sampleRate, std::uint32_t inputs, std::uint32_t outpu
 
 bool zn_reverb::Set(std::uint32_t entry, float value) {
     if (entry >= kEntryCount || !std::isfinite(value)) return false;
+    if (value == m_record[entry]) return true;  // nothing to recompute
     switch (entry) {
         case kRoomLength:
         case kRoomWidth:

@@ -77,7 +77,7 @@ public:
 
     // False, nothing changed, for an index out of range, a value that is not
     // finite, a room dimension at or below 0.1 m, or a decay time or ratio
-    // that is not positive. Marks the steps that read the entry.
+    // that is not positive. A new value marks the steps that read the entry.
     bool Set(std::uint32_t entry, float value);
     float Get(std::uint32_t entry) const { return entry < kEntryCount ? m_record[entry] : 0.0f; }
 

@@ -90,36 +90,23 @@ float ZenReverb::ToRecord(std::uint32_t parameter, float value) {
     }
 }
 
-bool ZenReverb::OnParameterChanged(std::uint32_t index, float value) {
-    if (!ZenAudioPluginImpl::OnParameterChanged(index, value)) return false;
-    if (index == kRoomLength || index == kRoomWidth || index == kRoomSize || index == kRoomRatio)
-        LinkRoomShape(index, value);
-    return true;
-}
-
-void ZenReverb::LinkRoomShape(std::uint32_t changed, float value) {
-    const zen::ParameterTable& p = Parameters();
-    float length = p[kRoomLength].GetValue(), width = p[kRoomWidth].GetValue();
-    if (changed == kRoomSize || changed == kRoomRatio) {
-        const float size = changed == kRoomSize ? value : p[kRoomSize].GetValue();
-        const float ratio = changed == kRoomRatio ? value : p[kRoomRatio].GetValue();
-        length = std::clamp(std::sqrt(size / ratio), kMinRoomDimension, kMaxRoomLength);
-        width = std::clamp(std::sqrt(size * ratio), kMinRoomDimension, kMaxRoomLength);
-        ZenAudioPluginImpl::OnParameterChanged(kRoomLength, length);
-        ZenAudioPluginImpl::OnParameterChanged(kRoomWidth, width);
-        // Where a dimension hit its limit, area and ratio follow the room that results.
-        if (changed != kRoomSize || std::fabs(length * width - size) > 1e-3f * size)
-            ZenAudioPluginImpl::OnParameterChanged(kRoomSize, p[kRoomSize].Definition().Constrain(length * width));
-        if (changed != kRoomRatio || std::fabs(width / length - ratio) > 1e-3f * ratio)
-            ZenAudioPluginImpl::OnParameterChanged(kRoomRatio, p[kRoomRatio].Definition().Constrain(width / length));
-        return;
-    }
-    ZenAudioPluginImpl::OnParameterChanged(kRoomSize, p[kRoomSize].Definition().Constrain(length * width));
-    ZenAudioPluginImpl::OnParameterChanged(kRoomRatio, p[kRoomRatio].Definition().Constrain(width / length));
+std::pair<float, float> ZenReverb::EffectiveFloor(float length, float width, float size, float ratio) {
+    const double l = std::sqrt(double(length) * std::sqrt(double(size) / ratio));
+    const double w = std::sqrt(double(width) * std::sqrt(double(size) * ratio));
+    return {std::clamp(static_cast<float>(l), kMinRoomDimension, kMaxRoomLength),
+            std::clamp(static_cast<float>(w), kMinRoomDimension, kMaxRoomLength)};
 }
 
 void ZenReverb::UpdateProcessingParameter(std::uint32_t index, float value) {
-    if (m_engine) m_engine->Set(RecordEntry(index), ToRecord(index, value));
+    if (!m_engine) return;
+    m_engine->Set(RecordEntry(index), ToRecord(index, value));
+    if (index == kRoomLength || index == kRoomWidth || index == kRoomSize || index == kRoomRatio) {
+        const zen::ParameterTable& p = Parameters();
+        const auto [length, width] = EffectiveFloor(p[kRoomLength].GetValue(), p[kRoomWidth].GetValue(),
+                                                    p[kRoomSize].GetValue(), p[kRoomRatio].GetValue());
+        m_engine->Set(zn_reverb::kRoomLength, length);
+        m_engine->Set(zn_reverb::kRoomWidth, width);
+    }
 }
 
 void ZenReverb::PrepareProcessing(float sampleRate, std::uint32_t maxBlockSize) {

@@ -7,9 +7,17 @@
 //
 // Parameters reach the engine's record on the audio thread; the engine's
 // update steps then recompute only what the change touches, before the block.
+//
+// "Room Size" and "Room Ratio" describe the floor as "Room Length" and "Room
+// Width" do. No parameter ever writes another (hosts own every value, and
+// the same values must give the same room in any order), so the room takes
+// the geometric mean of the two descriptions: exactly the room when they
+// agree (as an editor that links them keeps them), and a room that grows
+// with any of them when a host moves one alone.
 #pragma once
 
 #include <memory>
+#include <utility>
 
 #include "Common/Reverb/zn_reverb.h"
 #include "Common/Reverb/zn_reverb_u15.h"
@@ -43,21 +51,20 @@ public:
     static std::uint32_t RecordEntry(std::uint32_t parameter);
     static float ToRecord(std::uint32_t parameter, float value);
 
+    // The room's floor from the four values: {length, width}, each within the host's limits.
+    static std::pair<float, float> EffectiveFloor(float length, float width, float size, float ratio);
+
     // For tests: the engine and the processing object of the current preparation.
     const zen::reverb::zn_reverb* Engine() const { return m_engine.get(); }
     const zen::reverb::zn_reverb_u15* Processor() const { return m_processor.get(); }
 
 protected:
-    bool OnParameterChanged(std::uint32_t index, float value) override;
     void UpdateProcessingParameter(std::uint32_t index, float value) override;
     void PrepareProcessing(float sampleRate, std::uint32_t maxBlockSize) override;
     void ProcessBlock(float* const* channels, std::uint32_t channelCount, std::uint32_t frames) noexcept override;
     void ResetProcessing() override;
 
 private:
-    // Keeps length, width, floor area and ratio consistent after one of them changed.
-    void LinkRoomShape(std::uint32_t changed, float value);
-
     std::unique_ptr<zen::reverb::zn_reverb> m_engine;
     std::unique_ptr<zen::reverb::zn_reverb_u15> m_processor;
 };
