@@ -37,9 +37,9 @@ reverbtest::Channels WetResponses(float rate, float t60, float ratio, std::uint3
     return io;
 }
 
-// As a room is measured: the mean over several listening positions (here
-// four output channels, each with its own mix of the lines), which evens out
-// the modal fluctuations of one position in short decays.
+// As a room is measured: the mean over several listening positions (output
+// channels, each with its own mix of the lines), which evens out the modal
+// fluctuations of one position in short decays.
 double MeanBandDecay(const reverbtest::Channels& responses, double band, float rate) {
     double sum = 0.0;
     for (const auto& response : responses) sum += zentest::BandDecayTime(response, band, rate);
@@ -49,7 +49,8 @@ double MeanBandDecay(const reverbtest::Channels& responses, double band, float r
 // "T@-60dB" is the decay of every band when the highs are not damped
 // (full brightness); the damping law is tested on its own below.
 void ExpectDecay(float rate, float t60) {
-    const auto responses = WetResponses(rate, t60, 1.0f, 4);
+    const std::uint32_t positions = t60 < 1.0f ? 4 : 1;  // long decays are smooth from one
+    const auto responses = WetResponses(rate, t60, 1.0f, positions);
     for (double band : {500.0, 1000.0, 2000.0}) {
         const double measured = MeanBandDecay(responses, band, rate);
         EXPECT_NEAR(measured / t60, 1.0, 0.05) << "T60 " << t60 << " s at " << rate << " Hz, " << band

@@ -4,6 +4,7 @@
 // The 16 lanes leave as one 16-float frame.
 #pragma once
 
+#include <algorithm>
 #include <cstddef>
 #include <cstdint>
 #include <vector>
