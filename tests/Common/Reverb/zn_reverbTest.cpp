@@ -21,15 +21,6 @@ std::array<float, zn_reverb::kEntryCount> DefaultRecord() {
 
 }  // namespace
 
-TEST(zn_reverb, DefaultRecordIsConsistent) {
-    const auto r = DefaultRecord();
-    EXPECT_NEAR(r[zn_reverb::kRoomLength] * r[zn_reverb::kRoomWidth], 250.0f, 1e-3f);
-    EXPECT_NEAR(r[zn_reverb::kRoomWidth] / r[zn_reverb::kRoomLength], 1.618034f, 1e-6f);
-    EXPECT_EQ(r[zn_reverb::kT60], 0.95f);
-    EXPECT_EQ(r[zn_reverb::kEq2HighFrequency], 10000.0f);
-    EXPECT_EQ(r[zn_reverb::kEq1LowShape], 0.3333333f);
-}
-
 TEST(zn_reverb, LaneLengthsOfTheDefaultRoom) {
     std::uint32_t lengths[16];
     ASSERT_TRUE(zn_reverb::RoomToLaneLengths(12.430144f, 20.112396f, 4.0f, 48000.0f, lengths));

@@ -11,7 +11,7 @@ namespace {
 
 constexpr double kTwoPi = 6.283185307179586;
 constexpr double kGoldenAngle = 2.399963229728653;  // spreads the taps' start phases
-constexpr double kRateSpread = 1.0 / 16.0;          // tap k runs (1 + k/16) times the slowest rate
+constexpr double kRateSpread = 1.0 / 32.0;          // tap k runs (1 + k/32) times the slowest rate
 constexpr std::uint32_t kInterpolationFrames = 2;   // the neighbour read past the deepest position
 constexpr std::uint32_t kRenormaliseFrames = 1024;
 

@@ -1,6 +1,6 @@
 // The early-reflection taps with slow modulation: each tap's read position
 // moves by depth_k x sin(phase_k) samples, read between neighbouring samples
-// by linear interpolation. Tap k's sine runs at (1 + k/16) / period, so the
+// by linear interpolation. Tap k's sine runs at (1 + k/32) / period, so the
 // taps drift apart and never beat together; with depths of a few samples at
 // about one hertz the pitch deviates by well under a cent, heard as a
 // livelier room, not as vibrato. Depth changes glide; a new set of tap
