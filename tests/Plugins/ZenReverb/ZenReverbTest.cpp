@@ -203,6 +203,22 @@ TEST(ZenReverb, ChangesWhilePlayingDoNotClick) {
     }
 }
 
+TEST(ZenReverb, NonFiniteInputDoesNotPoisonTheRoom) {
+    PluginHarness plugin("Reverb");
+    plugin.Set("T@-60dB", 20.0f);
+    plugin.Prepare(2);
+    zentest::Channels io = {zentest::Noise(2048, 0.5, 1), zentest::Noise(2048, 0.5, 2)};
+    io[0][100] = NAN;
+    io[1][200] = INFINITY;
+    io[0][300] = -1e30f;
+    plugin.Process(io, 512);
+    const auto later = plugin.Run(zentest::Noise(48000, 0.5, 3), 2, 512);
+    for (const auto& channel : later) {
+        for (float v : channel) ASSERT_TRUE(std::isfinite(v));
+        EXPECT_LT(zentest::Rms(channel, 36000), zentest::Rms(channel, 0, 12000));  // dying away, not growing
+    }
+}
+
 TEST(ZenReverb, ANewRateRebuildsTheEngineForItsOwnRate) {
     PluginHarness plugin("Reverb");
     plugin.Set("Room Length", 9.0f);

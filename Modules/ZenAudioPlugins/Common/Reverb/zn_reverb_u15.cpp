@@ -1,6 +1,7 @@
 #include "zn_reverb_u15.h"
 
 #include <algorithm>
+#include <cmath>
 
 #include "Common/ZenAssert.h"
 #include "zn_reverb_u15_x2.h"
@@ -136,8 +137,13 @@ void zn_reverb_u15::Reset() {
 }
 
 void zn_reverb_u15::CopyIn(float* const* channels, std::size_t count) noexcept {
-    for (std::uint32_t ch = 0; ch < m_inputs; ++ch)
-        std::copy(channels[ch], channels[ch] + count, m_in.data() + ch * m_hostFrames);
+    for (std::uint32_t ch = 0; ch < m_inputs; ++ch) {
+        float* in = m_in.data() + ch * m_hostFrames;
+        for (std::size_t f = 0; f < count; ++f) {
+            const float x = channels[ch][f];
+            in[f] = std::fabs(x) <= kLargestInput ? x : (std::isnan(x) ? 0.0f : std::copysign(kLargestInput, x));
+        }
+    }
     m_direct.Process(m_in.data(), 1, m_hostFrames, m_directOut.data(), 1, m_hostFrames, count);
 }
 
@@ -160,6 +166,13 @@ void zn_reverb_u15::ProcessWet(const float* inFrames, std::size_t count) noexcep
     }
     if (m_control.ActionDue()) ApplyPendingLengths();
     m_tail.Process(m_u.data(), m_lateFrames.data(), count);
+    // Last resort: state that has gone non-finite anyway starts afresh.
+    float check = 0.0f;
+    for (std::size_t f = 0; f < count; ++f) check += m_lateFrames[f * kLanes];
+    if (!std::isfinite(check)) {
+        m_tail.Reset();
+        m_lateFrames.Clear();
+    }
     for (std::uint32_t ch = 0; ch < m_outputs; ++ch)
         for (std::size_t f = 0; f < count; ++f) m_latePointers[ch][f] = m_lateFrames[f * kLanes + ch];
     m_lateEq.Process(m_latePointers.data(), count);

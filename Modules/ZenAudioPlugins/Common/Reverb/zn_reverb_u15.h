@@ -38,6 +38,10 @@ public:
     static constexpr std::uint32_t kMaxChannels = 16;
     // The tap lanes enter the network at this level.
     static constexpr float kLateInputGain = 0.25f;
+    // Input beyond this (60 dB over full scale) is held there, and input that
+    // is not a number is taken as silence: the network would keep either for
+    // ever, or overflow.
+    static constexpr float kLargestInput = 1e3f;
     // Engine-rate frames of the resampled objects.
     static constexpr std::uint32_t kEngineFrame = 1024;
     static constexpr std::uint32_t kConverterTapsPerPhase = 32;
