@@ -92,16 +92,23 @@ KernelForm ChooseKernelFormWithoutFma() {
     }
 }
 
-KernelForm ChooseIntegerKernelForm() {
-    if (HasAVX2()) return KernelForm::M256Avx2;
-    if (HasSSE41()) return KernelForm::M128Sse41;
-    return KernelForm::Ref;
+IntegerKernelForm ChooseIntegerKernelForm() {
+    if (HasAVX2()) return IntegerKernelForm::M256Avx2;
+    if (HasSSE41()) return IntegerKernelForm::M128Sse41;
+    return IntegerKernelForm::Ref;
+}
+
+const char* KernelFormName(IntegerKernelForm form) {
+    switch (form) {
+        case IntegerKernelForm::M256Avx2: return "m256_avx2";
+        case IntegerKernelForm::M128Sse41: return "m128_sse41";
+        case IntegerKernelForm::Ref: return "ref";
+    }
+    return "ref";
 }
 
 const char* KernelFormName(KernelForm form) {
     switch (form) {
-        case KernelForm::M256Avx2: return "m256_avx2";
-        case KernelForm::M128Sse41: return "m128_sse41";
         case KernelForm::M256Fma: return "m256_fma";
         case KernelForm::M256: return "m256";
         case KernelForm::M128Fma: return "m128_fma";

@@ -80,9 +80,8 @@ int PhysicalCoreCount();
 int HighestStandardLeaf();
 int InitialApicId();
 
-// The forms of a kernel family. The floating-point ladder picks among the
-// first five; families of integer arithmetic have their own ladder.
-enum class KernelForm { M256Fma, M256, M128Fma, M128, Ref, M256Avx2, M128Sse41 };
+// The forms of a kernel family, best first, and the ladder that picks one.
+enum class KernelForm { M256Fma, M256, M128Fma, M128, Ref };
 
 // 256-bit FMA when AVX and FMA; else 256-bit when AVX; else 128-bit FMA when
 // FMA; else 128-bit when SSE2; else the reference form.
@@ -90,9 +89,13 @@ KernelForm ChooseKernelForm();
 // The same ladder for a family without fused forms: they become the plain
 // vector form of their width.
 KernelForm ChooseKernelFormWithoutFma();
-// 256-bit integer vectors need AVX2, 128-bit 32-bit multiplies SSE4.1.
-KernelForm ChooseIntegerKernelForm();
 const char* KernelFormName(KernelForm form);
+
+// Families of integer arithmetic have a ladder of their own: 256-bit integer
+// vectors need AVX2, 128-bit 32-bit multiplies SSE4.1.
+enum class IntegerKernelForm { M256Avx2, M128Sse41, Ref };
+IntegerKernelForm ChooseIntegerKernelForm();
+const char* KernelFormName(IntegerKernelForm form);
 
 // Sets forced mode for a scope and restores the previous settings.
 class ScopedDispatch {

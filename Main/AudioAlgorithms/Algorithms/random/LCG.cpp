@@ -18,12 +18,13 @@ namespace random {
 
 namespace {
 
-kernels::LcgKernel FormKernel(system::KernelForm form) {
+kernels::LcgKernel FormKernel(system::IntegerKernelForm form) {
     switch (form) {
-        case system::KernelForm::M256Avx2: return kernels::LCG_m256_avx2;
-        case system::KernelForm::M128Sse41: return kernels::LCG_m128_sse41;
-        default: return kernels::LCG_ref;
+        case system::IntegerKernelForm::M256Avx2: return kernels::LCG_m256_avx2;
+        case system::IntegerKernelForm::M128Sse41: return kernels::LCG_m128_sse41;
+        case system::IntegerKernelForm::Ref: break;
     }
+    return kernels::LCG_ref;
 }
 
 }  // namespace

@@ -31,13 +31,13 @@ public:
 
     std::uint32_t GetState() const { return m_state; }
     void SetState(std::uint32_t state) { m_state = state; }
-    system::KernelForm GetForm() const { return m_form; }
+    system::IntegerKernelForm GetForm() const { return m_form; }
     const char* FormName() const { return system::KernelFormName(m_form); }
     bool operator==(const LCG& other) const { return m_config == other.m_config; }
 
 private:
     LCGConfig m_config;
-    system::KernelForm m_form;
+    system::IntegerKernelForm m_form;
     kernels::LcgKernel m_kernel;
     std::uint32_t m_state;
 };

@@ -14,7 +14,7 @@ using ora::numeric::Blas2;
 
 TEST(Blas1, DotAxpyAndNormAgreeWithDoublePrecision) {
     for (std::size_t n : {0u, 1u, 7u, 8u, 9u, 1000u}) {
-        const std::vector<float> x = Noise(n, 1), y = Noise(n, 2);
+        const std::vector<float> x = RandomFloats(n, 1), y = RandomFloats(n, 2);
         double dot = 0.0, magnitude = 0.0, norm = 0.0;
         for (std::size_t i = 0; i < n; ++i) {
             dot += double(x[i]) * y[i];
@@ -44,7 +44,7 @@ TEST(Blas2, GemvOverAColumnMajorMatrix) {
 
 TEST(Blas, EveryFormGivesTheReferenceResult) {
     const std::size_t total = AwkwardTotal();
-    const std::vector<float> x = Noise(total, 3), y = Noise(total, 4);
+    const std::vector<float> x = RandomFloats(total, 3), y = RandomFloats(total, 4);
     std::vector<float> dots, axpy(y);
     {
         ora::system::ScopedDispatch forced(InstructionLevel::None, false);
@@ -58,7 +58,7 @@ TEST(Blas, EveryFormGivesTheReferenceResult) {
     }
     // Matrices of every awkward row count, 7 columns of stride rows + 3.
     const std::size_t cols = 7;
-    const std::vector<float> matrix = Noise((4095 + 3) * cols, 5), v = Noise(cols, 6);
+    const std::vector<float> matrix = RandomFloats((4095 + 3) * cols, 5), v = RandomFloats(cols, 6);
     std::vector<std::vector<float>> products;
     {
         ora::system::ScopedDispatch forced(InstructionLevel::None, false);

@@ -52,7 +52,7 @@ TEST(CastFloatInt32, TwentyFourBitSamplesRoundTripExactly) {
 
 TEST(CastFloatInt32, EveryFormGivesTheReferenceResult) {
     const std::size_t total = AwkwardTotal();
-    std::vector<float> x = Noise(total, 8);
+    std::vector<float> x = RandomFloats(total, 8);
     x[5] = std::nanf("");
     x[40] = 5.0f;  // saturates
     x[41] = -5.0f;

@@ -25,7 +25,7 @@ double FusedBound(const std::vector<float>& h, const std::vector<float>& x, std:
     return static_cast<double>(h.size()) * std::ldexp(scale, -22);
 }
 
-std::vector<float> Taps(std::size_t count, std::uint32_t seed) { return Noise(count, seed); }
+std::vector<float> Taps(std::size_t count, std::uint32_t seed) { return RandomFloats(count, seed); }
 
 std::vector<float> Symmetric(const std::vector<float>& half, std::size_t length) {
     std::vector<float> h(length);
@@ -57,7 +57,7 @@ TEST(FIR, EveryFormGivesTheReferenceResult) {
         for (int channels : {1, 2, 3}) {
             const std::size_t total = AwkwardTotal();
             std::vector<std::vector<float>> input, reference;
-            for (int c = 0; c < channels; ++c) input.push_back(Noise(total, 10 + c));
+            for (int c = 0; c < channels; ++c) input.push_back(RandomFloats(total, 10 + c));
             reference = input;
             {
                 ScopedDispatch forced(InstructionLevel::None, false);
@@ -67,11 +67,12 @@ TEST(FIR, EveryFormGivesTheReferenceResult) {
                 for (auto& r : reference) io.push_back(r.data());
                 ref.Process(io.data(), io.data(), total);
             }
-            for (const Form& form : FloatForms()) {
+            for (const Form& form : AllForms()) {
                 if (!Runnable(form)) continue;
                 ScopedDispatch forced(form.level, form.fma);
+                const char* name = ora::system::KernelFormName(form.form);
                 FIR filter(FIRConfig{channels, h});
-                EXPECT_STREQ(filter.FormName(), channels <= 2 ? form.name : "ref");
+                EXPECT_STREQ(filter.FormName(), channels <= 2 ? name : "ref");
                 // Awkward lengths one after another, each into a misaligned, guarded buffer.
                 std::size_t position = 0;
                 for (std::size_t length : AwkwardLengths()) {
@@ -89,16 +90,16 @@ TEST(FIR, EveryFormGivesTheReferenceResult) {
                     }
                     filter.Process(ip.data(), op.data(), length);
                     for (int c = 0; c < channels; ++c) {
-                        ASSERT_TRUE(out[c].GuardsIntact()) << form.name << " length " << length;
+                        ASSERT_TRUE(out[c].GuardsIntact()) << name << " length " << length;
                         for (std::size_t i = 0; i < length; ++i) {
                             const float expected = reference[c][position + i];
-                            if (form.fused && channels <= 2) {
+                            if (Fused(form.form) && channels <= 2) {
                                 const double bound = FusedBound(h, input[c], position + i);
                                 ASSERT_LE(std::fabs(double(out[c][i]) - expected), bound)
-                                    << form.name << " taps " << taps << " at " << position + i;
+                                    << name << " taps " << taps << " at " << position + i;
                             } else {
                                 ASSERT_EQ(out[c][i], expected)
-                                    << form.name << " taps " << taps << " at " << position + i;
+                                    << name << " taps " << taps << " at " << position + i;
                             }
                         }
                     }
@@ -112,7 +113,7 @@ TEST(FIR, EveryFormGivesTheReferenceResult) {
 TEST(FIR, ReconfigureKeepsHistoryAndRebuildsOnChannelChange) {
     // Plain forms only, so that the rebuilt ref form must match bit for bit.
     ScopedDispatch forced(InstructionLevel::SSE2, false);
-    const std::vector<float> x = Noise(300, 5);
+    const std::vector<float> x = RandomFloats(300, 5);
     const std::vector<float> a = Taps(9, 1), b = Taps(9, 2);
     // Switching coefficients mid-stream: the history stays, so the first
     // outputs after the switch already use the old inputs.
@@ -151,7 +152,7 @@ TEST(FIRS, MatchesTheFullFilterForOddAndEvenLengths) {
     for (std::size_t length : {1u, 2u, 15u, 16u, 63u}) {
         const std::vector<float> half = Taps((length + 1) / 2, static_cast<std::uint32_t>(length));
         const std::vector<float> h = Symmetric(half, length);
-        const std::vector<float> x = Noise(700, 8);
+        const std::vector<float> x = RandomFloats(700, 8);
         FIRS symmetric(FIRSConfig{1, half, length});
         FIR full(FIRConfig{1, h});
         std::vector<float> ys(x.size()), yf(x.size());
@@ -169,7 +170,7 @@ TEST(FIRS, EveryFormGivesTheReferenceResult) {
         const std::vector<float> h = Symmetric(half, length);
         for (int channels : {1, 2}) {
             const std::size_t total = AwkwardTotal();
-            const std::vector<float> x0 = Noise(total, 1), x1 = Noise(total, 2);
+            const std::vector<float> x0 = RandomFloats(total, 1), x1 = RandomFloats(total, 2);
             std::vector<float> r0(total), r1(total);
             {
                 ScopedDispatch forced(InstructionLevel::None, false);
@@ -178,11 +179,12 @@ TEST(FIRS, EveryFormGivesTheReferenceResult) {
                 float* out[2] = {r0.data(), r1.data()};
                 ref.Process(in, out, total);
             }
-            for (const Form& form : FloatForms()) {
+            for (const Form& form : AllForms()) {
                 if (!Runnable(form)) continue;
                 ScopedDispatch forced(form.level, form.fma);
+                const char* name = ora::system::KernelFormName(form.form);
                 FIRS filter(FIRSConfig{channels, half, length});
-                EXPECT_STREQ(filter.FormName(), form.name);
+                EXPECT_STREQ(filter.FormName(), name);
                 std::size_t position = 0;
                 for (std::size_t n : AwkwardLengths()) {
                     Guarded<> i0(n), i1(n), o0(n), o1(n);
@@ -196,11 +198,11 @@ TEST(FIRS, EveryFormGivesTheReferenceResult) {
                         for (int c = 0; c < channels; ++c) {
                             const float got = c == 0 ? o0[i] : o1[i];
                             const float want = c == 0 ? r0[position + i] : r1[position + i];
-                            if (form.fused)
+                            if (Fused(form.form))
                                 ASSERT_LE(std::fabs(double(got) - want), FusedBound(h, c == 0 ? x0 : x1, position + i))
-                                    << form.name;
+                                    << name;
                             else
-                                ASSERT_EQ(got, want) << form.name << " length " << length << " at " << position + i;
+                                ASSERT_EQ(got, want) << name << " length " << length << " at " << position + i;
                         }
                     }
                     position += n;

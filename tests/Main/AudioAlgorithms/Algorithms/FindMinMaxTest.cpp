@@ -14,7 +14,7 @@ using ora::numeric::FindMinMaxConfig;
 
 TEST(FindMinMax, MergesBlocksPerInterleavedChannel) {
     for (int channels : {1, 2, 3, 4}) {
-        const std::vector<float> x = Noise(999 * static_cast<std::size_t>(channels), 7);
+        const std::vector<float> x = RandomFloats(999 * static_cast<std::size_t>(channels), 7);
         FindMinMax finder(FindMinMaxConfig{channels});
         EXPECT_EQ(finder.GetMin(0), std::numeric_limits<float>::infinity());
         EXPECT_EQ(finder.GetPeak(0), 0.0f);
@@ -50,7 +50,7 @@ TEST(FindMinMax, SkipsNaNAndReconfigureKeepsChannels) {
 TEST(FindMinMax, EveryFormGivesTheReferenceResult) {
     for (int channels : {1, 2, 4, 3}) {
         const std::size_t total = AwkwardTotal();
-        const std::vector<float> x = Noise(total * static_cast<std::size_t>(channels), 12);
+        const std::vector<float> x = RandomFloats(total * static_cast<std::size_t>(channels), 12);
         std::vector<std::vector<float>> wantMin, wantMax;  // after each length
         {
             ora::system::ScopedDispatch forced(InstructionLevel::None, false);

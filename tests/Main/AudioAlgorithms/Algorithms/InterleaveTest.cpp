@@ -16,7 +16,7 @@ TEST(Interleave, LaysFramesOutChannelByChannelAndBack) {
     for (int channels : {1, 2, 3, 6}) {
         std::vector<std::vector<float>> planar;
         std::vector<const float*> in;
-        for (int c = 0; c < channels; ++c) planar.push_back(Noise(101, c + 1));
+        for (int c = 0; c < channels; ++c) planar.push_back(RandomFloats(101, c + 1));
         for (auto& p : planar) in.push_back(p.data());
         std::vector<float> interleaved(101 * channels);
         Interleave(InterleaveConfig{channels}).Process(in.data(), interleaved.data(), 101);
@@ -36,7 +36,7 @@ TEST(Interleave, LaysFramesOutChannelByChannelAndBack) {
 
 TEST(Interleave, EveryFormGivesTheReferenceResult) {
     const std::size_t total = AwkwardTotal();
-    const std::vector<float> a = Noise(total, 1), b = Noise(total, 2);
+    const std::vector<float> a = RandomFloats(total, 1), b = RandomFloats(total, 2);
     ForEachForm(false, [&](const Form&, const std::string& name) {
         Interleave interleave(InterleaveConfig{2});
         Deinterleave deinterleave(DeinterleaveConfig{2});

@@ -1,14 +1,15 @@
-// Helpers for the kernel-family tests: the table of forms forced one by one
-// (also those this machine's dispatcher would not pick), awkward lengths,
-// misaligned buffers with guard zones, and ULP distances.
+// The kernel forms of the algorithm library, each forced in turn, for tests
+// that compare every form with the reference form. Forms this processor
+// cannot run are skipped, not failed. Parameterised suites derive from
+// FormTest; loops over the forms use ForEachForm.
 #pragma once
 
 #include <gtest/gtest.h>
 
 #include <algorithm>
-#include <cmath>
 #include <cstdint>
 #include <cstring>
+#include <random>
 #include <string>
 #include <vector>
 
@@ -20,62 +21,101 @@ using ora::system::InstructionLevel;
 using ora::system::KernelForm;
 
 struct Form {
-    const char* name;  // as FormName() reports it
-    InstructionLevel level;
+    ora::system::KernelForm form;
+    ora::system::InstructionLevel level;
     bool fma;
-    bool fused;  // sums may round differently from ref
 };
 
-// The floating-point ladder's forms, each forced by the settings that pick it.
-inline const std::vector<Form>& FloatForms() {
+inline const std::vector<Form>& AllForms() {
+    using ora::system::InstructionLevel;
+    using ora::system::KernelForm;
     static const std::vector<Form> forms = {
-        {"ref", InstructionLevel::None, false, false},     {"m128", InstructionLevel::SSE2, false, false},
-        {"m128_fma", InstructionLevel::SSE42, true, true}, {"m256", InstructionLevel::AVX, false, false},
-        {"m256_fma", InstructionLevel::AVX, true, true},
+        {KernelForm::Ref, InstructionLevel::None, false},
+        {KernelForm::M128, InstructionLevel::SSE2, false},
+        {KernelForm::M128Fma, InstructionLevel::SSE42, true},
+        {KernelForm::M256, InstructionLevel::AVX, false},
+        {KernelForm::M256Fma, InstructionLevel::AVX, true},
     };
     return forms;
 }
 
-// A family without fused forms reports the plain form of the width.
-inline std::string PlainName(const Form& form) {
-    const std::string name = form.name;
-    return name.substr(0, name.find("_fma"));
-}
-
-// Whether this processor can run code of the form.
-inline bool Runnable(const Form& form) {
+inline bool Runnable(const Form& f) {
     const auto& cpu = ora::system::DispatchSettings::Instance().Detected();
-    if (form.fma && !(cpu.fma && cpu.osAvx)) return false;
-    if (form.level >= InstructionLevel::AVX2 && !(cpu.avx2 && cpu.osAvx)) return false;
-    if (form.level >= InstructionLevel::AVX && !cpu.osAvx) return false;
-    if (form.level >= InstructionLevel::SSE41 && !cpu.sse41) return false;
+    if (f.level >= ora::system::InstructionLevel::AVX && !cpu.osAvx) return false;
+    if (f.fma && !(cpu.fma && cpu.osAvx)) return false;
     return true;
 }
 
+inline bool Fused(ora::system::KernelForm form) {
+    return form == ora::system::KernelForm::M128Fma || form == ora::system::KernelForm::M256Fma;
+}
+
+inline std::string Name(const testing::TestParamInfo<Form>& info) {
+    return ora::system::KernelFormName(info.param.form);
+}
+
+// Lengths that catch tails and vector-width mistakes.
 inline const std::vector<std::size_t>& AwkwardLengths() {
     static const std::vector<std::size_t> lengths = {0,  1,  2,  3,  4,  5,  6,  7,  8,   9,   10,
                                                      11, 12, 13, 14, 15, 16, 17, 65, 999, 4095};
     return lengths;
 }
 
-// Samples one float past a 64-byte boundary (so never aligned for vector
-// loads), with guard zones before and after that must stay untouched.
+// Their sum: a signal long enough to walk them all.
+inline std::size_t AwkwardTotal() {
+    std::size_t total = 0;
+    for (std::size_t n : AwkwardLengths()) total += n;
+    return total;
+}
+
+inline std::vector<float> RandomFloats(std::size_t n, std::uint32_t seed, float amplitude = 1.0f) {
+    std::mt19937 rng(seed);
+    std::uniform_real_distribution<float> dist(-amplitude, amplitude);
+    std::vector<float> v(n);
+    for (float& x : v) x = dist(rng);
+    return v;
+}
+
+// A buffer with a guard zone after `size` floats, starting one float past a
+// 64-byte boundary so that no form relies on alignment.
+class GuardedBuffer {
+public:
+    static constexpr std::size_t kGuard = 32;
+    static constexpr float kSentinel = 12345.0f;
+    explicit GuardedBuffer(std::size_t size) : m_storage(size + kGuard + 17, kSentinel), m_size(size) {
+        const auto address = reinterpret_cast<std::uintptr_t>(m_storage.data());
+        m_offset = ((64 - address % 64) % 64) / sizeof(float) + 1;
+        std::fill(data(), data() + size, 0.0f);
+    }
+    float* data() { return m_storage.data() + m_offset; }
+    std::vector<float> Values() { return std::vector<float>(data(), data() + m_size); }
+    bool GuardIntact() {
+        for (std::size_t i = 0; i < kGuard; ++i)
+            if (data()[m_size + i] != kSentinel) return false;
+        return true;
+    }
+
+private:
+    std::vector<float> m_storage;
+    std::size_t m_size;
+    std::size_t m_offset = 0;
+};
+
+// Samples one float past a 64-byte boundary, with guard zones before and
+// after them that must stay untouched; for floats and 32-bit integers.
 template <class T = float>
 class Guarded {
 public:
     static constexpr std::size_t kGuard = 19;
-    explicit Guarded(std::size_t size, T fill = T{}) : m_size(size), m_store(size + 2 * kGuard + 32) {
+    explicit Guarded(std::size_t size) : m_size(size), m_store(size + 2 * kGuard + 32) {
         const auto address = reinterpret_cast<std::uintptr_t>(m_store.data());
         m_offset = ((64 - address % 64) % 64) / sizeof(T) % 16 + 1 + kGuard;
         for (T& v : m_store) std::memcpy(&v, &kPattern, sizeof(T));
         std::fill(m_store.begin() + static_cast<std::ptrdiff_t>(m_offset),
-                  m_store.begin() + static_cast<std::ptrdiff_t>(m_offset + size), fill);
+                  m_store.begin() + static_cast<std::ptrdiff_t>(m_offset + size), T{});
     }
     T* data() { return m_store.data() + m_offset; }
-    const T* data() const { return m_store.data() + m_offset; }
     T& operator[](std::size_t i) { return data()[i]; }
-    std::size_t size() const { return m_size; }
-    std::vector<T> Values() const { return std::vector<T>(data(), data() + m_size); }
     bool GuardsIntact() const {
         for (std::size_t i = m_offset - kGuard; i < m_offset; ++i)
             if (std::memcmp(&m_store[i], &kPattern, sizeof(T)) != 0) return false;
@@ -101,38 +141,24 @@ inline std::int64_t UlpDistance(float a, float b) {
     return la > lb ? la - lb : lb - la;
 }
 
-// Reproducible uniform noise in [-1, 1).
-inline std::vector<float> Noise(std::size_t n, std::uint32_t seed) {
-    std::vector<float> x(n);
-    std::uint32_t s = seed * 747796405u + 1u;
-    for (float& v : x) {
-        s = s * 1664525u + 1013904223u;
-        v = static_cast<float>(static_cast<double>(s) / 2147483648.0 - 1.0);
-    }
-    return x;
-}
-
-}  // namespace kerneltest
-
-namespace kerneltest {
-
-// Runs `body` once per runnable floating-point form, forced, with the name
-// the family should report (families without fused forms report the plain
-// form of the width).
+// Runs `body(form, name)` once per form this processor runs, forced, with the
+// name the family should report: families without fused forms report the
+// plain form of the width.
 template <class Body>
 void ForEachForm(bool hasFusedForms, Body body) {
-    for (const Form& form : FloatForms()) {
+    for (const Form& form : AllForms()) {
         if (!Runnable(form)) continue;
         ora::system::ScopedDispatch forced(form.level, form.fma);
-        body(form, hasFusedForms ? std::string(form.name) : PlainName(form));
+        const std::string name = ora::system::KernelFormName(form.form);
+        body(form, hasFusedForms ? name : name.substr(0, name.find("_fma")));
     }
 }
 
-// The sum of AwkwardLengths(): a signal long enough to walk them all.
-inline std::size_t AwkwardTotal() {
-    std::size_t total = 0;
-    for (std::size_t n : AwkwardLengths()) total += n;
-    return total;
-}
+class FormTest : public testing::TestWithParam<Form> {
+protected:
+    void SetUp() override {
+        if (!Runnable(GetParam())) GTEST_SKIP() << "this processor cannot run the form";
+    }
+};
 
 }  // namespace kerneltest

@@ -11,7 +11,7 @@ using ora::numeric::LR2MS;
 using ora::numeric::MS2LR;
 
 TEST(MidSide, MonoHasNoSideAndTheRoundTripRestoresLeftAndRight) {
-    const std::vector<float> l = Noise(1000, 1), r = Noise(1000, 2);
+    const std::vector<float> l = RandomFloats(1000, 1), r = RandomFloats(1000, 2);
     std::vector<float> m(1000), s(1000), l2(1000), r2(1000);
     LR2MS().Process(l.data(), l.data(), m.data(), s.data(), 1000);
     for (std::size_t n = 0; n < 1000; ++n) {
@@ -29,7 +29,7 @@ TEST(MidSide, MonoHasNoSideAndTheRoundTripRestoresLeftAndRight) {
 
 TEST(MidSide, EveryFormGivesTheReferenceResult) {
     const std::size_t total = AwkwardTotal();
-    const std::vector<float> a = Noise(total, 3), b = Noise(total, 4);
+    const std::vector<float> a = RandomFloats(total, 3), b = RandomFloats(total, 4);
     std::vector<float> m(total), s(total), l(total), r(total);
     {
         ora::system::ScopedDispatch forced(InstructionLevel::None, false);

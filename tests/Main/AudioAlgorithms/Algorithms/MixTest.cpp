@@ -29,7 +29,7 @@ TEST(Mix, EveryFormGivesTheReferenceResult) {
         std::vector<std::vector<float>> signals;
         std::vector<float> weights;
         for (std::size_t i = 0; i < count; ++i) {
-            signals.push_back(Noise(total, static_cast<std::uint32_t>(i + 1)));
+            signals.push_back(RandomFloats(total, static_cast<std::uint32_t>(i + 1)));
             weights.push_back(0.3f * static_cast<float>(i) - 0.7f);
         }
         std::vector<const float*> pointers;

@@ -163,7 +163,7 @@ TEST(TruePeak, LatencyBlockSplitsFactorAndReset) {
         EXPECT_FLOAT_EQ(meter.Process(x.data() + 6, 1), 1.0f);
     }
     // Any split of the stream gives the same largest reading.
-    const std::vector<float> x = Noise(3000, 4);
+    const std::vector<float> x = RandomFloats(3000, 4);
     const double whole = Reading(x);
     for (std::size_t block : {1u, 5u, 64u, 257u}) EXPECT_EQ(Reading(x, block), whole) << block;
 
@@ -223,7 +223,7 @@ TEST(UpsamplerTruePeak_x4, InterpolatesBandLimitedSignalsBetweenSamples) {
 
 TEST(UpsamplerTruePeak_x4, EveryFormGivesTheReferenceResult) {
     const std::size_t total = AwkwardTotal();
-    const std::vector<float> x = Noise(total, 9);
+    const std::vector<float> x = RandomFloats(total, 9);
     for (TruePeakFilter filter : {TruePeakFilter::Standard, TruePeakFilter::Wideband}) {
         const UpsamplerTruePeakConfig config{1, filter};
         std::vector<float> reference(4 * total);
@@ -239,23 +239,24 @@ TEST(UpsamplerTruePeak_x4, EveryFormGivesTheReferenceResult) {
         double sumOfTaps = 0.0;
         for (std::size_t i = 0; i < 3 * taps; ++i) sumOfTaps += std::fabs(phases[i]);
         const double bound = static_cast<double>(taps) * std::ldexp(sumOfTaps, -22);
-        for (const Form& form : FloatForms()) {
+        for (const Form& form : AllForms()) {
             if (!Runnable(form)) continue;
             ScopedDispatch forced(form.level, form.fma);
+            const char* name = ora::system::KernelFormName(form.form);
             UpsamplerTruePeak_x4 upsampler(config);
-            EXPECT_STREQ(upsampler.FormName(), form.name);
+            EXPECT_STREQ(upsampler.FormName(), name);
             std::size_t position = 0;
             for (std::size_t n : AwkwardLengths()) {
                 Guarded<> in(n), out(4 * n);
                 std::copy_n(x.begin() + position, n, in.data());
                 upsampler.Process(in.data(), out.data(), n);
-                ASSERT_TRUE(out.GuardsIntact()) << form.name << " length " << n;
+                ASSERT_TRUE(out.GuardsIntact()) << name << " length " << n;
                 for (std::size_t i = 0; i < 4 * n; ++i) {
                     const float want = reference[4 * position + i];
-                    if (form.fused)
-                        ASSERT_NEAR(out[i], want, bound) << form.name;
+                    if (Fused(form.form))
+                        ASSERT_NEAR(out[i], want, bound) << name;
                     else
-                        ASSERT_EQ(out[i], want) << form.name << " at " << 4 * position + i;
+                        ASSERT_EQ(out[i], want) << name << " at " << 4 * position + i;
                 }
                 position += n;
             }
@@ -266,8 +267,8 @@ TEST(UpsamplerTruePeak_x4, EveryFormGivesTheReferenceResult) {
 TEST(TruePeak, EveryFormGivesTheReferenceReading) {
     std::vector<std::vector<float>> signals;
     for (const Case& c : Tech3341Cases()) signals.push_back(c.signal);
-    signals.push_back(Noise(5000, 3));
-    for (const Form& form : FloatForms()) {
+    signals.push_back(RandomFloats(5000, 3));
+    for (const Form& form : AllForms()) {
         if (!Runnable(form)) continue;
         for (const auto& signal : signals) {
             float want;
@@ -276,19 +277,21 @@ TEST(TruePeak, EveryFormGivesTheReferenceReading) {
                 want = TruePeak().Process(signal.data(), signal.size());
             }
             ScopedDispatch forced(form.level, form.fma);
+            const char* name = ora::system::KernelFormName(form.form);
             TruePeak meter;
-            EXPECT_STREQ(meter.FormName(), form.name);
+            EXPECT_STREQ(meter.FormName(), name);
             const float got = meter.Process(signal.data(), signal.size());
-            if (form.fused)
-                EXPECT_LE(UlpDistance(got, want), 64) << form.name;
+            if (Fused(form.form))
+                EXPECT_LE(UlpDistance(got, want), 64) << name;
             else
-                EXPECT_EQ(got, want) << form.name;
+                EXPECT_EQ(got, want) << name;
         }
         // Odd lengths from misaligned buffers, each reading against ref.
         ScopedDispatch forced(form.level, form.fma);
+        const char* name = ora::system::KernelFormName(form.form);
         TruePeak meter;
         std::size_t position = 0;
-        const std::vector<float> x = Noise(6000, 21);
+        const std::vector<float> x = RandomFloats(6000, 21);
         std::vector<float> wants;
         {
             ScopedDispatch ref(InstructionLevel::None, false);
@@ -304,10 +307,10 @@ TEST(TruePeak, EveryFormGivesTheReferenceReading) {
             Guarded<> in(n);
             std::copy_n(x.begin() + position, n, in.data());
             const float got = meter.Process(in.data(), n);
-            if (form.fused)
-                EXPECT_LE(UlpDistance(got, wants[index]), 64) << form.name << " length " << n;
+            if (Fused(form.form))
+                EXPECT_LE(UlpDistance(got, wants[index]), 64) << name << " length " << n;
             else
-                EXPECT_EQ(got, wants[index]) << form.name << " length " << n;
+                EXPECT_EQ(got, wants[index]) << name << " length " << n;
             position += n;
             ++index;
         }

@@ -37,7 +37,7 @@ Operations() {
 }  // namespace
 
 TEST(Vec, OperationsFollowTheirDefinitions) {
-    const std::vector<float> a = Noise(37, 1), b = Noise(37, 2);
+    const std::vector<float> a = RandomFloats(37, 1), b = RandomFloats(37, 2);
     std::vector<float> out(37);
     const Vec vec;
     vec.Add(a.data(), b.data(), out.data(), 37);
@@ -60,7 +60,7 @@ TEST(Vec, OperationsFollowTheirDefinitions) {
 
 TEST(Vec, EveryFormGivesTheReferenceResult) {
     const std::size_t total = AwkwardTotal();
-    std::vector<float> a = Noise(total, 5), b = Noise(total, 6);
+    std::vector<float> a = RandomFloats(total, 5), b = RandomFloats(total, 6);
     a[3] = std::nanf("");  // NaN must take the same path in every form
     for (const auto& [name, op] : Operations()) {
         std::vector<float> want(total);

@@ -76,21 +76,21 @@ TEST(DispatchSettings, FamiliesWithoutFusedOrFloatFormsHaveTheirOwnLadders) {
         InstructionLevel level;
         bool fma;
         KernelForm plain;
-        KernelForm integer;
+        IntegerKernelForm integer;
     } cases[] = {
-        {InstructionLevel::AVX2, true, KernelForm::M256, KernelForm::M256Avx2},
-        {InstructionLevel::AVX, true, KernelForm::M256, KernelForm::M128Sse41},  // AVX without AVX2: 128-bit integers
-        {InstructionLevel::SSE42, true, KernelForm::M128, KernelForm::M128Sse41},
-        {InstructionLevel::SSSE3, false, KernelForm::M128, KernelForm::Ref},    // no 32-bit multiply below SSE4.1
-        {InstructionLevel::None, false, KernelForm::Ref, KernelForm::Ref},
+        {InstructionLevel::AVX2, true, KernelForm::M256, IntegerKernelForm::M256Avx2},
+        {InstructionLevel::AVX, true, KernelForm::M256, IntegerKernelForm::M128Sse41},  // AVX without AVX2
+        {InstructionLevel::SSE42, true, KernelForm::M128, IntegerKernelForm::M128Sse41},
+        {InstructionLevel::SSSE3, false, KernelForm::M128, IntegerKernelForm::Ref},  // no 32-bit multiply yet
+        {InstructionLevel::None, false, KernelForm::Ref, IntegerKernelForm::Ref},
     };
     for (const Case& c : cases) {
         ScopedDispatch forced(c.level, c.fma);
         EXPECT_EQ(ChooseKernelFormWithoutFma(), c.plain) << static_cast<int>(c.level);
         EXPECT_EQ(ChooseIntegerKernelForm(), c.integer) << static_cast<int>(c.level);
     }
-    EXPECT_STREQ(KernelFormName(KernelForm::M256Avx2), "m256_avx2");
-    EXPECT_STREQ(KernelFormName(KernelForm::M128Sse41), "m128_sse41");
+    EXPECT_STREQ(KernelFormName(IntegerKernelForm::M256Avx2), "m256_avx2");
+    EXPECT_STREQ(KernelFormName(IntegerKernelForm::M128Sse41), "m128_sse41");
 }
 
 TEST(DispatchSettings, ForcedCountsStandInForTheDetectedOnes) {
