@@ -24,6 +24,7 @@ void Plpv::SetMaxPeaks(std::size_t count) { m_maxPeaks = std::min(std::max<std::
 std::size_t Plpv::FindPeaks(const float* mag) noexcept {
     const std::size_t bins = m_bins;
     const float eps = m_threshold * *std::max_element(mag, mag + bins);
+    m_eps = eps;
     std::size_t count = 0;
     for (std::size_t k = 0; k < bins; ++k) {
         const float v = mag[k];
@@ -52,7 +53,7 @@ void Plpv::ProcessRow(const float* mag, const float* phase, const float* tgrad, 
     const std::size_t bins = m_bins;
     const std::size_t count = FindPeaks(mag);
     if (count == 0) {
-        for (std::size_t k = 0; k < bins; ++k) psi[k] = static_cast<float>(Princarg(psi[k] + hop * tgrad[k]));
+        std::copy(phase, phase + bins, psi);
         return;
     }
     // Every peak's new phase first: the update below overwrites the previous ones.
@@ -72,7 +73,8 @@ void Plpv::ProcessRow(const float* mag, const float* phase, const float* tgrad, 
             end = std::max(end, p + 1);
         }
         const double offset = static_cast<double>(m_peakPhase[i]) - phase[p];
-        for (std::size_t k = start; k < end; ++k) psi[k] = static_cast<float>(Princarg(offset + phase[k]));
+        for (std::size_t k = start; k < end; ++k)
+            psi[k] = mag[k] > m_eps ? static_cast<float>(Princarg(offset + phase[k])) : phase[k];
         start = end;
     }
 }

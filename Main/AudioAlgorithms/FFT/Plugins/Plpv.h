@@ -3,8 +3,10 @@
 // phase along TGRAD over the synthesis hop; every other bin belongs to the
 // peak whose region it lies in (regions meet at the deepest bin between two
 // peaks) and keeps its analysis phase offset from that peak, so each
-// partial's main lobe stays coherent. Without peaks every bin advances on
-// its own.
+// partial's main lobe stays coherent. Bins below the threshold (all bins
+// of a frame without peaks) keep their analysis phase: they are too quiet to
+// matter, and a bin that rises from silence then starts coherent with its
+// neighbours instead of with whatever phase it drifted to.
 #pragma once
 
 #include <cstdint>
@@ -38,6 +40,7 @@ private:
 
     bool m_enabled = false;
     float m_threshold = 1e-4f;
+    float m_eps = 0.0f;  // the threshold of the row being processed
     std::size_t m_maxPeaks = 50;
     std::size_t m_bins = 0;
     std::vector<std::int32_t> m_candidates;

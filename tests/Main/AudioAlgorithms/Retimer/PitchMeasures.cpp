@@ -146,14 +146,13 @@ std::vector<float> PlainVocoderShift(const std::vector<float>& x, double ratio) 
 }
 
 Quality Compare(const std::vector<float>& reference, const std::vector<float>& test, std::size_t skip) {
-    const std::size_t n = 2048, hop = 512;
+    const std::size_t n = 2048, hop = 512, bins = n / 2 + 1;
     ora::fft::FFT fft(n, ora::fft::Backend::Kiss);
     std::vector<float> win(n);
     ora::fft::Window::Hann(win.data(), n);
     std::vector<float> fr(n), ft(n);
-    std::vector<ora::fft::Complex> sr(n / 2 + 1), st(n / 2 + 1);
-    double diff = 0.0, energy = 0.0, lsd = 0.0;
-    std::size_t frames = 0;
+    std::vector<ora::fft::Complex> sr(bins), st(bins);
+    std::vector<double> magR, magT;
     const std::size_t end = std::min(reference.size(), test.size()) - skip;
     for (std::size_t start = skip; start + n <= end; start += hop) {
         for (std::size_t j = 0; j < n; ++j) {
@@ -162,16 +161,28 @@ Quality Compare(const std::vector<float>& reference, const std::vector<float>& t
         }
         fft.ForwardReal(fr.data(), sr.data());
         fft.ForwardReal(ft.data(), st.data());
+        for (std::size_t k = 0; k < bins; ++k) {
+            magR.push_back(std::abs(sr[k]));
+            magT.push_back(std::abs(st[k]));
+        }
+    }
+    // Powers are floored 60 dB below the reference's loudest bin, so the
+    // window's side lobes and the numeric floor do not dominate the distance.
+    double peak = 0.0;
+    for (double m : magR) peak = std::max(peak, m * m);
+    const double floor = 1e-6 * peak;
+    double diff = 0.0, energy = 0.0, lsd = 0.0;
+    const std::size_t frames = magR.size() / bins;
+    for (std::size_t f = 0; f < frames; ++f) {
         double frameLsd = 0.0;
-        for (std::size_t k = 0; k <= n / 2; ++k) {
-            const double a = std::abs(sr[k]), b = std::abs(st[k]);
+        for (std::size_t k = 0; k < bins; ++k) {
+            const double a = magR[f * bins + k], b = magT[f * bins + k];
             diff += (a - b) * (a - b);
             energy += a * a;
-            const double d = 10.0 * std::log10((a * a + 1e-9) / (b * b + 1e-9));
+            const double d = 10.0 * std::log10((a * a + floor) / (b * b + floor));
             frameLsd += d * d;
         }
-        lsd += std::sqrt(frameLsd / static_cast<double>(n / 2 + 1));
-        ++frames;
+        lsd += std::sqrt(frameLsd / static_cast<double>(bins));
     }
     return {10.0 * std::log10(diff / energy), lsd / static_cast<double>(std::max<std::size_t>(frames, 1))};
 }

@@ -45,7 +45,8 @@ struct Quality {
     double spectralConvergenceDb;  // 20 log10(|| |S|-|R| || / || |R| ||), lower is better
     double logSpectralDistanceDb;  // mean over frames of the RMS dB difference, lower is better
 };
-// Compared on x[skip, size - skip) with 2048-sample Hann frames, hop 512.
+// Compared on x[skip, size - skip) with 2048-sample Hann frames, hop 512;
+// powers floored 60 dB below the reference's loudest bin for the distance.
 Quality Compare(const std::vector<float>& reference, const std::vector<float>& test, std::size_t skip);
 
 // Test material, mono at 48 kHz.
