@@ -12,7 +12,7 @@ PACKAGES="
   libwebrtc-audio-processing-dev
   libsndfile1-dev
   libcli11-dev nlohmann-json3-dev
-  lv2-dev liblilv-dev lilv-utils
+  lv2-dev liblilv-dev lilv-utils sordi
   googletest libgtest-dev libgmock-dev libbenchmark-dev
 "
 

@@ -1,6 +1,10 @@
 #include "AudioFile.h"
 
+#include <unistd.h>
+
 #include <algorithm>
+#include <cerrno>
+#include <cstring>
 #include <cctype>
 #include <map>
 
@@ -46,6 +50,8 @@ bool Storable(int format) {
 }  // namespace
 
 AudioFileReader::AudioFileReader(const std::string& path) : m_path(path) {
+    // libsndfile words a missing file as a system error; say it plainly.
+    if (access(path.c_str(), R_OK) != 0) throw ZenfxError("cannot read '" + path + "': " + std::strerror(errno));
     m_file = sf_open(path.c_str(), SFM_READ, &m_info);
     if (m_file == nullptr) throw ZenfxError("cannot read '" + path + "': " + sf_strerror(nullptr));
     if (m_info.channels < 1) throw ZenfxError("cannot read '" + path + "': it has no audio channels");

@@ -38,13 +38,17 @@ std::string UpperName(const std::string& identifier) {
 }  // namespace
 
 std::uint32_t FindParameter(AudioPlugin& plugin, const std::string& pluginName, const std::string& name) {
-    std::vector<std::string> names;
-    for (std::uint32_t i = 0; i < plugin.GetParameterCount(); ++i) {
-        zen::ParameterInfo info;
-        plugin.GetParameterInfo(i, info);
-        if (EqualsIgnoreCase(name, info.label) || EqualsIgnoreCase(name, info.identifier) ||
-            EqualsIgnoreCase(name, UpperName(info.identifier)))
+    std::vector<zen::ParameterInfo> infos(plugin.GetParameterCount());
+    for (std::uint32_t i = 0; i < infos.size(); ++i) plugin.GetParameterInfo(i, infos[i]);
+    // Labels first: a label may equal another parameter's upper-case name
+    // (the De-Esser's "Range" is ZenDeesser::MODE, not ZenDeesser::RANGE).
+    for (std::uint32_t i = 0; i < infos.size(); ++i)
+        if (EqualsIgnoreCase(name, infos[i].label)) return i;
+    for (std::uint32_t i = 0; i < infos.size(); ++i)
+        if (EqualsIgnoreCase(name, infos[i].identifier) || EqualsIgnoreCase(name, UpperName(infos[i].identifier)))
             return i;
+    std::vector<std::string> names;
+    for (const zen::ParameterInfo& info : infos) {
         names.push_back(info.label);
         names.push_back(info.identifier);
     }

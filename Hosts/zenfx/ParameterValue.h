@@ -8,8 +8,8 @@
 
 namespace zenfx {
 
-// Index of a parameter by label, identifier or the upper-case name after
-// "::", case-insensitive. Throws ZenfxError with the closest names.
+// Index of a parameter by label, else by identifier or the upper-case name
+// after "::", case-insensitive. Throws ZenfxError with the closest names.
 std::uint32_t FindParameter(AudioPlugin& plugin, const std::string& pluginName, const std::string& name);
 
 // A typed value in the parameter's unit: "6", "-3 dB", "2.5kHz", "50%";

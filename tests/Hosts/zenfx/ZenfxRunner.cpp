@@ -29,12 +29,17 @@ std::string Slurp(const std::string& path) {
 
 }  // namespace
 
-ZenfxResult RunZenfx(const std::vector<std::string>& arguments) {
+ZenfxResult RunZenfx(const std::vector<std::string>& arguments) { return RunProgram(ZENFX_PATH, arguments); }
+
+ZenfxResult RunProgram(const std::string& program, const std::vector<std::string>& arguments,
+                       const std::vector<std::string>& environment) {
     char outPath[] = "/tmp/zenfx-out-XXXXXX";
     char errPath[] = "/tmp/zenfx-err-XXXXXX";
     close(mkstemp(outPath));
     close(mkstemp(errPath));
-    std::string command = Quote(ZENFX_PATH);
+    std::string command = "env";
+    for (const std::string& variable : environment) command += " " + Quote(variable);
+    command += " " + Quote(program);
     for (const std::string& a : arguments) command += " " + Quote(a);
     command += " </dev/null >" + std::string(outPath) + " 2>" + errPath;
     const int status = std::system(command.c_str());

@@ -18,6 +18,10 @@ struct ZenfxResult {
 // captured separately (so no terminal: no progress bar).
 ZenfxResult RunZenfx(const std::vector<std::string>& arguments);
 
+// Any program the same way; `environment` holds NAME=VALUE pairs set for it.
+ZenfxResult RunProgram(const std::string& program, const std::vector<std::string>& arguments,
+                       const std::vector<std::string>& environment = {});
+
 struct AudioData {
     SF_INFO info{};
     std::vector<float> samples;  // interleaved

@@ -1,0 +1,90 @@
+#include "Catalog.h"
+
+#include <cctype>
+#include <cstdio>
+
+namespace zenlv2 {
+
+namespace {
+
+struct Layout {
+    std::uint32_t inputs;
+    std::uint32_t outputs;
+};
+
+// The layouts a user inserts on a track or bus; wider ones are left to hosts
+// of the library's own interface. Inputs 0: plug-ins without audio input.
+constexpr Layout kLayouts[] = {{1, 1}, {1, 2}, {2, 2}, {0, 1}, {0, 2}};
+
+std::string ChannelsName(std::uint32_t channels) { return channels == 1 ? "mono" : "stereo"; }
+
+std::string ChannelsLabel(std::uint32_t channels) { return channels == 1 ? "Mono" : "Stereo"; }
+
+std::string LayoutLabel(std::uint32_t inputs, std::uint32_t outputs) {
+    if (inputs == 0 || inputs == outputs) return ChannelsLabel(outputs);
+    return ChannelsLabel(inputs) + " to " + ChannelsLabel(outputs);
+}
+
+}  // namespace
+
+std::string Catalog::PercentEncode(const std::string& text) {
+    std::string encoded;
+    for (char c : text) {
+        const auto u = static_cast<unsigned char>(c);
+        if (std::isalnum(u) || c == '-' || c == '.' || c == '_' || c == '~') {
+            encoded += c;
+        } else {
+            char escape[4];
+            std::snprintf(escape, sizeof(escape), "%%%02X", u);
+            encoded += escape;
+        }
+    }
+    return encoded;
+}
+
+std::string Catalog::MakeUri(const std::string& key, const std::string& layout) {
+    // The key's own colon separates name and code; it stays readable.
+    const std::size_t colon = key.rfind(':');
+    const std::string encoded = colon == std::string::npos
+                                    ? PercentEncode(key)
+                                    : PercentEncode(key.substr(0, colon)) + ":" + PercentEncode(key.substr(colon + 1));
+    return kUriPrefix + encoded + ":" + layout;
+}
+
+std::string Catalog::LayoutName(std::uint32_t inputs, std::uint32_t outputs) {
+    if (inputs == 0 || inputs == outputs) return ChannelsName(outputs);
+    return ChannelsName(inputs) + "-to-" + ChannelsName(outputs);
+}
+
+std::vector<Variant> Catalog::Build(Library& library) {
+    std::vector<Variant> variants;
+    if (!library.IsLoaded()) return variants;
+    for (const auto& [key, entry] : library.Interface().GetPluginList(zen::kAudioPluginKind)) {
+        std::unique_ptr<zen::PluginInstance> instance = library.Create(key);
+        if (instance == nullptr) continue;
+        AudioPlugin& audio = *zen::InterfaceCast<AudioPlugin>(instance.get());
+        const zen::PluginDescriptor& descriptor = *instance->GetDescriptor();
+        const std::size_t first = variants.size();
+        const bool hasInput = descriptor.inputChannelLimit > 0;
+        for (const Layout& layout : kLayouts) {
+            if ((layout.inputs > 0) != hasInput || !audio.ConfigureChannels(layout.inputs, layout.outputs)) continue;
+            Variant variant;
+            variant.key = key;
+            variant.name = entry.name;
+            variant.inputs = layout.inputs;
+            variant.outputs = layout.outputs;
+            variant.layout = LayoutName(layout.inputs, layout.outputs);
+            variant.uri = MakeUri(key, variant.layout);
+            variants.push_back(std::move(variant));
+        }
+        const bool several = variants.size() - first > 1;
+        for (std::size_t v = first; v < variants.size(); ++v) {
+            Variant& variant = variants[v];
+            variant.label = several ? variant.name + " (" + LayoutLabel(variant.inputs, variant.outputs) + ")"
+                                    : variant.name;
+        }
+    }
+    return variants;
+}
+
+}  // namespace zenlv2

@@ -1,0 +1,94 @@
+// zen-lv2-ttl: writes the bundle's .ttl files from the library's registry and
+// parameter tables. Run by the build after the library and the adapter.
+//
+//   zen-lv2-ttl LIBRARY BUNDLE_DIR BINARY_NAME
+#include <dirent.h>
+#include <unistd.h>
+
+#include <cstdio>
+#include <fstream>
+#include <map>
+#include <set>
+
+#include "Catalog.h"
+#include "PortMap.h"
+#include "TurtleWriter.h"
+
+namespace {
+
+bool WriteFile(const std::string& path, const std::string& text) {
+    const std::string temporary = path + ".tmp";
+    {
+        std::ofstream out(temporary, std::ios::binary | std::ios::trunc);
+        out << text;
+        if (!out.good()) return false;
+    }
+    return std::rename(temporary.c_str(), path.c_str()) == 0;
+}
+
+// Descriptions of plug-ins that left the registry must not linger.
+void RemoveStaleFiles(const std::string& folder, const std::set<std::string>& keep) {
+    DIR* dir = opendir(folder.c_str());
+    if (dir == nullptr) return;
+    while (dirent* entry = readdir(dir)) {
+        const std::string name = entry->d_name;
+        if (name.size() > 4 && name.compare(name.size() - 4, 4, ".ttl") == 0 && keep.count(name) == 0)
+            unlink((folder + "/" + name).c_str());
+    }
+    closedir(dir);
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+    if (argc != 4) {
+        std::fprintf(stderr, "usage: zen-lv2-ttl LIBRARY BUNDLE_DIR BINARY_NAME\n");
+        return 2;
+    }
+    const std::string folder = argv[2];
+    const std::string binary = argv[3];
+    zenlv2::Library library({argv[1]});
+    if (!library.IsLoaded()) {
+        std::fprintf(stderr, "zen-lv2-ttl: cannot load %s: %s\n", argv[1], library.Error().c_str());
+        return 1;
+    }
+    const std::vector<zenlv2::Variant> variants = zenlv2::Catalog::Build(library);
+    if (variants.empty()) {
+        std::fprintf(stderr, "zen-lv2-ttl: %s offers no audio plug-in in a mono or stereo layout\n", argv[1]);
+        return 1;
+    }
+
+    std::map<std::string, std::string> files;  // file name -> text
+    for (const zenlv2::Variant& variant : variants) {
+        auto instance = library.Create(variant.key);
+        AudioPlugin* audio = zen::InterfaceCast<AudioPlugin>(instance.get());
+        if (audio == nullptr || !audio->ConfigureChannels(variant.inputs, variant.outputs)) {
+            std::fprintf(stderr, "zen-lv2-ttl: '%s' cannot be created in its %s layout\n", variant.key.c_str(),
+                         variant.layout.c_str());
+            return 1;
+        }
+        std::string& text = files[zenlv2::TurtleWriter::FileName(variant.key)];
+        if (text.empty())
+            text = "# Generated from the plug-in registry at build time; do not edit.\n" +
+                   zenlv2::TurtleWriter::Prefixes() + zenlv2::TurtleWriter::Project();
+        text += zenlv2::TurtleWriter::Plugin(variant, zenlv2::PortMap(*audio, variant.inputs, variant.outputs));
+    }
+
+    std::set<std::string> written = {"manifest.ttl"};
+    for (const auto& [name, text] : files) {
+        if (!WriteFile(folder + "/" + name, text)) {
+            std::fprintf(stderr, "zen-lv2-ttl: cannot write %s/%s\n", folder.c_str(), name.c_str());
+            return 1;
+        }
+        written.insert(name);
+    }
+    RemoveStaleFiles(folder, written);
+    // The manifest last: it is the build's mark that the bundle is complete.
+    if (!WriteFile(folder + "/manifest.ttl", zenlv2::TurtleWriter::Manifest(variants, binary))) {
+        std::fprintf(stderr, "zen-lv2-ttl: cannot write %s/manifest.ttl\n", folder.c_str());
+        return 1;
+    }
+    std::printf("zen-lv2-ttl: %zu plug-ins in %zu layouts written to %s\n", files.size(), variants.size(),
+                folder.c_str());
+    return 0;
+}

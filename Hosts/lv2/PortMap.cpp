@@ -1,0 +1,74 @@
+#include "PortMap.h"
+
+#include <cctype>
+
+namespace zenlv2 {
+
+namespace {
+
+// "In", "Out" for mono; "In L", "In R" for stereo.
+std::string ChannelSuffix(std::uint32_t channel, std::uint32_t count, bool symbol) {
+    if (count == 1) return "";
+    if (count == 2) return symbol ? (channel == 0 ? "_l" : "_r") : (channel == 0 ? " L" : " R");
+    return (symbol ? "_" : " ") + std::to_string(channel + 1);
+}
+
+}  // namespace
+
+std::string PortMap::MakeSymbol(const std::string& text) {
+    const std::size_t colons = text.rfind("::");
+    const std::string name = colons == std::string::npos ? text : text.substr(colons + 2);
+    std::string symbol;
+    for (char c : name) {
+        const auto u = static_cast<unsigned char>(c);
+        if (std::isalnum(u)) symbol += static_cast<char>(std::tolower(u));
+        else if (!symbol.empty() && symbol.back() != '_') symbol += '_';
+    }
+    while (!symbol.empty() && symbol.back() == '_') symbol.pop_back();
+    if (symbol.empty() || std::isdigit(static_cast<unsigned char>(symbol[0]))) symbol = "p_" + symbol;
+    return symbol;
+}
+
+PortMap::PortMap(const AudioPlugin& audio, std::uint32_t inputs, std::uint32_t outputs)
+    : m_inputs(inputs), m_outputs(outputs) {
+    for (std::uint32_t c = 0; c < inputs; ++c)
+        Add({PortType::AudioInput, c, "in" + ChannelSuffix(c, inputs, true), "In" + ChannelSuffix(c, inputs, false),
+             {}, {}});
+    for (std::uint32_t c = 0; c < outputs; ++c)
+        Add({PortType::AudioOutput, c, "out" + ChannelSuffix(c, outputs, true),
+             "Out" + ChannelSuffix(c, outputs, false), {}, {}});
+    Add({PortType::Enabled, 0, "enabled", "Enabled", {}, {}});
+    Add({PortType::Latency, 0, "latency", "Latency", {}, {}});
+
+    m_parameterCount = audio.GetParameterCount();
+    for (std::uint32_t p = 0; p < m_parameterCount; ++p) {
+        Port port{PortType::Parameter, p, {}, {}, {}, {}};
+        audio.GetParameterInfo(p, port.parameter);
+        port.symbol = MakeSymbol(port.parameter.identifier);
+        port.name = port.parameter.label;
+        Add(std::move(port));
+    }
+    m_meterCount = audio.GetMeterCount();
+    for (std::uint32_t m = 0; m < m_meterCount; ++m) {
+        Port port{PortType::Meter, m, {}, {}, {}, {}};
+        audio.GetMeterInfo(m, port.meter);
+        port.symbol = MakeSymbol(port.meter.name);
+        port.name = port.meter.name;
+        Add(std::move(port));
+    }
+}
+
+void PortMap::Add(Port port) {
+    // Symbols must be unique within a plug-in; a clash gets a number.
+    std::string symbol = port.symbol;
+    for (int n = 2;; ++n) {
+        bool taken = false;
+        for (const Port& other : m_ports) taken = taken || other.symbol == symbol;
+        if (!taken) break;
+        symbol = port.symbol + "_" + std::to_string(n);
+    }
+    port.symbol = symbol;
+    m_ports.push_back(std::move(port));
+}
+
+}  // namespace zenlv2

@@ -1,0 +1,176 @@
+// The bundles as Debian's LV2 tools see them: sord_validate against the
+// schemas Debian ships, lv2ls and lv2info listing every plug-in with its
+// ports, and lv2apply processing a WAV file exactly as zenfx does.
+#include <dirent.h>
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <cmath>
+#include <cstdio>
+#include <set>
+
+#include "../zenfx/ZenfxRunner.h"
+#include "Catalog.h"
+#include "Library.h"
+#include "LilvHost.h"
+
+using zentest::RunProgram;
+
+namespace {
+
+constexpr const char* kSchemaFolder = "/usr/lib/lv2";
+
+struct Bundle {
+    const char* folder;
+    const char* library;
+};
+const Bundle kShipped = {ZEN_LV2_BUNDLE, ZEN_LIBRARY_PATH};
+const Bundle kTest = {ZEN_LV2_TEST_BUNDLE, ZEN_TEST_LIBRARY_PATH};
+
+std::string Parent(const std::string& folder) { return folder.substr(0, folder.find_last_of('/')); }
+
+void CollectTtl(const std::string& folder, std::vector<std::string>& files) {
+    DIR* dir = opendir(folder.c_str());
+    if (dir == nullptr) return;
+    while (dirent* entry = readdir(dir)) {
+        const std::string name = entry->d_name;
+        if (name == "." || name == "..") continue;
+        const std::string path = folder + "/" + name;
+        if (name.size() > 4 && name.compare(name.size() - 4, 4, ".ttl") == 0) files.push_back(path);
+        else if (entry->d_type == DT_DIR) CollectTtl(path, files);
+    }
+    closedir(dir);
+}
+
+// An LV2 tool with only `bundle` on its path. A sanitizer build's adapter
+// needs its runtime in the (uninstrumented) tool.
+zentest::ZenfxResult RunLv2Tool(const std::string& tool, const Bundle& bundle, const std::vector<std::string>& args) {
+    std::vector<std::string> environment = {"LV2_PATH=" + Parent(bundle.folder)};
+    if (*ZEN_SANITIZER_PRELOAD != '\0') {
+        environment.push_back(std::string("LD_PRELOAD=") + ZEN_SANITIZER_PRELOAD);
+        environment.push_back("ASAN_OPTIONS=detect_leaks=0");
+    }
+    return RunProgram(tool, args, environment);
+}
+
+std::string Format(float value) {
+    char text[32];
+    std::snprintf(text, sizeof(text), "%.9g", static_cast<double>(value));
+    return text;
+}
+
+}  // namespace
+
+TEST(Lv2Tools, SordValidateFindsNoErrorsAgainstDebiansSchemas) {
+    for (const Bundle& bundle : {kShipped, kTest}) {
+        std::vector<std::string> files;
+        CollectTtl(kSchemaFolder, files);
+        ASSERT_GT(files.size(), 20u) << "the LV2 schemas (lv2-dev) are missing";
+        const std::size_t schemas = files.size();
+        CollectTtl(bundle.folder, files);
+        ASSERT_GT(files.size(), schemas + 1);
+        const auto result = RunProgram("sord_validate", files);
+        const std::string text = result.out + result.err;
+        EXPECT_NE(text.find("Found 0 errors"), std::string::npos) << bundle.folder << "\n" << text;
+    }
+}
+
+TEST(Lv2Tools, Lv2lsAndLv2infoShowEveryPluginWithItsPorts) {
+    zenlv2::Library library({kShipped.library});
+    ASSERT_TRUE(library.IsLoaded()) << library.Error();
+    const auto listed = RunLv2Tool("lv2ls", kShipped, {});
+    ASSERT_EQ(listed.exitCode, 0) << listed.err;
+    std::set<std::string> uris;
+    for (std::size_t start = 0, end; (end = listed.out.find('\n', start)) != std::string::npos; start = end + 1)
+        uris.insert(listed.out.substr(start, end - start));
+
+    for (const auto& [key, entry] : library.Interface().GetPluginList(zen::kAudioPluginKind)) {
+        SCOPED_TRACE(key);
+        std::size_t layouts = 0;
+        for (const std::string& uri : uris) {
+            if (uri.rfind(zenlv2::Catalog::MakeUri(key, ""), 0) != 0) continue;
+            ++layouts;
+            const auto info = RunLv2Tool("lv2info", kShipped, {uri});
+            ASSERT_EQ(info.exitCode, 0) << info.err;
+            EXPECT_NE(info.out.find("Name:              " + entry.name), std::string::npos) << info.out;
+            EXPECT_NE(info.out.find("Has latency:       yes"), std::string::npos) << info.out;
+            EXPECT_NE(info.out.find("Symbol:      enabled"), std::string::npos);
+            const auto instance = library.Create(key);
+            AudioPlugin& audio = *zen::InterfaceCast<AudioPlugin>(instance.get());
+            for (std::uint32_t p = 0; p < audio.GetParameterCount(); ++p) {
+                zen::ParameterInfo parameter;
+                audio.GetParameterInfo(p, parameter);
+                EXPECT_NE(info.out.find("Name:        " + parameter.label + "\n"), std::string::npos)
+                    << parameter.label;
+            }
+        }
+        EXPECT_GE(layouts, 1u) << "lv2ls does not list " << key;
+    }
+}
+
+// Every plug-in of the shipped bundle, and those only the test library has
+// ("Test Delay", with latency), in its widest layout (the lilv test covers
+// every layout): the same file, the same settings, one frame per block as
+// lv2apply runs, and the delay kept.
+TEST(Lv2Tools, Lv2applyProcessesAWavFileAsZenfxDoes) {
+    zentest::TempFolder folder;
+    std::set<std::string> done;
+    for (const Bundle& bundle : {kShipped, kTest}) {
+        zentest::LilvHost host(bundle.folder);
+        zenlv2::Library library({bundle.library});
+        const std::vector<zenlv2::Variant> variants = zenlv2::Catalog::Build(library);
+        for (std::size_t v = 0; v < variants.size(); ++v) {
+            const zenlv2::Variant& variant = variants[v];
+            const bool widest = v + 1 == variants.size() || variants[v + 1].key != variant.key;
+            if (!widest || !done.insert(variant.key).second) continue;
+            SCOPED_TRACE(variant.uri);
+            constexpr std::size_t kFrames = 2000;
+            std::vector<std::vector<float>> channels;
+            for (std::uint32_t c = 0; c < std::max(variant.inputs, 1u); ++c) {
+                std::vector<float> x(kFrames);
+                for (std::size_t n = 0; n < kFrames; ++n)
+                    x[n] = 0.8f * std::sin(0.013f * static_cast<float>(n * (c + 1))) * (n % 700 < 350 ? 1.6f : 0.4f);
+                channels.push_back(std::move(x));
+            }
+            const std::string input = folder / "in.wav";
+            zentest::WriteAudio(input, channels, 48000);
+
+            std::vector<std::string> lv2 = {"-i", input, "-o", folder / "lv2.wav"};
+            std::vector<std::string> zenfx = {"--library", bundle.library, "process", input, "-o",
+                                              folder / "zenfx.wav", "--block", "1", "--no-latency-compensation",
+                                              "--plugin", variant.key};
+            const auto instance = library.Create(variant.key);
+            AudioPlugin& audio = *zen::InterfaceCast<AudioPlugin>(instance.get());
+            const LilvPlugin* plugin = host.Find(variant.uri);
+            ASSERT_NE(plugin, nullptr);
+            for (std::uint32_t p = 0; p < audio.GetParameterCount(); ++p) {
+                zen::ParameterInfo info;
+                audio.GetParameterInfo(p, info);
+                const std::string value = Format(zentest::ParameterValueAt(info, 0.3f));
+                for (const zentest::Lv2Port& port : host.Ports(plugin))
+                    if (port.input && !port.audio && port.name == info.label)
+                        lv2.insert(lv2.end(), {"-c", port.symbol, value});
+                zenfx.insert(zenfx.end(), {"--set", info.identifier + "=" + value});
+            }
+            lv2.push_back(variant.uri);
+            const auto applied = RunLv2Tool("lv2apply", bundle, lv2);
+            ASSERT_EQ(applied.exitCode, 0) << applied.err;
+            const auto processed = RunProgram(ZENFX_PATH, zenfx);
+            ASSERT_EQ(processed.exitCode, 0) << processed.err;
+            EXPECT_NE(processed.out.find("not compensated"), std::string::npos) << processed.out;
+
+            const auto fromLv2 = zentest::ReadAudio(folder / "lv2.wav");
+            const auto fromZenfx = zentest::ReadAudio(folder / "zenfx.wav");
+            EXPECT_EQ(fromLv2.info.channels, static_cast<int>(variant.outputs));
+            ASSERT_EQ(fromLv2.samples.size(), fromZenfx.samples.size());
+            EXPECT_EQ(fromLv2.samples, fromZenfx.samples);
+            if (variant.name == "Test Delay") {  // the delay both keep: 30 % of 4800 samples
+                EXPECT_NE(processed.out.find("latency 1440 samples"), std::string::npos) << processed.out;
+                const auto left = fromLv2.Channel(0);
+                const auto first = std::find_if(left.begin(), left.end(), [](float x) { return x != 0.0f; });
+                EXPECT_EQ(first - left.begin(), 1440 + 1);  // the input's first sample is 0
+            }
+        }
+    }
+    EXPECT_GE(done.size(), 2u);
+}
