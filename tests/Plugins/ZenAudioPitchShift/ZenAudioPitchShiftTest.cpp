@@ -144,8 +144,8 @@ TEST(ZenAudioPitchShift, TakesOneToEightChannelsWithAsManyOutputs) {
     EXPECT_FALSE(audio.ConfigureChannels(9, 9));
     zentest::AssertionRecorder assertions;
     EXPECT_FALSE(audio.ConfigureChannels(2, 1));
-    ASSERT_EQ(assertions.Assertions().size(), 1u);
-    EXPECT_EQ(assertions.Assertions()[0].message, "inputs == outputs");
+    EXPECT_FALSE(audio.ConfigureChannels(2, 4));
+    EXPECT_TRUE(assertions.Assertions().empty());  // hosts probe layouts: a refusal, not an error
 
     // A new layout after preparation rebuilds the engine for it.
     plugin.Prepare(2);

@@ -85,12 +85,9 @@ bool ZenAudioPitchShift::BuildEngine() {
     return true;
 }
 
+// Hosts probe layouts, so a mismatch is a plain refusal, not a programming error.
 bool ZenAudioPitchShift::AcceptsChannelConfiguration(std::uint32_t inputs, std::uint32_t outputs) const {
-    if (inputs != outputs) {
-        ZEN_ASSERT(inputs == outputs, "inputs == outputs");
-        return false;
-    }
-    return inputs >= 1;
+    return inputs == outputs && inputs >= 1;
 }
 
 void ZenAudioPitchShift::PrepareProcessing(float, std::uint32_t) {
