@@ -1,10 +1,12 @@
 # make run    install what is missing, build, process the demo material
-# make test   the same set-up, then every test, also under ASan and UBSan
+# make test   the same set-up, then every test, also under ASan and UBSan, and
+#             the validator's thread checks under TSan
 # make bench  realtime factors of plug-ins and kernels
 # make install [PREFIX=/usr/local]
 
 BUILD_DIR ?= build
 ASAN_DIR  ?= build-asan
+TSAN_DIR  ?= build-tsan
 PREFIX    ?= /usr/local
 JOBS      ?= $(shell nproc)
 CMAKE     ?= cmake
@@ -12,7 +14,7 @@ CMAKE     ?= cmake
 COMMON_FLAGS := -G Ninja -DZEN_WERROR=ON
 ZENFX := $(BUILD_DIR)/bin/zenfx
 
-.PHONY: all setup configure build run test test-release test-asan bench install clean
+.PHONY: all setup configure build run test test-release test-asan test-tsan bench install clean
 
 all: build
 
@@ -32,7 +34,7 @@ run: build
 	    --meters-json $(BUILD_DIR)/demo-meters.json
 	@echo "Listen to $(BUILD_DIR)/demo-input.wav and $(BUILD_DIR)/demo-output.wav"
 
-test: test-release test-asan
+test: test-release test-asan test-tsan
 
 test-release: build
 	cd $(BUILD_DIR) && ctest --output-on-failure -j $(JOBS)
@@ -45,6 +47,14 @@ test-asan: setup
 	cd $(ASAN_DIR) && ASAN_OPTIONS=detect_leaks=1:abort_on_error=1 UBSAN_OPTIONS=print_stacktrace=1:halt_on_error=1 \
 	    ctest --output-on-failure -j $(JOBS)
 
+# The validator's thread checks under ThreadSanitizer; only the library, zenfx
+# and the test libraries are built.
+test-tsan: setup
+	@$(CMAKE) -S . -B $(TSAN_DIR) $(COMMON_FLAGS) -DZEN_SANITIZE_THREAD=ON -DZEN_BUILD_BENCHMARKS=OFF \
+	    -DCMAKE_BUILD_TYPE=Debug "-DCMAKE_CXX_FLAGS_DEBUG=-g -O1" >/dev/null
+	@$(CMAKE) --build $(TSAN_DIR) -j $(JOBS) --target zenfx ZenTestPlugins ZenFaultyPlugins
+	cd $(TSAN_DIR) && ctest --output-on-failure -j $(JOBS)
+
 bench: build
 	$(BUILD_DIR)/bin/ZenBenchmarks --benchmark_counters_tabular=true
 
@@ -52,4 +62,4 @@ install: build
 	$(CMAKE) --install $(BUILD_DIR) --prefix $(PREFIX)
 
 clean:
-	rm -rf $(BUILD_DIR) $(ASAN_DIR)
+	rm -rf $(BUILD_DIR) $(ASAN_DIR) $(TSAN_DIR)

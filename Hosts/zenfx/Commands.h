@@ -31,9 +31,19 @@ struct ProcessOptions {
     std::string metersJson;
 };
 
+struct ValidateOptions {
+    std::vector<std::string> plugins;  // display names or keys
+    bool all = false;
+    int level = 3;  // 1 quick .. 5 longest
+    std::uint32_t seed = 1;
+    bool json = false;
+    std::vector<std::string> checks;  // only checks whose id starts with one of these
+};
+
 int RunList(PluginLibrary& library, bool json);
 int RunInfo(PluginLibrary& library, const InfoOptions& options);
 int RunProcess(PluginLibrary& library, const ProcessOptions& options);
+int RunValidate(PluginLibrary& library, const ValidateOptions& options);
 int RunDemo(const std::string& output, const std::string& format);
 
 }  // namespace zenfx

@@ -1,4 +1,5 @@
 // zenfx list, zenfx info and zenfx demo.
+#include <algorithm>
 #include <cstdio>
 #include <iomanip>
 #include <iostream>
@@ -90,6 +91,9 @@ int RunInfo(PluginLibrary& library, const InfoOptions& options) {
     nlohmann::json row = DescribePlugin(plugin, *instance);
     row["sampleRate"] = options.sampleRate;
     row["latency"] = audio.GetLatency();
+    row["tail"] = audio.GetTailLength();
+    row["blockBased"] = audio.IsBlockBased();
+    row["locksAudioPath"] = audio.LocksAudioPath();
     row["configuredChannels"] = channels;
     nlohmann::json parameters = nlohmann::json::array();
     for (std::uint32_t i = 0; i < audio.GetParameterCount(); ++i) {
@@ -131,11 +135,20 @@ int RunInfo(PluginLibrary& library, const InfoOptions& options) {
               << "  channels   up to " << d.inputChannelLimit << " in, " << d.outputChannelLimit << " out\n"
               << "  list flags " << d.listFlags << "\n"
               << "  latency    " << audio.GetLatency() << " samples at " << options.sampleRate << " Hz\n"
+              << "  tail       " << audio.GetTailLength() << " samples\n"
+              << "  processing " << (audio.IsBlockBased() ? "block-based" : "sample by sample")
+              << (audio.LocksAudioPath() ? ", takes a lock on the audio path" : "") << "\n"
               << "\nParameters:\n";
+    int labelWidth = 18;  // the longest label sets the column
     for (std::uint32_t i = 0; i < audio.GetParameterCount(); ++i) {
         zen::ParameterInfo p;
         audio.GetParameterInfo(i, p);
-        std::printf("  %2u  %-18s %-36s %-34s default %s%s\n", i, p.label.c_str(), p.identifier.c_str(),
+        labelWidth = std::max(labelWidth, static_cast<int>(p.label.size()));
+    }
+    for (std::uint32_t i = 0; i < audio.GetParameterCount(); ++i) {
+        zen::ParameterInfo p;
+        audio.GetParameterInfo(i, p);
+        std::printf("  %2u  %-*s %-36s %-34s default %s%s\n", i, labelWidth, p.label.c_str(), p.identifier.c_str(),
                     DescribeRange(p).c_str(), FormatParameterValue(p, p.defaultValue).c_str(),
                     p.taper == zen::ParameterTaper::Logarithmic ? ", logarithmic" : "");
     }

@@ -76,6 +76,20 @@ int main(int argc, char** argv) {
     processCommand->add_option("--format", process.format, "Sample format: pcm16, pcm24, pcm32, float, double");
     processCommand->add_option("--meters-json", process.metersJson, "Write every plug-in's final meters here");
 
+    zenfx::ValidateOptions validate;
+    CLI::App* validateCommand =
+        app.add_subcommand("validate", "Run the validation battery over plug-ins; non-zero exit on any failure");
+    validateCommand->add_option("PLUGIN", validate.plugins, "Display names or keys, case-insensitive");
+    validateCommand->add_flag("--all", validate.all, "Every audio plug-in of the library");
+    validateCommand->add_option("--level", validate.level, "1 quick .. 5 longest (default 3)")
+        ->check(CLI::Range(1, 5));
+    validateCommand->add_option("--seed", validate.seed, "Seed of the random choices (default 1)");
+    validateCommand->add_option("--check", validate.checks, "Only checks whose name starts with this; repeatable")
+        ->expected(1)
+        ->multi_option_policy(CLI::MultiOptionPolicy::TakeAll)
+        ->allow_extra_args(false);
+    validateCommand->add_flag("--json", validate.json, "Print JSON");
+
     std::string demoOutput, demoFormat;
     CLI::App* demo = app.add_subcommand("demo", "Write the built-in demo material to a file");
     demo->add_option("-o,--output", demoOutput, "Output file")->required();
@@ -95,6 +109,7 @@ int main(int argc, char** argv) {
         zenfx::PluginLibrary library(libraryPath);
         if (*list) return zenfx::RunList(library, listJson);
         if (*infoCommand) return zenfx::RunInfo(library, info);
+        if (*validateCommand) return zenfx::RunValidate(library, validate);
         process.stages = CollectStages(*processCommand, pluginOption, setOption, presetOption);
         process.compensateLatency = !noCompensation;
         return zenfx::RunProcess(library, process);

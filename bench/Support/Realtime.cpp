@@ -18,7 +18,7 @@ void Set(AudioPlugin& plugin, const char* labelOrIdentifier, float value) {
 }
 
 void RunPlugin(benchmark::State& state, const std::string& name, std::uint32_t channels,
-               const std::function<void(AudioPlugin&)>& setup) {
+               const std::function<void(AudioPlugin&)>& setup, double sampleRate) {
     zen::PluginInterface* library = GetZenPluginInterface();
     std::unique_ptr<zen::PluginInstance> instance;
     for (const auto& [key, entry] : library->GetPluginList(zen::kAudioPluginKind))
@@ -29,12 +29,12 @@ void RunPlugin(benchmark::State& state, const std::string& name, std::uint32_t c
         return;
     }
     if (setup) setup(*audio);
-    if (!audio->ConfigureChannels(channels, channels) || !audio->Prepare(static_cast<float>(kSampleRate), kBlock)) {
+    if (!audio->ConfigureChannels(channels, channels) || !audio->Prepare(static_cast<float>(sampleRate), kBlock)) {
         state.SkipWithError("layout or preparation refused");
         return;
     }
     // A second of noise, walked block by block, so the input keeps changing.
-    const std::size_t frames = static_cast<std::size_t>(kSampleRate);
+    const std::size_t frames = static_cast<std::size_t>(sampleRate);
     std::vector<std::vector<float>> source(channels, std::vector<float>(frames));
     std::uint32_t seed = 12345;
     for (auto& channel : source)
@@ -54,7 +54,7 @@ void RunPlugin(benchmark::State& state, const std::string& name, std::uint32_t c
         audio->Process(pointers.data(), kBlock);
         benchmark::ClobberMemory();
     }
-    ReportRealtime(state, kBlock);
+    ReportRealtime(state, kBlock, sampleRate);
 }
 
 }  // namespace zenbench

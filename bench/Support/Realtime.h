@@ -16,10 +16,11 @@ constexpr double kSampleRate = 48000.0;
 constexpr std::uint32_t kBlock = 512;
 
 // Creates the registered plug-in `name`, lets `setup` set parameters,
-// prepares it for `channels` at 48 kHz in 512-frame blocks and processes
-// full-scale noise for as long as the benchmark runs. Reports "realtime".
+// prepares it for `channels` at `sampleRate` (48 kHz unless given) in
+// 512-frame blocks and processes full-scale noise for as long as the
+// benchmark runs. Reports "realtime".
 void RunPlugin(benchmark::State& state, const std::string& name, std::uint32_t channels,
-               const std::function<void(AudioPlugin&)>& setup = {});
+               const std::function<void(AudioPlugin&)>& setup = {}, double sampleRate = kSampleRate);
 
 // Sets a parameter by label or identifier.
 void Set(AudioPlugin& plugin, const char* labelOrIdentifier, float value);

@@ -28,8 +28,9 @@ public:
               m_a(a),
               m_b(b) {}
         ~Cursor() {
-            // Snap once settled, so that state never creeps toward denormals.
-            if (std::fabs(m_current - m_target) <= 1e-7 * std::fabs(m_target) + 1e-30) m_current = m_target;
+            // Snap only far below float resolution: a ramp toward 0 never
+            // reaches denormals, and no block split can change what is heard.
+            if (std::fabs(m_current - m_target) <= kSnapDistance) m_current = m_target;
             m_element.current.store(m_current, std::memory_order_relaxed);
         }
         Cursor(const Cursor&) = delete;
@@ -41,6 +42,7 @@ public:
         }
 
     private:
+        static constexpr double kSnapDistance = 1e-30;
         Element& m_element;
         double m_current;
         const double m_target;

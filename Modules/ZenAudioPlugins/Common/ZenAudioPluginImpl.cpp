@@ -107,6 +107,12 @@ bool ZenAudioPluginImpl::LoadPreset(const std::string& name) {
 
 void* ZenAudioPluginImpl::CreateEditor(void*) { return nullptr; }
 
+bool ZenAudioPluginImpl::ApplyNeutralSetting() {
+    for (std::uint32_t i = 0; i < m_parameters.GetCount(); ++i)
+        SetParameter(i, m_parameters[i].Definition().defaultValue);
+    return true;
+}
+
 std::int32_t ZenAudioPluginImpl::FindParameter(const char* identifierOrLabel) const {
     return identifierOrLabel != nullptr ? m_parameters.Find(QString::fromUtf8(identifierOrLabel)) : -1;
 }

@@ -81,6 +81,12 @@ public:
     std::uint32_t GetLatency() const override { return m_latency.load(std::memory_order_acquire); }
     void SetBypass(bool bypassed) override { m_bypass.store(bypassed, std::memory_order_release); }
     bool IsBypassed() const override { return m_bypass.load(std::memory_order_acquire); }
+    // Defaults for a plug-in that works sample by sample without a tail or a
+    // lock, and whose default settings pass audio unchanged.
+    std::uint32_t GetTailLength() const override { return 0; }
+    bool IsBlockBased() const override { return false; }
+    bool LocksAudioPath() const override { return false; }
+    bool ApplyNeutralSetting() override;
     std::uint32_t GetMeterCount() const override { return 0; }
     bool GetMeterInfo(std::uint32_t, zen::MeterInfo&) const override { return false; }
     float GetMeter(std::uint32_t) const override { return 0.0f; }

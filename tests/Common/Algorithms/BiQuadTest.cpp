@@ -209,3 +209,12 @@ TEST(BiQuad, DecayingStateDoesNotTurnDenormal) {
     filter->ProcessChannel(0, x.data(), x.size());
     for (std::size_t n = x.size() - 1000; n < x.size(); ++n) EXPECT_TRUE(x[n] == 0.0f || std::isnormal(x[n])) << n;
 }
+
+TEST(BiQuad, RecoversFromNonFiniteInput) {
+    auto filter = Make(48000.0f, BiQuad::kBell, 6.0f, 1000.0f, 1.0f);
+    std::vector<float> poisoned = {1.0f, NAN, INFINITY, 0.5f};
+    filter->ProcessChannel(0, poisoned.data(), poisoned.size());
+    std::vector<float> clean = zentest::Noise(512);
+    filter->ProcessChannel(0, clean.data(), clean.size());
+    for (float v : clean) ASSERT_TRUE(std::isfinite(v));
+}

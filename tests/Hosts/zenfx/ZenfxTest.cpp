@@ -67,6 +67,9 @@ TEST(ZenfxInfo, FindsPluginsByNameOrKeyIgnoringCase) {
         ASSERT_EQ(result.exitCode, 0) << name << result.err;
         const auto info = nlohmann::json::parse(result.out);
         EXPECT_EQ(info["latency"], 0);
+        EXPECT_EQ(info["tail"], 0);
+        EXPECT_EQ(info["blockBased"], false);
+        EXPECT_EQ(info["locksAudioPath"], false);
         ASSERT_EQ(info["parameters"].size(), 3u);
         EXPECT_EQ(info["parameters"][0]["identifier"], "ZenSoftClipper::THRESHOLD");
         EXPECT_EQ(info["parameters"][0]["unit"], "dB");

@@ -155,3 +155,27 @@ TEST(ZenSoftClipper, NonFiniteInputDoesNotPoisonLaterSamples) {
     EXPECT_NEAR(out[2], -1.0f / std::tanh(1.0f), 1e-5);
     EXPECT_EQ(out[3], 0.5f);
 }
+
+TEST(ZenSoftClipper, SampleBySampleWithoutTailLockOrLatency) {
+    PluginHarness plugin = Clipper(12.0f, 0.0f, -6.0f, 2);
+    AudioPlugin& audio = plugin.Audio();
+    EXPECT_EQ(audio.GetTailLength(), 0u);
+    EXPECT_FALSE(audio.IsBlockBased());
+    EXPECT_FALSE(audio.LocksAudioPath());
+    EXPECT_EQ(audio.GetLatency(), 0u);
+}
+
+TEST(ZenSoftClipper, NeutralSettingPassesMinusSixDecibelsUnchanged) {
+    PluginHarness plugin("Soft Clipper");
+    plugin.Set("Threshold", 12.0f);
+    plugin.Set("Shape", 0.2f);
+    plugin.Set("Output Level", -10.0f);
+    ASSERT_TRUE(plugin.Audio().ApplyNeutralSetting());
+    EXPECT_EQ(plugin.Get("Threshold"), 0.0f);
+    EXPECT_EQ(plugin.Get("Shape"), 1.0f);
+    EXPECT_EQ(plugin.Get("Output Level"), 0.0f);
+    plugin.Prepare(1);
+    const auto input = zentest::Sine(997.0, 48000.0, 4800, 0.5);
+    const auto output = plugin.Run(input);
+    for (std::size_t i = 0; i < input.size(); ++i) ASSERT_EQ(output[0][i], input[i]) << "at " << i;
+}

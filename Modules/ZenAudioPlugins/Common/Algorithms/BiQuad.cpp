@@ -219,6 +219,8 @@ void BiQuad::ProcessRun(State& state, const float* in, float* out, std::uint64_t
         w1 = (w + kDenormalGuard) - kDenormalGuard;
         out[i] = static_cast<float>(y);
     }
+    // A non-finite input would otherwise ring in the state forever.
+    if (!std::isfinite(w1) || !std::isfinite(w2)) w1 = w2 = 0.0;
     state.w1 = w1;
     state.w2 = w2;
 }

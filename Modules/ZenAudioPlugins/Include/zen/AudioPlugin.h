@@ -9,8 +9,10 @@
 // Repeat 2 (and 1) after a change of rate, block size or layout; destroy the
 // instance through zen::PluginInstance.
 //
-// Real-time promises: Process never allocates, locks, blocks, logs or throws.
-// SetParameter, GetParameter, SetBypass, GetLatency and GetMeter are lock-free.
+// Real-time promises: Process never allocates, locks, blocks, logs or throws
+// (a plug-in whose design needs a lock says so through LocksAudioPath).
+// SetParameter, GetParameter, SetBypass, GetLatency, GetMeter and the design
+// queries (GetTailLength, IsBlockBased, LocksAudioPath) are lock-free.
 #pragma once
 
 #include <cstdint>
@@ -50,6 +52,30 @@ public:
     // Delay of the output against the input, in samples, at the prepared rate.
     // Bypass does not change it.
     virtual std::uint32_t GetLatency() const = 0;
+
+    // Samples the output may go on sounding after the input falls silent,
+    // counted after the latency (a reverb's decay, an echo's repeats): once
+    // latency + tail samples of silence have gone in, the output stays below
+    // -100 dBFS. 0 when silence in gives silence out. At the prepared rate and
+    // the current settings. Any thread.
+    virtual std::uint32_t GetTailLength() const = 0;
+
+    // True when the output depends on how the input is split into Process
+    // calls, because the design works in blocks of its own (an FFT frame, a
+    // resampled engine) at the prepared rate. Otherwise any split of the same
+    // signal gives the same output. Any thread.
+    virtual bool IsBlockBased() const = 0;
+
+    // True when the design takes a lock on the audio path (a shared lock that
+    // guards an engine while it is rebuilt), so Process may wait briefly for
+    // another thread. Any thread.
+    virtual bool LocksAudioPath() const = 0;
+
+    // Sets the parameters to a setting that passes a signal at -6 dBFS
+    // unchanged but for the latency (no gain, a dry mix, no shift), so that a
+    // host can measure the delay with an impulse. False, changing nothing,
+    // when the plug-in has no such setting. UI thread.
+    virtual bool ApplyNeutralSetting() = 0;
 
     // While bypassed the input passes unchanged, delayed by the latency, with
     // a short cross-fade at each switch. Any thread.

@@ -1,0 +1,9 @@
+// Lpf16 in 128-bit fused vectors.
+#include "Algorithms/simd/m128/VecM128.h"
+#include "Algorithms/simd/VectorBodies.h"
+
+namespace ora::numeric {
+
+Lpf16Impl* MakeLpf16_m128_fma() { return new simd::Lpf16Vec<VecM128Fma>(); }
+
+}  // namespace ora::numeric

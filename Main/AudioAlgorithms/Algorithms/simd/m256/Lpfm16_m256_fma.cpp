@@ -1,0 +1,9 @@
+// Lpfm16 in 256-bit fused vectors.
+#include "Algorithms/simd/m256/VecM256.h"
+#include "Algorithms/simd/VectorBodies.h"
+
+namespace ora::numeric {
+
+Lpfm16Impl* MakeLpfm16_m256_fma() { return new simd::Lpfm16Vec<VecM256Fma>(); }
+
+}  // namespace ora::numeric

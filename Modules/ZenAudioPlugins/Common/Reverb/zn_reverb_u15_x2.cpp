@@ -1,0 +1,15 @@
+#include "zn_reverb_u15_x2.h"
+
+#include "Common/ZenAssert.h"
+
+namespace zen::reverb {
+
+bool zn_reverb_u15_x2::Process(float* const* channels, std::uint64_t nsamples) {
+    if ((nsamples & 1) != 0) {
+        ZEN_ASSERT((nsamples & 1) == 0, "(nsamples & 1) == 0");
+        return false;
+    }
+    return ProcessResampled(channels, static_cast<std::size_t>(nsamples));
+}
+
+}  // namespace zen::reverb

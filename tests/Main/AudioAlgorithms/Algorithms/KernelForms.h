@@ -1,0 +1,97 @@
+// The kernel forms of the algorithm library, each forced in turn, for tests
+// that compare every form with the reference form. Forms this processor
+// cannot run are skipped, not failed.
+#pragma once
+
+#include <gtest/gtest.h>
+
+#include <cstdint>
+#include <random>
+#include <string>
+#include <vector>
+
+#include "System/DispatchSettings.h"
+
+namespace kerneltest {
+
+struct Form {
+    ora::system::KernelForm form;
+    ora::system::InstructionLevel level;
+    bool fma;
+};
+
+inline const std::vector<Form>& AllForms() {
+    using ora::system::InstructionLevel;
+    using ora::system::KernelForm;
+    static const std::vector<Form> forms = {
+        {KernelForm::Ref, InstructionLevel::None, false},
+        {KernelForm::M128, InstructionLevel::SSE2, false},
+        {KernelForm::M128Fma, InstructionLevel::SSE42, true},
+        {KernelForm::M256, InstructionLevel::AVX, false},
+        {KernelForm::M256Fma, InstructionLevel::AVX, true},
+    };
+    return forms;
+}
+
+inline bool Runnable(const Form& f) {
+    const auto& cpu = ora::system::DispatchSettings::Instance().Detected();
+    if (f.level >= ora::system::InstructionLevel::AVX && !cpu.osAvx) return false;
+    if (f.fma && !(cpu.fma && cpu.osAvx)) return false;
+    return true;
+}
+
+inline bool Fused(ora::system::KernelForm form) {
+    return form == ora::system::KernelForm::M128Fma || form == ora::system::KernelForm::M256Fma;
+}
+
+inline std::string Name(const testing::TestParamInfo<Form>& info) {
+    return ora::system::KernelFormName(info.param.form);
+}
+
+// Lengths that catch tails and vector-width mistakes.
+inline const std::vector<std::size_t>& AwkwardLengths() {
+    static const std::vector<std::size_t> lengths = {0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15, 16, 17, 65, 999};
+    return lengths;
+}
+
+inline std::vector<float> RandomFloats(std::size_t n, std::uint32_t seed, float amplitude = 1.0f) {
+    std::mt19937 rng(seed);
+    std::uniform_real_distribution<float> dist(-amplitude, amplitude);
+    std::vector<float> v(n);
+    for (float& x : v) x = dist(rng);
+    return v;
+}
+
+// A buffer with a guard zone after `size` floats, starting one float past a
+// 64-byte boundary so that no form relies on alignment.
+class GuardedBuffer {
+public:
+    static constexpr std::size_t kGuard = 32;
+    static constexpr float kSentinel = 12345.0f;
+    explicit GuardedBuffer(std::size_t size) : m_storage(size + kGuard + 17, kSentinel), m_size(size) {
+        const auto address = reinterpret_cast<std::uintptr_t>(m_storage.data());
+        m_offset = ((64 - address % 64) % 64) / sizeof(float) + 1;
+        std::fill(data(), data() + size, 0.0f);
+    }
+    float* data() { return m_storage.data() + m_offset; }
+    std::vector<float> Values() { return std::vector<float>(data(), data() + m_size); }
+    bool GuardIntact() {
+        for (std::size_t i = 0; i < kGuard; ++i)
+            if (data()[m_size + i] != kSentinel) return false;
+        return true;
+    }
+
+private:
+    std::vector<float> m_storage;
+    std::size_t m_size;
+    std::size_t m_offset = 0;
+};
+
+class FormTest : public testing::TestWithParam<Form> {
+protected:
+    void SetUp() override {
+        if (!Runnable(GetParam())) GTEST_SKIP() << "this processor cannot run the form";
+    }
+};
+
+}  // namespace kerneltest

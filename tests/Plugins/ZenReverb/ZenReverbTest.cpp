@@ -1,0 +1,248 @@
+// "Reverb" through the host interface: identity and parameters, their way
+// into the engine, the room's linked shape, the mix law at every rate,
+// layouts, click-free changes while playing, and re-preparation.
+#include <gtest/gtest.h>
+
+#include <cmath>
+
+#include "Plugins/ZenReverb/ZenReverb.h"
+#include "Support/PluginHarness.h"
+#include "Support/Signals.h"
+
+using zen::reverb::zn_reverb;
+using zentest::PluginHarness;
+
+namespace {
+
+const ZenReverb& Impl(PluginHarness& plugin) { return dynamic_cast<const ZenReverb&>(plugin.Instance()); }
+
+// Largest second difference: a click is broadband, a low sine has almost none.
+float LargestCurvature(const std::vector<float>& x, std::size_t from, std::size_t to) {
+    float largest = 0.0f;
+    for (std::size_t i = from + 2; i < to; ++i) largest = std::max(largest, std::fabs(x[i] - 2.0f * x[i - 1] + x[i - 2]));
+    return largest;
+}
+
+}  // namespace
+
+TEST(ZenReverb, DescriptorAndTheTwentyTwoParameters) {
+    PluginHarness plugin("Reverb");
+    const zen::PluginDescriptor* d = plugin.Instance().GetDescriptor();
+    EXPECT_STREQ(d->name, "Reverb");
+    EXPECT_EQ(d->code, 1517179490);
+    EXPECT_EQ(zen::PluginCodeToString(d->code), "ZnRb");
+    EXPECT_EQ(d->version, 0.1);
+    EXPECT_EQ(d->inputChannelLimit, 8u);
+    EXPECT_EQ(d->outputChannelLimit, 8u);
+    EXPECT_STREQ(d->className, "ZenReverb");
+    EXPECT_EQ(d->listFlags, 0u);
+    const char* names[] = {"Room Height", "Room Length", "Room Width", "Room Size", "Room Ratio", "Pre-Delay",
+                           "T@-60dB", "Distance", "Brightness", "Modulation", "Early Refl. Low Freq",
+                           "Early Refl. High Freq", "Early Refl. Low Gain", "Early Refl. High Gain",
+                           "Late Rev. Low Freq", "Late Rev. High Freq", "Late Rev. Low Gain", "Late Rev. High Gain",
+                           "Dry/Wet", "Direct Gain", "Early Refl. Gain", "Late Rev. Gain"};
+    const char* units[] = {"m", "m", "m", "m²", "", "ms", "s", "m", "%", "", "Hz", "Hz", "dB", "dB",
+                           "Hz", "Hz", "dB", "dB", "%", "dB", "dB", "dB"};
+    ASSERT_EQ(plugin.Audio().GetParameterCount(), 22u);
+    for (std::uint32_t i = 0; i < 22; ++i) {
+        zen::ParameterInfo info;
+        ASSERT_TRUE(plugin.Audio().GetParameterInfo(i, info));
+        EXPECT_EQ(info.label, names[i]) << i;
+        EXPECT_EQ(info.unit, units[i]) << i;
+        EXPECT_EQ(info.identifier.rfind("ZenReverb::", 0), 0u) << info.identifier;
+        EXPECT_LE(info.minimum, info.defaultValue) << i;
+        EXPECT_GE(info.maximum, info.defaultValue) << i;
+        // The room never reaches the size that would stall the engine.
+        if (i <= ZenReverb::kRoomWidth) {
+            EXPECT_GT(info.minimum, zn_reverb::kMinDimension) << i;
+        }
+        if (info.unit == "Hz") {
+            EXPECT_EQ(info.taper, zen::ParameterTaper::Logarithmic) << i;
+        }
+    }
+    EXPECT_FALSE(plugin.Audio().SetParameter(22, 1.0f));
+}
+
+TEST(ZenReverb, ParametersReachTheEngineInItsUnits) {
+    PluginHarness plugin("Reverb");
+    plugin.Prepare(2);
+    plugin.Set("Pre-Delay", 20.0f);
+    plugin.Set("Brightness", 25.0f);
+    plugin.Set("Dry/Wet", 100.0f);
+    plugin.Set("Late Rev. Gain", -6.0f);
+    plugin.Set("Early Refl. High Freq", 5000.0f);
+    plugin.Set("T@-60dB", 2.5f);
+    plugin.Run(std::vector<float>(64, 0.0f), 2);  // applied before the block
+    const zn_reverb& engine = *Impl(plugin).Engine();
+    EXPECT_FLOAT_EQ(engine.Get(zn_reverb::kPreDelay), 0.02f);
+    EXPECT_FLOAT_EQ(engine.Get(zn_reverb::kHighDecayRatio), 0.25f);
+    EXPECT_FLOAT_EQ(engine.Get(zn_reverb::kBalance), 1.0f);
+    EXPECT_NEAR(engine.Get(zn_reverb::kLateGain), 0.501187f, 1e-6f);
+    EXPECT_FLOAT_EQ(engine.Get(zn_reverb::kEq1HighFrequency), 5000.0f);  // early: EQ 1
+    EXPECT_FLOAT_EQ(engine.Get(zn_reverb::kEq2HighFrequency), 10000.0f);
+    EXPECT_FLOAT_EQ(engine.Get(zn_reverb::kT60), 2.5f);
+    EXPECT_EQ(engine.Dirty(), 0);
+}
+
+TEST(ZenReverb, LengthWidthAreaAndRatioMakeOneRoomInAnyOrder) {
+    auto floor = [](const std::vector<std::pair<const char*, float>>& settings) {
+        PluginHarness plugin("Reverb");
+        plugin.Prepare(1);
+        for (const auto& [name, value] : settings) plugin.Set(name, value);
+        plugin.Run(std::vector<float>(16, 0.0f));
+        const zn_reverb& engine = *Impl(plugin).Engine();
+        return std::make_pair(engine.Get(zn_reverb::kRoomLength), engine.Get(zn_reverb::kRoomWidth));
+    };
+    // Agreeing descriptions: exactly that room, whatever the order.
+    const auto agreed = floor({{"Room Length", 10.0f}, {"Room Width", 40.0f}, {"Room Size", 400.0f}, {"Room Ratio", 4.0f}});
+    EXPECT_NEAR(agreed.first, 10.0f, 1e-4f);
+    EXPECT_NEAR(agreed.second, 40.0f, 1e-4f);
+    EXPECT_EQ(floor({{"Room Ratio", 4.0f}, {"Room Size", 400.0f}, {"Room Width", 40.0f}, {"Room Length", 10.0f}}), agreed);
+    const auto defaults = floor({});
+    EXPECT_NEAR(defaults.first, 12.430144f, 1e-4f);
+    EXPECT_NEAR(defaults.second, 20.112396f, 1e-4f);
+    // A larger area alone: a larger room of the same shape.
+    const auto larger = floor({{"Room Size", 1000.0f}});
+    EXPECT_NEAR(larger.first * larger.second, std::sqrt(250.0f * 1000.0f), 0.5f);
+    EXPECT_NEAR(larger.second / larger.first, 1.618034f, 1e-4f);
+    // A parameter never writes another.
+    PluginHarness plugin("Reverb");
+    plugin.Set("Room Size", 1000.0f);
+    EXPECT_NEAR(plugin.Get("Room Length"), 12.430144f, 1e-5f);
+    // The extremes stay inside the room the lines were sized for.
+    const auto extreme = floor({{"Room Width", 100.0f}, {"Room Size", 10000.0f}, {"Room Ratio", 100.0f}});
+    EXPECT_LE(extreme.second, ZenReverb::kMaxRoomLength);
+    EXPECT_GE(extreme.first, ZenReverb::kMinRoomDimension);
+}
+
+TEST(ZenReverb, DryWetZeroPassesTheDrySignalUnchangedAtEveryRate) {
+    for (float rate : {44100.0f, 48000.0f, 96000.0f, 192000.0f}) {
+        PluginHarness plugin("Reverb");
+        plugin.Set("Dry/Wet", 0.0f);
+        plugin.Prepare(2, rate, 512);
+        zentest::Channels io = {zentest::Noise(5000, 0.8, 1), zentest::Noise(5000, 0.8, 2)};
+        const auto input = io;
+        plugin.Process(io, 333);
+        EXPECT_EQ(io, input) << rate;
+        EXPECT_EQ(plugin.Audio().GetLatency(), 0u);
+    }
+}
+
+TEST(ZenReverb, FullyWetHasNoDirectSoundAndLaterReflectionsAndTail) {
+    for (float rate : {48000.0f, 96000.0f}) {
+        PluginHarness plugin("Reverb");
+        plugin.Set("Dry/Wet", 100.0f);
+        plugin.Prepare(1, rate, 512);
+        const auto out = plugin.Run(zentest::Impulse(static_cast<std::size_t>(rate)), 1, 256)[0];
+        // The first reflection is 0.1 m or more behind the direct sound.
+        const auto quiet = static_cast<std::size_t>(0.1 / 340.0 * rate);
+        EXPECT_LT(zentest::Peak(out, 0, quiet), 1e-4f) << rate;
+        EXPECT_GT(zentest::Peak(out), 0.02f) << rate;
+        EXPECT_GT(zentest::Rms(out, static_cast<std::size_t>(0.3 * rate), static_cast<std::size_t>(0.4 * rate)), 1e-4)
+            << rate;  // the tail is still there
+    }
+}
+
+TEST(ZenReverb, PreDelayAloneLeavesTheLaneLengthsAlone) {
+    PluginHarness plugin("Reverb");
+    plugin.Prepare(2);
+    plugin.Run(std::vector<float>(64, 0.0f), 2);
+    const zn_reverb& engine = *Impl(plugin).Engine();
+    const auto lengths = engine.Runs(zn_reverb::kStepLaneLengths);
+    const auto reflections = engine.Runs(zn_reverb::kStepReflections);
+    plugin.Set("Pre-Delay", 35.0f);
+    plugin.Run(std::vector<float>(64, 0.0f), 2);
+    EXPECT_EQ(engine.Runs(zn_reverb::kStepLaneLengths), lengths);
+    EXPECT_EQ(engine.Runs(zn_reverb::kStepReflections), reflections + 1);
+    EXPECT_EQ(engine.Param().reflections.delays(0) - Impl(plugin).Processor()->Reflections().Delay(0), 0u);
+}
+
+TEST(ZenReverb, LayoutsFromMonoToEightChannels) {
+    for (std::uint32_t channels : {1u, 2u, 5u, 8u}) {
+        PluginHarness plugin("Reverb");
+        plugin.Set("Dry/Wet", 100.0f);
+        plugin.Prepare(channels);
+        const auto out = plugin.Run(zentest::Impulse(24000), channels, 512);
+        for (std::uint32_t c = 0; c < channels; ++c) EXPECT_GT(zentest::Rms(out[c], 4800, 14400), 1e-4) << channels;
+        if (channels > 1) {
+            EXPECT_NE(out[0], out[1]);  // every channel hears its own room
+        }
+    }
+    PluginHarness plugin("Reverb");
+    EXPECT_FALSE(plugin.Audio().ConfigureChannels(9, 9));
+    EXPECT_FALSE(plugin.Audio().ConfigureChannels(2, 1));
+}
+
+TEST(ZenReverb, ChangesWhilePlayingDoNotClick) {
+    struct Change {
+        const char* parameter;
+        float value;
+    } changes[] = {
+        {"Room Width", 30.0f},   {"Room Size", 120.0f},         {"Pre-Delay", 60.0f},
+        {"Distance", 1.0f},      {"T@-60dB", 6.0f},             {"Brightness", 100.0f},
+        {"Modulation", 10.0f},   {"Early Refl. Low Gain", 12.0f}, {"Late Rev. Low Gain", -18.0f},
+        {"Late Rev. Low Freq", 80.0f}, {"Dry/Wet", 30.0f},      {"Direct Gain", -20.0f},
+        {"Early Refl. Gain", 6.0f}, {"Late Rev. Gain", -12.0f}, {"T@-60dB", 0.3f},
+    };
+    PluginHarness plugin("Reverb");
+    plugin.Set("Dry/Wet", 100.0f);
+    plugin.Prepare(1);
+    const std::size_t part = 12000;
+    plugin.Run(zentest::Sine(150.0, 48000.0, 48000, 0.5), 1, 512);
+    double phase = 48000.0;
+    for (const Change& change : changes) {
+        auto before = plugin.Run(zentest::Sine(150.0, 48000.0, part, 0.5, 2.0 * zentest::kPi * 150.0 * phase / 48000.0), 1, 512)[0];
+        phase += part;
+        plugin.Set(change.parameter, change.value);
+        auto after = plugin.Run(zentest::Sine(150.0, 48000.0, part, 0.5, 2.0 * zentest::kPi * 150.0 * phase / 48000.0), 1, 512)[0];
+        phase += part;
+        const float usual = LargestCurvature(before, 0, part);
+        const float worst = LargestCurvature(after, 0, part);
+        EXPECT_LT(worst, 3.0f * usual + 2e-3f) << change.parameter << " -> " << change.value << ": curvature "
+                                                << worst << " after, " << usual << " before";
+    }
+}
+
+TEST(ZenReverb, NonFiniteInputDoesNotPoisonTheRoom) {
+    PluginHarness plugin("Reverb");
+    plugin.Set("T@-60dB", 20.0f);
+    plugin.Prepare(2);
+    zentest::Channels io = {zentest::Noise(2048, 0.5, 1), zentest::Noise(2048, 0.5, 2)};
+    io[0][100] = NAN;
+    io[1][200] = INFINITY;
+    io[0][300] = -1e30f;
+    plugin.Process(io, 512);
+    const auto later = plugin.Run(zentest::Noise(48000, 0.5, 3), 2, 512);
+    for (const auto& channel : later) {
+        for (float v : channel) ASSERT_TRUE(std::isfinite(v));
+        EXPECT_LT(zentest::Rms(channel, 36000), zentest::Rms(channel, 0, 12000));  // dying away, not growing
+    }
+}
+
+TEST(ZenReverb, ANewRateRebuildsTheEngineForItsOwnRate) {
+    PluginHarness plugin("Reverb");
+    plugin.Set("Room Length", 9.0f);
+    plugin.Prepare(2, 48000.0f);
+    plugin.Run(std::vector<float>(64, 0.0f), 2);
+    const auto lengthAt48 = Impl(plugin).Engine()->Param().tail.core.lengths(0);
+    plugin.Prepare(2, 96000.0f);
+    plugin.Run(std::vector<float>(64, 0.0f), 2);
+    EXPECT_EQ(Impl(plugin).Processor()->Factor(), 2u);
+    EXPECT_EQ(Impl(plugin).Engine()->SampleRate(), 48000.0f);
+    EXPECT_EQ(Impl(plugin).Engine()->Param().tail.core.lengths(0), lengthAt48);  // the settings carried over
+    plugin.Prepare(2, 44100.0f);
+    plugin.Run(std::vector<float>(64, 0.0f), 2);
+    EXPECT_EQ(Impl(plugin).Processor()->Factor(), 1u);
+    EXPECT_EQ(Impl(plugin).Engine()->SampleRate(), 44100.0f);
+}
+
+TEST(ZenReverb, SameOutputInAnyBlockSplitAtHighRates) {
+    const auto input = zentest::Noise(7000, 0.5, 3);
+    auto run = [&](std::size_t block) {
+        PluginHarness plugin("Reverb");
+        plugin.Prepare(1, 192000.0f, 512);
+        return plugin.Run(input, 1, block)[0];
+    };
+    const auto whole = run(512);
+    for (std::size_t block : {1u, 3u, 130u}) EXPECT_EQ(run(block), whole) << block;
+}
