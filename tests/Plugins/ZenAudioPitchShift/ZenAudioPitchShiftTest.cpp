@@ -5,6 +5,7 @@
 
 #include <cmath>
 #include <complex>
+#include <limits>
 
 #include "Plugins/ZenAudioPitchShift/ZenAudioPitchShift.h"
 #include "Support/AssertionRecorder.h"
@@ -179,4 +180,19 @@ TEST(ZenAudioPitchShift, LifeCycleAndResetKeepTheHostsSettings) {
     io = {x};
     plugin.Process(io, 256);  // without an engine the block passes unchanged
     EXPECT_EQ(io[0], x);
+}
+
+TEST(ZenAudioPitchShift, NonFiniteInputIsSilenceAndTheTailFollowsTheRatio) {
+    PluginHarness plugin("Pitch");
+    EXPECT_EQ(plugin.Audio().GetTailLength(), 4096u);  // half a frame, and half a frame read at 1
+    plugin.Set("Semitones", -12.0f);
+    EXPECT_EQ(plugin.Audio().GetTailLength(), 2048u + 4096u);
+    plugin.Prepare(1);
+    auto x = zentest::Sine(300.0, kRate, 20000, 0.5);
+    x[3000] = std::numeric_limits<float>::quiet_NaN();
+    x[3001] = std::numeric_limits<float>::infinity();
+    zentest::Channels io = {x};
+    plugin.Process(io, 512);
+    for (float y : io[0]) ASSERT_TRUE(std::isfinite(y));
+    EXPECT_GT(zentest::Peak(io[0], 15000), 0.3f);
 }

@@ -97,6 +97,20 @@ void ZenAudioPitchShift::PrepareProcessing(float, std::uint32_t) {
         m_pEngine->Reset();
         SetLatency(static_cast<std::uint32_t>(m_pEngine->Latency()));
     }
+    m_settle = true;
+}
+
+std::uint32_t ZenAudioPitchShift::GetTailLength() const {
+    const zen::ParameterTable& p = Parameters();
+    const double ratio = ora::pitchshift::Engine::Ratio(static_cast<std::int32_t>(std::lround(p[kCoarse].GetValue())),
+                                                        p[kFine].GetValue());
+    const double half = static_cast<double>(kFrameLength) / 2.0;
+    return static_cast<std::uint32_t>(half + std::ceil(half / ratio));
+}
+
+bool ZenAudioPitchShift::ApplyNeutralSetting() {
+    ZenAudioPluginImpl::ApplyNeutralSetting();
+    return SetParameter(kDryWet, 0.0f);
 }
 
 ora::pitchshift::Engine::Settings ZenAudioPitchShift::WantedSettings() const {
@@ -119,10 +133,14 @@ void ZenAudioPitchShift::ApplyChanges(boost::upgrade_lock<boost::upgrade_mutex>&
     const int maxPeak = static_cast<int>(std::lround(p[kMaxPeak].GetValue()));
     const float log10Tol = p[kLog10Tol].GetValue();
     const bool tuning = joint != m_joint || log10Eps != m_log10Eps || maxPeak != m_maxPeak || log10Tol != m_log10Tol;
-    if (bits == 0 && m_pEngine->Pending() == 0 && !tuning) return;
+    if (bits == 0 && m_pEngine->Pending() == 0 && !tuning && !m_settle) return;
 
     boost::upgrade_to_unique_lock<boost::upgrade_mutex> exclusive(lock);
     m_pEngine->Apply(wanted, bits);
+    if (m_settle) {
+        m_pEngine->Reset();  // nothing was processed since the last reset
+        m_settle = false;
+    }
     if (tuning) {
         m_joint = joint;
         m_log10Eps = log10Eps;
@@ -151,7 +169,13 @@ void ZenAudioPitchShift::ProcessBlock(float* const* channels, std::uint32_t chan
     }
     for (std::uint32_t done = 0; done < frames;) {
         const std::uint32_t count = std::min(frames - done, kWorkFrames);
-        for (std::uint32_t c = 0; c < channelCount; ++c) std::copy_n(channels[c] + done, count, in[c]);
+        // Non-finite input becomes silence: one NaN would otherwise stay in
+        // the spectra and the phases for good.
+        for (std::uint32_t c = 0; c < channelCount; ++c)
+            for (std::uint32_t i = 0; i < count; ++i) {
+                const float x = channels[c][done + i];
+                in[c][i] = std::isfinite(x) ? x : 0.0f;
+            }
         m_pEngine->Process(in, out, count);
         for (std::uint32_t c = 0; c < channelCount; ++c) std::copy_n(out[c], count, channels[c] + done);
         done += count;
@@ -164,6 +188,7 @@ void ZenAudioPitchShift::ResetProcessing() {
     // parameters with them and applies whatever differs.
     m_maxPeak = 50;
     m_log10Tol = -6.0f;
+    m_settle = true;
     if (!m_pEngine) return;
     m_pEngine->ForgetSettings();
     m_pEngine->SetMaxPeak(m_maxPeak);

@@ -53,6 +53,13 @@ public:
     void ShutdownPlugin() override;
     bool HasEngine() const;
 
+    // The synthesis window reaches half a frame past its centre, stretched
+    // by the pitch ratio on reading: N/2 + N/(2 ratio) at the current settings.
+    std::uint32_t GetTailLength() const override;
+    bool LocksAudioPath() const override { return true; }
+    // Defaults with a dry mix: the input passes exactly, delayed.
+    bool ApplyNeutralSetting() override;
+
 protected:
     bool AcceptsChannelConfiguration(std::uint32_t inputs, std::uint32_t outputs) const override;
     void PrepareProcessing(float sampleRate, std::uint32_t maxBlockSize) override;
@@ -65,6 +72,8 @@ private:
     bool BuildEngine();
     ora::pitchshift::Engine::Settings WantedSettings() const;
     // Applies changed settings; the caller holds the lock at least upgradable.
+    // The first application after a preparation or reset also settles the
+    // engine there, so it starts at its settings instead of gliding to them.
     void ApplyChanges(boost::upgrade_lock<boost::upgrade_mutex>& lock) noexcept;
 
     mutable boost::upgrade_mutex m_engineLock;
@@ -72,6 +81,8 @@ private:
     std::unique_ptr<ora::pitchshift::EngineParam> m_param;
     std::vector<float> m_inWork;   // channel-major, kWorkFrames per channel
     std::vector<float> m_outWork;
+
+    bool m_settle = true;  // audio thread, or under the exclusive lock
 
     // Reconstruction settings last handed to the engine (audio thread).
     bool m_joint = true;
