@@ -43,3 +43,13 @@ function(zen_add_resource_trees target resources_dir)
 endfunction()
 
 set(ZEN_CMAKE_DIR ${CMAKE_CURRENT_LIST_DIR} CACHE INTERNAL "")
+
+# Ninja's incremental moc step does not notice sources that a re-glob adds;
+# a file listing them, rewritten only when the list changes, makes it rerun.
+function(zen_automoc_follows_sources target)
+  get_target_property(sources ${target} SOURCES)
+  string(REPLACE ";" "\n" listing "${sources}")
+  set(list_file ${CMAKE_CURRENT_BINARY_DIR}/${target}_sources.txt)
+  file(CONFIGURE OUTPUT ${list_file} CONTENT "${listing}\n")
+  set_property(TARGET ${target} APPEND PROPERTY AUTOGEN_TARGET_DEPENDS ${list_file})
+endfunction()

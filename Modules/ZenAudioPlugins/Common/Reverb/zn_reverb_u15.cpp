@@ -141,7 +141,7 @@ void zn_reverb_u15::CopyIn(float* const* channels, std::size_t count) noexcept {
         float* in = m_in.data() + ch * m_hostFrames;
         for (std::size_t f = 0; f < count; ++f) {
             const float x = channels[ch][f];
-            in[f] = std::fabs(x) <= kLargestInput ? x : (std::isnan(x) ? 0.0f : std::copysign(kLargestInput, x));
+            in[f] = std::fabs(x) <= kLargestInput ? x : (std::isfinite(x) ? std::copysign(kLargestInput, x) : 0.0f);
         }
     }
     m_direct.Process(m_in.data(), 1, m_hostFrames, m_directOut.data(), 1, m_hostFrames, count);

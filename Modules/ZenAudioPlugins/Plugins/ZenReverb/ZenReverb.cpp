@@ -133,6 +133,23 @@ void ZenReverb::ProcessBlock(float* const* channels, std::uint32_t, std::uint32_
     m_processor->ProcessAnyLength(channels, frames);
 }
 
+std::uint32_t ZenReverb::GetTailLength() const {
+    // Full-scale input can drive the tail above 0 dBFS; the late gain and
+    // the late EQ's boosts lift it further before it decays 60 dB per T60.
+    constexpr double kDecayDb = 100.0 + 30.0;
+    constexpr double kEarlySeconds = 0.25;  // reflections of the largest room
+    const zen::ParameterTable& p = Parameters();
+    const double boostDb = std::max(0.0f, p[kLateGain].GetValue()) +
+                           std::max({0.0f, p[kLateLowGain].GetValue(), p[kLateHighGain].GetValue()});
+    const double seconds = p[kPreDelay].GetValue() / 1000.0 + kEarlySeconds +
+                           p[kT60].GetValue() * (kDecayDb + boostDb) / 60.0;
+    return static_cast<std::uint32_t>(std::ceil(seconds * GetSampleRate()));
+}
+
+bool ZenReverb::ApplyNeutralSetting() {
+    return SetParameter(kDryWet, 0.0f) && SetParameter(kDirectGain, 0.0f);
+}
+
 void ZenReverb::ResetProcessing() {
     if (m_processor) m_processor->Reset();
 }

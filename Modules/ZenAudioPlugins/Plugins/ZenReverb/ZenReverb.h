@@ -54,6 +54,11 @@ public:
     // The room's floor from the four values: {length, width}, each within the host's limits.
     static std::pair<float, float> EffectiveFloor(float length, float width, float size, float ratio);
 
+    // The decay to -100 dBFS, with headroom for full-scale input and the late boosts.
+    std::uint32_t GetTailLength() const override;
+    // Fully dry: the input passes unchanged.
+    bool ApplyNeutralSetting() override;
+
     // For tests: the engine and the processing object of the current preparation.
     const zen::reverb::zn_reverb* Engine() const { return m_engine.get(); }
     const zen::reverb::zn_reverb_u15* Processor() const { return m_processor.get(); }
