@@ -16,6 +16,8 @@ template <class Class>
 class ZenAudioPlugin final : public Class {
 public:
     ZenAudioPlugin() = default;
+    // The most derived destructor: the plug-in's overrides still run here.
+    ~ZenAudioPlugin() override { this->ShutdownPlugin(); }
 
     // The factory: constructs the instance and hands it the host's context,
     // services and the registry's descriptor. Null if construction fails.
@@ -23,6 +25,10 @@ public:
         try {
             auto* instance = new ZenAudioPlugin<Class>();
             instance->AttachToHost(descriptor, hostContext, hostServices);
+            if (!instance->InitializePlugin()) {
+                delete instance;
+                return nullptr;
+            }
             return static_cast<zen::PluginInstance*>(instance);
         } catch (...) {
             return nullptr;

@@ -103,6 +103,12 @@ public:
     std::uint32_t GetProcessChannelCount() const { return m_inputs > m_outputs ? m_inputs : m_outputs; }
     const zen::ParameterTable& Parameters() const { return m_parameters; }
 
+    // Called once by the factory after AttachToHost (false: the instance is
+    // not created) and once before destruction. For plug-ins that build
+    // resources which outlive Prepare; the defaults do nothing.
+    virtual bool InitializePlugin() { return true; }
+    virtual void ShutdownPlugin() {}
+
 protected:
     ZenAudioPluginImpl();
 

@@ -1,0 +1,53 @@
+#include "FFT/Buffer.h"
+
+#include <algorithm>
+#include <cstring>
+
+namespace ora::fft {
+
+void Buffer::Allocate(std::size_t capacity, Layout layout) {
+    m_layout = layout;
+    if (layout == Layout::Ring) {
+        std::size_t size = 1;
+        while (size < capacity) size <<= 1;
+        capacity = size;
+        m_mask = size - 1;
+    }
+    m_data.Resize(capacity);
+    m_written = 0;
+}
+
+void Buffer::Clear() noexcept {
+    m_data.Clear();
+    m_written = 0;
+}
+
+void Buffer::Write(const float* samples, std::size_t count) noexcept {
+    if (m_data.empty()) return;
+    for (std::size_t i = 0; i < count; ++i) m_data[static_cast<std::size_t>(m_written + static_cast<std::int64_t>(i)) & m_mask] = samples[i];
+    m_written += static_cast<std::int64_t>(count);
+}
+
+float Buffer::At(std::int64_t position) const noexcept {
+    const auto capacity = static_cast<std::int64_t>(m_data.size());
+    if (position < 0 || position >= m_written || position < m_written - capacity) return 0.0f;
+    return m_data[static_cast<std::size_t>(position) & m_mask];
+}
+
+void Buffer::Read(std::int64_t start, float* out, std::size_t count) const noexcept {
+    const auto capacity = static_cast<std::int64_t>(m_data.size());
+    const std::int64_t oldest = std::max<std::int64_t>(0, m_written - capacity);
+    for (std::size_t i = 0; i < count; ++i) {
+        const std::int64_t p = start + static_cast<std::int64_t>(i);
+        out[i] = (p >= oldest && p < m_written) ? m_data[static_cast<std::size_t>(p) & m_mask] : 0.0f;
+    }
+}
+
+void Buffer::Shift(std::size_t count) noexcept {
+    const std::size_t size = m_data.size();
+    count = std::min(count, size);
+    std::memmove(m_data.data(), m_data.data() + count, (size - count) * sizeof(float));
+    std::fill(m_data.data() + (size - count), m_data.data() + size, 0.0f);
+}
+
+}  // namespace ora::fft

@@ -1,0 +1,42 @@
+// What the FFT engine tells its frame plug-ins about the frame being run.
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <vector>
+
+#include "FFT/Buffer.h"
+#include "FFT/FFT.h"
+#include "FFT/Window.h"
+
+namespace ora::fft {
+
+struct Context {
+    std::size_t channels = 0;
+    // Rows of the per-channel spectral variables: the channels, plus one
+    // shared row when channels are reconstructed jointly.
+    std::size_t rows = 0;
+    std::size_t frameLength = 0;
+    std::size_t fftLength = 0;
+    std::size_t bins = 0;
+    std::size_t synthesisHop = 0;
+    std::size_t analysisHop = 0;     // of the frame being run, from the previous one
+    std::int64_t analysisStart = 0;  // input position of the frame's first sample
+    std::uint64_t frameIndex = 0;    // frames run since the last reset
+    float gain = 1.0f;               // applied on synthesis
+    std::size_t bandLimit = 0;       // bins from here up are silenced on synthesis; 0: none
+    bool joint = false;              // one phase decision for all channels (the shared row)
+
+    FFT* fft = nullptr;
+    const Window* window = nullptr;
+    std::vector<Buffer>* in = nullptr;   // input history per channel
+    std::vector<Buffer>* out = nullptr;  // overlap-add accumulators per channel
+
+    // The rows whose phases are reconstructed: the shared row when joint,
+    // else every channel's.
+    std::size_t FirstReconstructedRow() const { return joint && rows > channels ? channels : 0; }
+    std::size_t EndReconstructedRow() const { return joint && rows > channels ? channels + 1 : channels; }
+    bool SharedRow() const { return joint && rows > channels; }
+};
+
+}  // namespace ora::fft

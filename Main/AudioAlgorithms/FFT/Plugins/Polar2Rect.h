@@ -1,0 +1,19 @@
+// Magnitude and reconstructed phase (PHASE_START) back to FSIG. With a
+// shared row every channel takes that row's phase plus its own analysis
+// phase offset from it, so the phase differences between channels, and with
+// them the stereo image, come through unchanged.
+#pragma once
+
+#include "FFT/Plugin.h"
+
+namespace ora::fft {
+
+class Polar2Rect final : public Plugin {
+public:
+    Polar2Rect() : Plugin(plugin::PROCESS) {}
+    const char* Name() const override { return "Polar2Rect"; }
+    bool Configure(Frame& frame, const Context& context) override;
+    void Process(Frame& frame, Context& context) noexcept override;
+};
+
+}  // namespace ora::fft

@@ -1,0 +1,51 @@
+#include "FFT/Plugins/Rect2Polar.h"
+
+#include <cmath>
+
+namespace ora::fft {
+
+namespace {
+// Below this share of the total magnitude the channels' sum has no
+// trustworthy phase (anti-phase material).
+constexpr float kCancellation = 1e-3f;
+}  // namespace
+
+bool Rect2Polar::Configure(Frame& frame, const Context& context) {
+    return frame.RequireVector(variable::FSIG, type::FREQ_CPLX_VECTOR, context.channels, context.bins) &&
+           frame.RequireVector(variable::SFEAT, type::FREQ_REAL_VECTOR, context.rows, context.bins) &&
+           frame.RequireVector(variable::MAG2, type::FREQ_REAL_VECTOR, context.rows, context.bins) &&
+           frame.RequireVector(variable::PHASE_IN, type::FREQ_REAL_VECTOR, context.rows, context.bins);
+}
+
+void Rect2Polar::Process(Frame& frame, Context& context) noexcept {
+    const Complex* fsig = frame.Cplx(variable::FSIG, type::FREQ_CPLX_VECTOR);
+    float* mag = frame.Real(variable::SFEAT, type::FREQ_REAL_VECTOR);
+    float* mag2 = frame.Real(variable::MAG2, type::FREQ_REAL_VECTOR);
+    float* phase = frame.Real(variable::PHASE_IN, type::FREQ_REAL_VECTOR);
+    if (fsig == nullptr || mag == nullptr || mag2 == nullptr || phase == nullptr) return;
+    const std::size_t bins = context.bins;
+    for (std::size_t c = 0; c < context.channels; ++c) {
+        const Complex* x = fsig + c * bins;
+        for (std::size_t k = 0; k < bins; ++k) {
+            const float power = x[k].real() * x[k].real() + x[k].imag() * x[k].imag();
+            mag2[c * bins + k] = power;
+            mag[c * bins + k] = std::sqrt(power);
+            phase[c * bins + k] = std::atan2(x[k].imag(), x[k].real());
+        }
+    }
+    if (!context.SharedRow()) return;
+    const std::size_t r = context.channels * bins;
+    for (std::size_t k = 0; k < bins; ++k) {
+        Complex sum{0.0f, 0.0f};
+        float power = 0.0f;
+        for (std::size_t c = 0; c < context.channels; ++c) {
+            sum += fsig[c * bins + k];
+            power += mag2[c * bins + k];
+        }
+        mag2[r + k] = power;
+        mag[r + k] = std::sqrt(power);
+        phase[r + k] = std::abs(sum) > kCancellation * mag[r + k] ? std::arg(sum) : phase[k];
+    }
+}
+
+}  // namespace ora::fft

@@ -1,0 +1,199 @@
+#include "ZenAudioPitchShift.h"
+
+#include <QCoreApplication>
+#include <algorithm>
+#include <cmath>
+
+#include "Common/ZenAssert.h"
+#include "Common/ZenAudioPlugin.h"
+#include "System/Trace.h"
+
+const zen::PluginDescriptor ZenAudioPitchShift::kDescriptor = {
+    "Pitch", 0.4, zen::kPluginStateOffered, zen::MakePluginCode('Z', 'n', 'F', 'a'),
+    8, 8, "ZenAudioPitchShift", 0, 0, -1, nullptr};
+
+ZenAudioPitchShift::ZenAudioPitchShift()
+    : m_param(std::make_unique<ora::pitchshift::EngineParam>(kFrameLength, kOverlap, kFftLength, kHistory)) {
+    InitParameters(Definitions());
+}
+
+ZenAudioPitchShift::~ZenAudioPitchShift() { ZEN_ASSERT(m_pEngine == nullptr, "m_pEngine == nullptr"); }
+
+const zen::ParameterTableDefinition& ZenAudioPitchShift::Definitions() {
+    static const zen::ParameterTableDefinition table = zen::MakeParameterTable(
+        "ZenAudioPitchShift",
+        {
+            zen::ContinuousParameter("COARSE", QT_TRANSLATE_NOOP("ZenAudioPitchShift", "Semitones"), -12.0f, 12.0f,
+                                     0.0f, 1.0f),
+            zen::ContinuousParameter("FINE", QT_TRANSLATE_NOOP("ZenAudioPitchShift", "Cents"), -100.0f, 100.0f, 0.0f,
+                                     0.1f),
+            zen::ContinuousParameter("DRY_WET", QT_TRANSLATE_NOOP("ZenAudioPitchShift", "Dry/Wet"), 0.0f, 100.0f,
+                                     100.0f, 0.1f, "%"),
+            zen::SwitchParameter("JOINT_ON", QT_TRANSLATE_NOOP("ZenAudioPitchShift", "Split/Joint"), 1.0f),
+            zen::ListParameter("ALGO_TYPE", QT_TRANSLATE_NOOP("ZenAudioPitchShift", "Algorithm"), {"PLPV", "PGHI"},
+                               1.0f),
+            zen::ListParameter("ALGO_MODE", QT_TRANSLATE_NOOP("ZenAudioPitchShift", "Mode"), {"PG", "PV", "Auto"},
+                               2.0f),
+            zen::ContinuousParameter("LOG10_EPS_PEAK", QT_TRANSLATE_NOOP("ZenAudioPitchShift", "Log10Eps"), -7.0f,
+                                     -1.0f, -4.0f, 0.1f),
+            zen::ContinuousParameter("MAX_PEAK", QT_TRANSLATE_NOOP("ZenAudioPitchShift", "MaxPeak"), 10.0f, 100.0f,
+                                     50.0f, 1.0f),
+            zen::ContinuousParameter("LOG10_TOL", QT_TRANSLATE_NOOP("ZenAudioPitchShift", "Log10Tol"), -7.0f, -1.0f,
+                                     -6.0f, 0.1f),
+        });
+    return table;
+}
+
+bool ZenAudioPitchShift::InitializePlugin() {
+    ora::system::Trace("ZenAudioPitchShift::InitializePlugin()(0x%p)", static_cast<void*>(this));
+    boost::unique_lock<boost::upgrade_mutex> lock(m_engineLock);
+    try {
+        m_inWork.assign(static_cast<std::size_t>(kDescriptor.inputChannelLimit) * kWorkFrames, 0.0f);
+        m_outWork.assign(static_cast<std::size_t>(kDescriptor.outputChannelLimit) * kWorkFrames, 0.0f);
+    } catch (const std::bad_alloc&) {
+        return false;
+    }
+    return BuildEngine();
+}
+
+void ZenAudioPitchShift::ShutdownPlugin() {
+    ora::system::Trace("ZenAudioPitchShift::ShutdownPlugin()(0x%p)", static_cast<void*>(this));
+    boost::unique_lock<boost::upgrade_mutex> lock(m_engineLock);
+    m_pEngine.reset();
+    m_inWork.clear();
+    m_outWork.clear();
+}
+
+bool ZenAudioPitchShift::HasEngine() const {
+    boost::shared_lock<boost::upgrade_mutex> lock(m_engineLock);
+    return m_pEngine != nullptr;
+}
+
+bool ZenAudioPitchShift::BuildEngine() {
+    m_pEngine.reset();
+    try {
+        auto engine = std::make_unique<ora::pitchshift::Engine>(*m_param);
+        if (!engine->Configure(GetProcessChannelCount())) return false;
+        m_pEngine = std::move(engine);
+    } catch (const std::exception&) {
+        return false;
+    }
+    m_pEngine->SetJoint(m_joint);
+    m_pEngine->SetLog10Eps(m_log10Eps);
+    m_pEngine->SetMaxPeak(m_maxPeak);
+    m_pEngine->SetLog10Tol(m_log10Tol);
+    return true;
+}
+
+// Hosts probe layouts, so a mismatch is a plain refusal, not a programming error.
+bool ZenAudioPitchShift::AcceptsChannelConfiguration(std::uint32_t inputs, std::uint32_t outputs) const {
+    return inputs == outputs && inputs >= 1;
+}
+
+void ZenAudioPitchShift::PrepareProcessing(float, std::uint32_t) {
+    boost::unique_lock<boost::upgrade_mutex> lock(m_engineLock);
+    if (!m_pEngine || m_pEngine->Channels() != GetProcessChannelCount()) BuildEngine();
+    if (m_pEngine) {
+        m_pEngine->Reset();
+        SetLatency(static_cast<std::uint32_t>(m_pEngine->Latency()));
+    }
+    m_settle = true;
+}
+
+std::uint32_t ZenAudioPitchShift::GetTailLength() const {
+    const zen::ParameterTable& p = Parameters();
+    const double ratio = ora::pitchshift::Engine::Ratio(static_cast<std::int32_t>(std::lround(p[kCoarse].GetValue())),
+                                                        p[kFine].GetValue());
+    const double half = static_cast<double>(kFrameLength) / 2.0;
+    return static_cast<std::uint32_t>(half + std::ceil(half / ratio));
+}
+
+bool ZenAudioPitchShift::ApplyNeutralSetting() {
+    ZenAudioPluginImpl::ApplyNeutralSetting();
+    return SetParameter(kDryWet, 0.0f);
+}
+
+ora::pitchshift::Engine::Settings ZenAudioPitchShift::WantedSettings() const {
+    const zen::ParameterTable& p = Parameters();
+    ora::pitchshift::Engine::Settings s;
+    s.coarse = static_cast<std::int32_t>(std::lround(p[kCoarse].GetValue()));
+    s.fine = p[kFine].GetValue();
+    s.dryWet = p[kDryWet].GetValue();
+    s.algorithmType = static_cast<std::int32_t>(std::lround(p[kAlgoType].GetValue()));
+    s.algorithmMode = static_cast<std::int32_t>(std::lround(p[kAlgoMode].GetValue()));
+    return s;
+}
+
+void ZenAudioPitchShift::ApplyChanges(boost::upgrade_lock<boost::upgrade_mutex>& lock) noexcept {
+    const zen::ParameterTable& p = Parameters();
+    const auto wanted = WantedSettings();
+    const std::uint32_t bits = m_pEngine->Changes(wanted);
+    const bool joint = p[kJointOn].GetValue() >= 0.5f;
+    const float log10Eps = p[kLog10EpsPeak].GetValue();
+    const int maxPeak = static_cast<int>(std::lround(p[kMaxPeak].GetValue()));
+    const float log10Tol = p[kLog10Tol].GetValue();
+    const bool tuning = joint != m_joint || log10Eps != m_log10Eps || maxPeak != m_maxPeak || log10Tol != m_log10Tol;
+    if (bits == 0 && m_pEngine->Pending() == 0 && !tuning && !m_settle) return;
+
+    boost::upgrade_to_unique_lock<boost::upgrade_mutex> exclusive(lock);
+    m_pEngine->Apply(wanted, bits);
+    if (m_settle) {
+        m_pEngine->Reset();  // nothing was processed since the last reset
+        m_settle = false;
+    }
+    if (tuning) {
+        m_joint = joint;
+        m_log10Eps = log10Eps;
+        m_maxPeak = maxPeak;
+        m_log10Tol = log10Tol;
+        m_pEngine->SetJoint(joint);
+        m_pEngine->SetLog10Eps(log10Eps);
+        m_pEngine->SetMaxPeak(maxPeak);
+        m_pEngine->SetLog10Tol(log10Tol);
+    }
+}
+
+void ZenAudioPitchShift::ProcessBlock(float* const* channels, std::uint32_t channelCount,
+                                      std::uint32_t frames) noexcept {
+    boost::upgrade_lock<boost::upgrade_mutex> lock(m_engineLock, boost::try_to_lock);
+    if (!lock.owns_lock() || !m_pEngine || m_inWork.empty() || m_outWork.empty() ||
+        m_pEngine->Channels() != channelCount)
+        return;
+    ApplyChanges(lock);
+
+    float* in[kMaxChannels];
+    float* out[kMaxChannels];
+    for (std::uint32_t c = 0; c < channelCount; ++c) {
+        in[c] = m_inWork.data() + static_cast<std::size_t>(c) * kWorkFrames;
+        out[c] = m_outWork.data() + static_cast<std::size_t>(c) * kWorkFrames;
+    }
+    for (std::uint32_t done = 0; done < frames;) {
+        const std::uint32_t count = std::min(frames - done, kWorkFrames);
+        // Non-finite input becomes silence: one NaN would otherwise stay in
+        // the spectra and the phases for good.
+        for (std::uint32_t c = 0; c < channelCount; ++c)
+            for (std::uint32_t i = 0; i < count; ++i) {
+                const float x = channels[c][done + i];
+                in[c][i] = std::isfinite(x) ? x : 0.0f;
+            }
+        m_pEngine->Process(in, out, count);
+        for (std::uint32_t c = 0; c < channelCount; ++c) std::copy_n(out[c], count, channels[c] + done);
+        done += count;
+    }
+}
+
+void ZenAudioPitchShift::ResetProcessing() {
+    boost::unique_lock<boost::upgrade_mutex> lock(m_engineLock);
+    // Back to the construction values; the next block compares the host's
+    // parameters with them and applies whatever differs.
+    m_maxPeak = 50;
+    m_log10Tol = -6.0f;
+    m_settle = true;
+    if (!m_pEngine) return;
+    m_pEngine->ForgetSettings();
+    m_pEngine->SetMaxPeak(m_maxPeak);
+    m_pEngine->SetLog10Tol(m_log10Tol);
+    m_pEngine->Reset();
+}
+
+template class ZenAudioPlugin<ZenAudioPitchShift>;

@@ -1,0 +1,198 @@
+// "Pitch" through the host interface: its table, a latency that is true,
+// near transparency at no shift, the dry path, stereo in joint mode, the
+// channel layouts it takes and its life cycle.
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <complex>
+#include <limits>
+
+#include "Plugins/ZenAudioPitchShift/ZenAudioPitchShift.h"
+#include "Support/AssertionRecorder.h"
+#include "Support/PluginHarness.h"
+#include "Support/Signals.h"
+
+using zentest::PluginHarness;
+
+namespace {
+
+constexpr std::uint32_t kLatency = 6400;
+constexpr double kRate = 48000.0;
+
+// Phase of frequency f in x[from, from + length) (Hann-windowed DTFT).
+std::complex<double> Dtft(const std::vector<float>& x, std::size_t from, std::size_t length, double f) {
+    std::complex<double> sum = 0.0;
+    for (std::size_t i = 0; i < length; ++i) {
+        const double w = 0.5 - 0.5 * std::cos(2.0 * zentest::kPi * static_cast<double>(i) / static_cast<double>(length));
+        sum += w * x[from + i] * std::polar(1.0, -2.0 * zentest::kPi * f * static_cast<double>(i) / kRate);
+    }
+    return sum;
+}
+
+std::vector<float> Tone(double f, std::size_t frames, double phase) {
+    std::vector<float> x(frames);
+    for (std::size_t i = 0; i < frames; ++i)
+        x[i] = static_cast<float>(0.3 * std::sin(2.0 * zentest::kPi * f * static_cast<double>(i) / kRate + phase) +
+                                  0.15 * std::sin(2.0 * zentest::kPi * 2.0 * f * static_cast<double>(i) / kRate + 2.0 * phase));
+    return x;
+}
+
+}  // namespace
+
+TEST(ZenAudioPitchShift, DescriptorAndParameters) {
+    PluginHarness plugin("Pitch");
+    const zen::PluginDescriptor* d = plugin.Instance().GetDescriptor();
+    EXPECT_STREQ(d->name, "Pitch");
+    EXPECT_EQ(d->code, 1517176417);
+    EXPECT_EQ(d->version, 0.4);
+    EXPECT_EQ(d->inputChannelLimit, 8u);
+    EXPECT_EQ(d->outputChannelLimit, 8u);
+    EXPECT_STREQ(d->className, "ZenAudioPitchShift");
+    EXPECT_EQ(d->listFlags, 0u);
+    struct Row {
+        const char* identifier;
+        const char* label;
+        float minimum, maximum, defaultValue, step;
+    };
+    const Row rows[] = {
+        {"ZenAudioPitchShift::COARSE", "Semitones", -12, 12, 0, 1},
+        {"ZenAudioPitchShift::FINE", "Cents", -100, 100, 0, 0.1f},
+        {"ZenAudioPitchShift::DRY_WET", "Dry/Wet", 0, 100, 100, 0.1f},
+        {"ZenAudioPitchShift::JOINT_ON", "Split/Joint", 0, 1, 1, 1},
+        {"ZenAudioPitchShift::ALGO_TYPE", "Algorithm", 0, 1, 1, 1},
+        {"ZenAudioPitchShift::ALGO_MODE", "Mode", 0, 2, 2, 1},
+        {"ZenAudioPitchShift::LOG10_EPS_PEAK", "Log10Eps", -7, -1, -4, 0.1f},
+        {"ZenAudioPitchShift::MAX_PEAK", "MaxPeak", 10, 100, 50, 1},
+        {"ZenAudioPitchShift::LOG10_TOL", "Log10Tol", -7, -1, -6, 0.1f},
+    };
+    ASSERT_EQ(plugin.Audio().GetParameterCount(), 9u);
+    for (std::uint32_t i = 0; i < 9; ++i) {
+        zen::ParameterInfo info;
+        ASSERT_TRUE(plugin.Audio().GetParameterInfo(i, info));
+        EXPECT_EQ(info.identifier, rows[i].identifier);
+        EXPECT_EQ(info.label, rows[i].label);
+        EXPECT_EQ(info.minimum, rows[i].minimum) << rows[i].label;
+        EXPECT_EQ(info.maximum, rows[i].maximum) << rows[i].label;
+        EXPECT_EQ(info.defaultValue, rows[i].defaultValue) << rows[i].label;
+        EXPECT_FLOAT_EQ(info.step, rows[i].step) << rows[i].label;
+    }
+    zen::ParameterInfo type, mode;
+    plugin.Audio().GetParameterInfo(ZenAudioPitchShift::kAlgoType, type);
+    plugin.Audio().GetParameterInfo(ZenAudioPitchShift::kAlgoMode, mode);
+    EXPECT_EQ(type.choices, (std::vector<std::string>{"PLPV", "PGHI"}));
+    EXPECT_EQ(mode.choices, (std::vector<std::string>{"PG", "PV", "Auto"}));
+}
+
+TEST(ZenAudioPitchShift, ReportedLatencyIsWhereAnImpulseComesOut) {
+    for (float dryWet : {0.0f, 100.0f}) {
+        PluginHarness plugin("Pitch");
+        plugin.Set("Dry/Wet", dryWet);
+        plugin.Prepare(1);
+        ASSERT_EQ(plugin.Audio().GetLatency(), kLatency);
+        const auto y = plugin.Run(zentest::Impulse(kLatency + 8000, 1000), 1)[0];
+        EXPECT_EQ(zentest::ArgPeak(y), 1000u + kLatency) << dryWet;
+        EXPECT_NEAR(y[1000 + kLatency], 1.0f, 1e-3f) << dryWet;
+    }
+}
+
+TEST(ZenAudioPitchShift, NoShiftIsNearlyTransparentAndBypassKeepsTheLatency) {
+    PluginHarness plugin("Pitch");
+    plugin.Prepare(2);
+    const auto x = zentest::Noise(30000, 0.3, 9);
+    zentest::Channels io = {x, x};
+    io[1].assign(x.rbegin(), x.rend());
+    const auto input = io;
+    for (auto& c : io) c.resize(c.size() + kLatency, 0.0f);
+    plugin.Process(io, 512);
+    for (std::size_t c = 0; c < 2; ++c) {
+        double err = 0.0, ref = 0.0;
+        for (std::size_t i = 0; i < input[c].size(); ++i) {
+            err += std::pow(io[c][i + kLatency] - input[c][i], 2.0);
+            ref += input[c][i] * input[c][i];
+        }
+        const double db = 10.0 * std::log10(err / ref);
+        std::printf("Pitch at 0 semitones, channel %zu: difference %.1f dB below the input\n", c, -db);
+        EXPECT_LT(db, -60.0) << c;
+    }
+    plugin.Audio().SetBypass(true);
+    EXPECT_EQ(plugin.Audio().GetLatency(), kLatency);
+}
+
+TEST(ZenAudioPitchShift, JointKeepsThePhaseDifferenceBetweenChannels) {
+    // The right channel leads by 0.8 rad at 300 Hz (1.6 at 600 Hz); a fifth up.
+    const std::size_t frames = 40000;
+    PluginHarness plugin("Pitch");
+    plugin.Set("Semitones", 7.0f);
+    plugin.Set("Split/Joint", 1.0f);
+    plugin.Prepare(2);
+    zentest::Channels io = {Tone(300.0, frames, 0.0), Tone(300.0, frames, 0.8)};
+    plugin.Process(io, 512);
+    const double f = 300.0 * std::pow(2.0, 7.0 / 12.0);
+    const std::size_t from = 20000, length = 16384;
+    for (int h = 1; h <= 2; ++h) {
+        const auto l = Dtft(io[0], from, length, h * f);
+        const auto r = Dtft(io[1], from, length, h * f);
+        EXPECT_NEAR(std::arg(r * std::conj(l)), 0.8 * h, 0.02) << "partial " << h;
+        EXPECT_NEAR(std::abs(r) / std::abs(l), 1.0, 0.01) << "partial " << h;
+    }
+}
+
+TEST(ZenAudioPitchShift, TakesOneToEightChannelsWithAsManyOutputs) {
+    PluginHarness plugin("Pitch");
+    AudioPlugin& audio = plugin.Audio();
+    EXPECT_TRUE(audio.ConfigureChannels(1, 1));
+    EXPECT_TRUE(audio.ConfigureChannels(8, 8));
+    EXPECT_FALSE(audio.ConfigureChannels(9, 9));
+    zentest::AssertionRecorder assertions;
+    EXPECT_FALSE(audio.ConfigureChannels(2, 1));
+    EXPECT_FALSE(audio.ConfigureChannels(2, 4));
+    EXPECT_TRUE(assertions.Assertions().empty());  // hosts probe layouts: a refusal, not an error
+
+    // A new layout after preparation rebuilds the engine for it.
+    plugin.Prepare(2);
+    ASSERT_TRUE(audio.ConfigureChannels(6, 6));
+    zentest::Channels six(6, zentest::Sine(440.0, kRate, 8000, 0.5));
+    plugin.Process(six, 1000);
+    for (const auto& c : six) EXPECT_GT(zentest::Peak(c, kLatency + 1000), 0.3f);
+    EXPECT_EQ(audio.GetLatency(), kLatency);
+}
+
+TEST(ZenAudioPitchShift, LifeCycleAndResetKeepTheHostsSettings) {
+    PluginHarness plugin("Pitch");
+    auto* instance = dynamic_cast<ZenAudioPitchShift*>(&plugin.Instance());
+    ASSERT_NE(instance, nullptr);
+    EXPECT_TRUE(instance->HasEngine());  // built when the instance was created
+
+    plugin.Set("Dry/Wet", 0.0f);
+    plugin.Set("Semitones", 5.0f);
+    plugin.Prepare(1);
+    const auto x = zentest::Noise(kLatency + 4000, 0.5, 4);
+    zentest::Channels io = {x};
+    plugin.Process(io, 256);
+    plugin.Audio().Reset();
+    io = {x};
+    plugin.Process(io, 256);
+    // Still all dry after the reset: the host's settings are applied again.
+    for (std::size_t i = kLatency; i < x.size(); ++i) ASSERT_EQ(io[0][i], x[i - kLatency]) << i;
+
+    instance->ShutdownPlugin();
+    EXPECT_FALSE(instance->HasEngine());
+    io = {x};
+    plugin.Process(io, 256);  // without an engine the block passes unchanged
+    EXPECT_EQ(io[0], x);
+}
+
+TEST(ZenAudioPitchShift, NonFiniteInputIsSilenceAndTheTailFollowsTheRatio) {
+    PluginHarness plugin("Pitch");
+    EXPECT_EQ(plugin.Audio().GetTailLength(), 4096u);  // half a frame, and half a frame read at 1
+    plugin.Set("Semitones", -12.0f);
+    EXPECT_EQ(plugin.Audio().GetTailLength(), 2048u + 4096u);
+    plugin.Prepare(1);
+    auto x = zentest::Sine(300.0, kRate, 20000, 0.5);
+    x[3000] = std::numeric_limits<float>::quiet_NaN();
+    x[3001] = std::numeric_limits<float>::infinity();
+    zentest::Channels io = {x};
+    plugin.Process(io, 512);
+    for (float y : io[0]) ASSERT_TRUE(std::isfinite(y));
+    EXPECT_GT(zentest::Peak(io[0], 15000), 0.3f);
+}
