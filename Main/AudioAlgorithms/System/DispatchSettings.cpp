@@ -65,12 +65,46 @@ int PhysicalCoreCount() {
     return Forced() ? DispatchSettings::Instance().GetForcedPhysicalCores() : Cpu().physicalCores;
 }
 
+int HighestStandardLeaf() {
+    return Forced() ? DispatchSettings::Instance().GetForcedHighestStandardLeaf()
+                    : static_cast<int>(Cpu().highestStandardLeaf);
+}
+
+int InitialApicId() {
+    return Forced() ? DispatchSettings::Instance().GetForcedInitialApicId() : static_cast<int>(Cpu().initialApicId);
+}
+
 KernelForm ChooseKernelForm() {
     if (HasAVX() && HasFMA()) return KernelForm::M256Fma;
     if (HasAVX()) return KernelForm::M256;
     if (HasFMA()) return KernelForm::M128Fma;
     if (HasSSE2()) return KernelForm::M128;
     return KernelForm::Ref;
+}
+
+KernelForm ChooseKernelFormWithoutFma() {
+    switch (ChooseKernelForm()) {
+        case KernelForm::M256Fma:
+        case KernelForm::M256: return KernelForm::M256;
+        case KernelForm::M128Fma:
+        case KernelForm::M128: return KernelForm::M128;
+        default: return KernelForm::Ref;
+    }
+}
+
+IntegerKernelForm ChooseIntegerKernelForm() {
+    if (HasAVX2()) return IntegerKernelForm::M256Avx2;
+    if (HasSSE41()) return IntegerKernelForm::M128Sse41;
+    return IntegerKernelForm::Ref;
+}
+
+const char* KernelFormName(IntegerKernelForm form) {
+    switch (form) {
+        case IntegerKernelForm::M256Avx2: return "m256_avx2";
+        case IntegerKernelForm::M128Sse41: return "m128_sse41";
+        case IntegerKernelForm::Ref: return "ref";
+    }
+    return "ref";
 }
 
 const char* KernelFormName(KernelForm form) {

@@ -36,9 +36,13 @@ public:
     bool GetForcedFma() const { return m_fma.load(); }
     bool GetForcedWide() const { return m_wide.load(); }
 
-    // Counts that stand in for the detected ones in forced mode.
+    // Counts and identifiers that stand in for the detected ones in forced mode.
     int GetForcedLogicalProcessors() const { return m_forcedLogical.load(); }
     void SetForcedLogicalProcessors(int count) { m_forcedLogical.store(count); }
+    int GetForcedHighestStandardLeaf() const { return m_forcedHighestLeaf.load(); }
+    void SetForcedHighestStandardLeaf(int leaf) { m_forcedHighestLeaf.store(leaf); }
+    int GetForcedInitialApicId() const { return m_forcedApicId.load(); }
+    void SetForcedInitialApicId(int id) { m_forcedApicId.store(id); }
     int GetForcedPhysicalCores() const { return m_forcedPhysical.load(); }
     void SetForcedPhysicalCores(int count) { m_forcedPhysical.store(count); }
     int GetForcedThreadsPerCore() const { return m_forcedThreadsPerCore.load(); }
@@ -53,6 +57,8 @@ private:
     std::atomic<bool> m_fma{false};
     std::atomic<bool> m_wide{false};
     std::atomic<int> m_forcedLogical{64};
+    std::atomic<int> m_forcedHighestLeaf{32768};
+    std::atomic<int> m_forcedApicId{32768};
     std::atomic<int> m_forcedPhysical{4};
     std::atomic<int> m_forcedThreadsPerCore{2};
 };
@@ -71,6 +77,8 @@ bool HasFMA();
 bool HasWideVectors();  // the second forced boolean; always false when detected
 int LogicalProcessorCount();
 int PhysicalCoreCount();
+int HighestStandardLeaf();
+int InitialApicId();
 
 // The forms of a kernel family, best first, and the ladder that picks one.
 enum class KernelForm { M256Fma, M256, M128Fma, M128, Ref };
@@ -78,7 +86,16 @@ enum class KernelForm { M256Fma, M256, M128Fma, M128, Ref };
 // 256-bit FMA when AVX and FMA; else 256-bit when AVX; else 128-bit FMA when
 // FMA; else 128-bit when SSE2; else the reference form.
 KernelForm ChooseKernelForm();
+// The same ladder for a family without fused forms: they become the plain
+// vector form of their width.
+KernelForm ChooseKernelFormWithoutFma();
 const char* KernelFormName(KernelForm form);
+
+// Families of integer arithmetic have a ladder of their own: 256-bit integer
+// vectors need AVX2, 128-bit 32-bit multiplies SSE4.1.
+enum class IntegerKernelForm { M256Avx2, M128Sse41, Ref };
+IntegerKernelForm ChooseIntegerKernelForm();
+const char* KernelFormName(IntegerKernelForm form);
 
 // Sets forced mode for a scope and restores the previous settings.
 class ScopedDispatch {

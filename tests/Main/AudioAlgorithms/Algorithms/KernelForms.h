@@ -1,11 +1,14 @@
 // The kernel forms of the algorithm library, each forced in turn, for tests
 // that compare every form with the reference form. Forms this processor
-// cannot run are skipped, not failed.
+// cannot run are skipped, not failed. Parameterised suites derive from
+// FormTest; loops over the forms use ForEachForm.
 #pragma once
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cstdint>
+#include <cstring>
 #include <random>
 #include <string>
 #include <vector>
@@ -13,6 +16,9 @@
 #include "System/DispatchSettings.h"
 
 namespace kerneltest {
+
+using ora::system::InstructionLevel;
+using ora::system::KernelForm;
 
 struct Form {
     ora::system::KernelForm form;
@@ -50,8 +56,16 @@ inline std::string Name(const testing::TestParamInfo<Form>& info) {
 
 // Lengths that catch tails and vector-width mistakes.
 inline const std::vector<std::size_t>& AwkwardLengths() {
-    static const std::vector<std::size_t> lengths = {0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15, 16, 17, 65, 999};
+    static const std::vector<std::size_t> lengths = {0,  1,  2,  3,  4,  5,  6,  7,  8,   9,   10,
+                                                     11, 12, 13, 14, 15, 16, 17, 65, 999, 4095};
     return lengths;
+}
+
+// Their sum: a signal long enough to walk them all.
+inline std::size_t AwkwardTotal() {
+    std::size_t total = 0;
+    for (std::size_t n : AwkwardLengths()) total += n;
+    return total;
 }
 
 inline std::vector<float> RandomFloats(std::size_t n, std::uint32_t seed, float amplitude = 1.0f) {
@@ -86,6 +100,59 @@ private:
     std::size_t m_size;
     std::size_t m_offset = 0;
 };
+
+// Samples one float past a 64-byte boundary, with guard zones before and
+// after them that must stay untouched; for floats and 32-bit integers.
+template <class T = float>
+class Guarded {
+public:
+    static constexpr std::size_t kGuard = 19;
+    explicit Guarded(std::size_t size) : m_size(size), m_store(size + 2 * kGuard + 32) {
+        const auto address = reinterpret_cast<std::uintptr_t>(m_store.data());
+        m_offset = ((64 - address % 64) % 64) / sizeof(T) % 16 + 1 + kGuard;
+        for (T& v : m_store) std::memcpy(&v, &kPattern, sizeof(T));
+        std::fill(m_store.begin() + static_cast<std::ptrdiff_t>(m_offset),
+                  m_store.begin() + static_cast<std::ptrdiff_t>(m_offset + size), T{});
+    }
+    T* data() { return m_store.data() + m_offset; }
+    T& operator[](std::size_t i) { return data()[i]; }
+    bool GuardsIntact() const {
+        for (std::size_t i = m_offset - kGuard; i < m_offset; ++i)
+            if (std::memcmp(&m_store[i], &kPattern, sizeof(T)) != 0) return false;
+        for (std::size_t i = m_offset + m_size; i < m_offset + m_size + kGuard; ++i)
+            if (std::memcmp(&m_store[i], &kPattern, sizeof(T)) != 0) return false;
+        return true;
+    }
+
+private:
+    static constexpr std::uint32_t kPattern = 0x7FC0BEEF;  // a NaN as float
+    std::size_t m_size;
+    std::size_t m_offset = 0;
+    std::vector<T> m_store;
+};
+
+// Distance in units in the last place between two finite floats.
+inline std::int64_t UlpDistance(float a, float b) {
+    std::int32_t ia, ib;
+    std::memcpy(&ia, &a, 4);
+    std::memcpy(&ib, &b, 4);
+    const std::int64_t la = ia < 0 ? std::int64_t{INT32_MIN} - ia : ia;
+    const std::int64_t lb = ib < 0 ? std::int64_t{INT32_MIN} - ib : ib;
+    return la > lb ? la - lb : lb - la;
+}
+
+// Runs `body(form, name)` once per form this processor runs, forced, with the
+// name the family should report: families without fused forms report the
+// plain form of the width.
+template <class Body>
+void ForEachForm(bool hasFusedForms, Body body) {
+    for (const Form& form : AllForms()) {
+        if (!Runnable(form)) continue;
+        ora::system::ScopedDispatch forced(form.level, form.fma);
+        const std::string name = ora::system::KernelFormName(form.form);
+        body(form, hasFusedForms ? name : name.substr(0, name.find("_fma")));
+    }
+}
 
 class FormTest : public testing::TestWithParam<Form> {
 protected:

@@ -71,11 +71,40 @@ TEST(DispatchSettings, TheLadder) {
     }
 }
 
+TEST(DispatchSettings, FamiliesWithoutFusedOrFloatFormsHaveTheirOwnLadders) {
+    struct Case {
+        InstructionLevel level;
+        bool fma;
+        KernelForm plain;
+        IntegerKernelForm integer;
+    } cases[] = {
+        {InstructionLevel::AVX2, true, KernelForm::M256, IntegerKernelForm::M256Avx2},
+        {InstructionLevel::AVX, true, KernelForm::M256, IntegerKernelForm::M128Sse41},  // AVX without AVX2
+        {InstructionLevel::SSE42, true, KernelForm::M128, IntegerKernelForm::M128Sse41},
+        {InstructionLevel::SSSE3, false, KernelForm::M128, IntegerKernelForm::Ref},  // no 32-bit multiply yet
+        {InstructionLevel::None, false, KernelForm::Ref, IntegerKernelForm::Ref},
+    };
+    for (const Case& c : cases) {
+        ScopedDispatch forced(c.level, c.fma);
+        EXPECT_EQ(ChooseKernelFormWithoutFma(), c.plain) << static_cast<int>(c.level);
+        EXPECT_EQ(ChooseIntegerKernelForm(), c.integer) << static_cast<int>(c.level);
+    }
+    EXPECT_STREQ(KernelFormName(IntegerKernelForm::M256Avx2), "m256_avx2");
+    EXPECT_STREQ(KernelFormName(IntegerKernelForm::M128Sse41), "m128_sse41");
+}
+
 TEST(DispatchSettings, ForcedCountsStandInForTheDetectedOnes) {
     ScopedDispatch forced(InstructionLevel::SSE2, false);
+    DispatchSettings& settings = DispatchSettings::Instance();
+    // The five forced integers, in order, with their defaults.
     EXPECT_EQ(LogicalProcessorCount(), 64);
+    EXPECT_EQ(HighestStandardLeaf(), 32768);
+    EXPECT_EQ(InitialApicId(), 32768);
     EXPECT_EQ(PhysicalCoreCount(), 4);
-    EXPECT_EQ(DispatchSettings::Instance().GetForcedThreadsPerCore(), 2);
+    EXPECT_EQ(settings.GetForcedThreadsPerCore(), 2);
+    settings.SetForcedInitialApicId(3);
+    EXPECT_EQ(InitialApicId(), 3);
+    settings.SetForcedInitialApicId(32768);
 }
 
 TEST(DispatchSettings, DetectedModeFollowsTheProcessor) {
@@ -86,6 +115,7 @@ TEST(DispatchSettings, DetectedModeFollowsTheProcessor) {
     EXPECT_EQ(HasAVX(), cpu.osAvx);
     EXPECT_FALSE(HasWideVectors());
     EXPECT_EQ(LogicalProcessorCount(), cpu.logicalProcessors);
+    EXPECT_EQ(HighestStandardLeaf(), static_cast<int>(cpu.highestStandardLeaf));
     {
         ScopedDispatch forced(InstructionLevel::None, false);
         EXPECT_FALSE(HasSSE2());

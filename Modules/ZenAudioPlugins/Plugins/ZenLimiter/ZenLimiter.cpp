@@ -1,0 +1,276 @@
+#include "ZenLimiter.h"
+
+#include <QCoreApplication>
+#include <algorithm>
+#include <cmath>
+
+#include "Common/Decibels.h"
+#include "Common/ZenAudioPlugin.h"
+
+const zen::PluginDescriptor ZenLimiter::kDescriptor = {
+    "Limiter", 1.0, zen::kPluginStateOffered, zen::MakePluginCode('Z', 'n', 'L', 'r'),
+    32, 32, "ZenLimiter", 0, 0, -1, nullptr};
+
+namespace {
+
+constexpr float kTanhOne = 0.7615941559557649f;
+constexpr double kPi = 3.14159265358979323846;
+constexpr double kReferenceRate = 48000.0;  // of the look-ahead's length
+// The hold after each block, in units of (true-peak latency + look-ahead).
+constexpr std::uint64_t kHoldFactor = 4;
+// The release time constant, in units of the set release time.
+constexpr double kReleaseFactor = 4.0;
+
+float LevelDb(float peak, float silence) { return peak > 0.0f ? 20.0f * std::log10(peak) : silence; }
+
+// A raised-cosine window of `length` taps summing to 1, symmetric: its first
+// half, the middle included.
+std::vector<float> RampHalf(std::size_t length) {
+    std::vector<double> window(length);
+    double sum = 0.0;
+    for (std::size_t k = 0; k < length; ++k) {
+        const double s = std::sin(kPi * static_cast<double>(k + 1) / static_cast<double>(length + 1));
+        window[k] = s * s;
+        sum += window[k];
+    }
+    std::vector<float> half((length + 1) / 2);
+    for (std::size_t k = 0; k < half.size(); ++k) half[k] = static_cast<float>(window[k] / sum);
+    return half;
+}
+
+}  // namespace
+
+ZenLimiter::ZenLimiter() : m_ceiling(1, zen::DbToGainFloored(-kCeilingMarginDb)) {
+    InitParameters(Definitions());
+    AttachSmoothedValue(m_inputGain);
+    AttachSmoothedValue(m_ceiling);
+}
+
+ZenLimiter::~ZenLimiter() = default;
+
+const zen::ParameterTableDefinition& ZenLimiter::Definitions() {
+    static const zen::ParameterTableDefinition table = zen::MakeParameterTable(
+        "ZenLimiter",
+        {
+            zen::ContinuousParameter("INPUT_GAIN", QT_TRANSLATE_NOOP("ZenLimiter", "Input Gain"), -18.0f, 18.0f, 0.0f,
+                                     0.1f, "dB"),
+            zen::ContinuousParameter("THRESHOLD", QT_TRANSLATE_NOOP("ZenLimiter", "Ceiling"), -24.0f, 0.0f, 0.0f, 0.1f,
+                                     "dBTP"),
+            zen::ContinuousParameter("RELEASE", QT_TRANSLATE_NOOP("ZenLimiter", "Release"), 0.0f, 1000.0f, 1.0f, 0.01f,
+                                     "ms"),
+            zen::SwitchParameter("SOFT", QT_TRANSLATE_NOOP("ZenLimiter", "Soft"), 0.0f),
+        });
+    return table;
+}
+
+float ZenLimiter::Soften(float x, float knee) noexcept {
+    const float magnitude = std::fabs(x);
+    if (!(magnitude >= knee)) return x;
+    return std::copysign(knee * std::tanh(magnitude / knee) / kTanhOne, x);
+}
+
+bool ZenLimiter::OnParameterChanged(std::uint32_t index, float value) {
+    if (!ZenAudioPluginImpl::OnParameterChanged(index, value)) return false;
+    switch (index) {
+        case kInputGain: m_inputGain.SetTarget(zen::DbToGainFloored(value)); break;
+        case kCeiling:
+        case kSoft: SetCeilingTarget(); break;
+        default: break;
+    }
+    return true;
+}
+
+void ZenLimiter::SetCeilingTarget() {
+    m_ceiling.SetTarget(zen::DbToGainFloored(static_cast<double>(GetParameter(kCeiling)) - kCeilingMarginDb));
+}
+
+void ZenLimiter::UpdateProcessingParameter(std::uint32_t index, float value) {
+    if (index != kRelease) return;
+    const auto samples = static_cast<std::uint64_t>(static_cast<double>(GetSampleRate()) * value / 1000.0);
+    const double c = std::exp(-1.0 / (kReleaseFactor * static_cast<double>(std::max<std::uint64_t>(samples, 1))));
+    m_releaseCoeff = static_cast<float>(c);
+    m_releaseGain = static_cast<float>(1.0 - c);
+}
+
+void ZenLimiter::PrepareProcessing(float sampleRate, std::uint32_t maxBlockSize) {
+    const std::uint32_t channels = GetProcessChannelCount();
+    const double scale = sampleRate / kReferenceRate;
+    const ora::numeric::TruePeakConfig truePeak{1, 1.0f, ora::numeric::TruePeakFilter::Wideband};
+    m_truePeakLatency = static_cast<std::uint32_t>(ora::numeric::UpsamplerTruePeak_x4::Latency(truePeak.filter));
+    m_lookAheadLength = std::max(1u, static_cast<std::uint32_t>(std::lround(kLookAheadAt48k * scale)));
+    m_blockLength = kHoldsPerBlock * static_cast<std::uint32_t>(kHoldFactor * (m_truePeakLatency + m_lookAheadLength));
+
+    m_blockBuffer.Dimension(channels, maxBlockSize, m_blockLength + m_truePeakLatency);
+    m_lookAhead.Dimension(channels, maxBlockSize, m_lookAheadLength);
+    m_truePeaks.clear();
+    m_samplePeaks.clear();
+    for (std::uint32_t c = 0; c < channels; ++c) {
+        m_truePeaks.push_back(std::make_unique<ora::numeric::TruePeak>(truePeak));
+        m_samplePeaks.push_back(std::make_unique<ora::numeric::FindMinMax>(ora::numeric::FindMinMaxConfig{1}));
+    }
+    m_gains.assign(m_blockLength, 1.0f);
+    // A drop spreads over the look-ahead and ends just as the block that
+    // caused it arrives: a step would splatter, and its band-limited
+    // waveform overshoot the ceiling between samples.
+    const std::size_t rampLength = m_lookAheadLength + 1;
+    m_gainRamp.Reconfigure(ora::numeric::FIRSConfig{1, RampHalf(rampLength), rampLength});
+    m_lastChannelCount = channels;
+    SetLatency(m_blockLength + m_truePeakLatency + m_lookAheadLength);
+    Clear();
+}
+
+void ZenLimiter::ResetProcessing() { Clear(); }
+
+void ZenLimiter::Clear() noexcept {
+    m_blockBuffer.Reset();
+    m_lookAhead.Reset();
+    for (auto& truePeak : m_truePeaks) truePeak->Reset();
+    for (auto& samplePeak : m_samplePeaks) samplePeak->Reset();
+    m_blocks.fill(ChannelBlock{});
+    m_knee = kSoftKneeMax;
+    m_gain = 1.0f;
+    m_target = 1.0f;
+    m_hold = 0;
+    m_appliedGain = 1.0f;
+    m_gainRamp.Reset();
+    // The first block ends once the true-peak latency has passed: from then
+    // on a block's reading is complete as its first sample leaves the buffer.
+    m_position = m_blockLength - m_truePeakLatency;
+    for (std::uint32_t c = 0; c < kMaxChannels; ++c) {
+        m_inputTruePeak[c].store(0.0f, std::memory_order_relaxed);
+        m_outputPeak[c].store(0.0f, std::memory_order_relaxed);
+    }
+    m_gainMeter.store(1.0f, std::memory_order_relaxed);
+}
+
+void ZenLimiter::FinishBlock(std::uint32_t channelCount, float ceiling) noexcept {
+    const bool softOn = GetParameter(kSoft) != 0.0f;
+    const float knee = std::max(kSoftKneeMin, std::min(ceiling, kSoftKneeMax));
+    float peak = 0.0f;
+    for (std::uint32_t c = 0; c < channelCount; ++c) {
+        ChannelBlock& block = m_blocks[c];
+        m_callInputPeak[c] = std::max(m_callInputPeak[c], block.truePeak);
+        block.soft = softOn && block.truePeak > ceiling;
+        // The soft curve rises with |x|, so the block's largest softened
+        // sample is its largest sample softened.
+        peak = std::max(peak, block.soft ? Soften(block.samplePeak, knee) : block.truePeak);
+        block.truePeak = 0.0f;
+    }
+    m_knee = knee;
+    m_target = peak > 0.0f ? std::min(1.0f, ceiling / peak) : 1.0f;
+    m_hold = kHoldFactor * (m_truePeakLatency + m_lookAheadLength);
+    m_callFinishedBlock = true;
+}
+
+void ZenLimiter::ApplyGain(float* const* channels, std::uint32_t channelCount, std::size_t offset,
+                           std::size_t frames) noexcept {
+    float g = m_gain;
+    for (std::size_t i = 0; i < frames; ++i) {
+        if (g > m_target) {
+            g = m_target;  // instant attack
+        } else if (m_hold > 0) {
+            --m_hold;
+        } else {
+            g = m_releaseGain * m_target + m_releaseCoeff * g;
+        }
+        g = std::min(g, 1.0f);
+        m_gains[i] = 1.0f - g;
+    }
+    m_gain = g;
+    // The reduction is ramped, not the gain, so that unity stays exact.
+    m_gainRamp.Process(m_gains.data(), m_gains.data(), frames);
+    for (std::size_t i = 0; i < frames; ++i) m_gains[i] = 1.0f - m_gains[i];
+    m_appliedGain = m_gains[frames - 1];
+    for (std::uint32_t c = 0; c < channelCount; ++c)
+        m_vec.Multiply(channels[c] + offset, m_gains.data(), channels[c] + offset, frames);
+}
+
+void ZenLimiter::ProcessBlock(float* const* channels, std::uint32_t channelCount, std::uint32_t frames) noexcept {
+    if (channelCount != m_lastChannelCount || channelCount > m_truePeaks.size()) {
+        Clear();
+        m_lastChannelCount = channelCount;
+        channelCount = std::min<std::uint32_t>(channelCount, static_cast<std::uint32_t>(m_truePeaks.size()));
+    }
+    for (std::uint32_t c = 0; c < channelCount; ++c) {
+        auto gain = m_inputGain.Track(c);
+        float* x = channels[c];
+        for (std::uint32_t i = 0; i < frames; ++i) x[i] *= static_cast<float>(gain.Next());
+    }
+
+    std::fill_n(m_callInputPeak, channelCount, 0.0f);
+    m_callFinishedBlock = false;
+    // A block's sample peak is complete the true-peak latency before its
+    // true peak, at this position.
+    const std::uint32_t samplePeakDone = m_blockLength - m_truePeakLatency;
+    auto ceilingCursor = m_ceiling.Track(0);
+    float ceiling = 0.0f;
+    for (std::uint32_t done = 0; done < frames;) {
+        const std::uint32_t boundary = m_position < samplePeakDone ? samplePeakDone : m_blockLength;
+        const std::uint32_t n = std::min(frames - done, boundary - m_position);
+        for (std::uint32_t c = 0; c < channelCount; ++c) {
+            float* x = channels[c] + done;
+            ChannelBlock& block = m_blocks[c];
+            block.truePeak = std::max(block.truePeak, m_truePeaks[c]->Process(x, n));
+            m_samplePeaks[c]->Process(x, n);
+            m_blockBuffer.ProcessChannel(c, x, n);
+            if (block.soft)
+                for (std::uint32_t i = 0; i < n; ++i) x[i] = Soften(x[i], m_knee);
+            m_lookAhead.ProcessChannel(c, x, n);
+        }
+        ApplyGain(channels, channelCount, done, n);
+        for (std::uint32_t i = 0; i < n; ++i) ceiling = static_cast<float>(ceilingCursor.Next());
+        m_position += n;
+        done += n;
+        if (m_position == samplePeakDone) {
+            for (std::uint32_t c = 0; c < channelCount; ++c) {
+                m_blocks[c].samplePeak = m_samplePeaks[c]->GetPeak(0);
+                m_samplePeaks[c]->Reset();
+            }
+        }
+        if (m_position == m_blockLength) {
+            FinishBlock(channelCount, ceiling);
+            m_position = 0;
+        }
+    }
+
+    for (std::uint32_t c = 0; c < channelCount; ++c) {
+        const float* y = channels[c];
+        float peak = 0.0f;
+        for (std::uint32_t i = 0; i < frames; ++i) peak = std::max(peak, std::fabs(y[i]));
+        m_outputPeak[c].store(peak, std::memory_order_relaxed);
+        if (m_callFinishedBlock) m_inputTruePeak[c].store(m_callInputPeak[c], std::memory_order_relaxed);
+    }
+    m_gainMeter.store(m_appliedGain, std::memory_order_relaxed);
+}
+
+std::uint32_t ZenLimiter::GetMeterCount() const { return 1 + 2 * GetProcessChannelCount(); }
+
+bool ZenLimiter::GetMeterInfo(std::uint32_t index, zen::MeterInfo& info) const {
+    if (index >= GetMeterCount()) return false;
+    if (index == kGainMeter) {
+        info.name = QCoreApplication::translate("ZenLimiter", "Gain Reduction").toStdString();
+        info.unit = "dB";
+        info.minimum = kGainMeterFloorDb;
+        info.maximum = 0.0f;
+        return true;
+    }
+    const std::uint32_t channel = (index - 1) / 2;
+    const bool input = (index - 1) % 2 == 0;
+    const QString name = input ? QCoreApplication::translate("ZenLimiter", "Input True Peak %1")
+                               : QCoreApplication::translate("ZenLimiter", "Output Peak %1");
+    info.name = name.arg(channel + 1).toStdString();
+    info.unit = input ? "dBTP" : "dBFS";
+    info.minimum = kLevelMeterFloorDb;
+    info.maximum = input ? 24.0f : 0.0f;  // input gain reaches +18 dB
+    return true;
+}
+
+float ZenLimiter::GetMeter(std::uint32_t index) const {
+    if (index >= GetMeterCount()) return 0.0f;
+    if (index == kGainMeter) return LevelDb(m_gainMeter.load(std::memory_order_relaxed), kGainMeterFloorDb);
+    const std::uint32_t channel = (index - 1) / 2;
+    const auto& peaks = (index - 1) % 2 == 0 ? m_inputTruePeak : m_outputPeak;
+    return LevelDb(peaks[channel].load(std::memory_order_relaxed), kLevelMeterFloorDb);
+}
+
+template class ZenAudioPlugin<ZenLimiter>;

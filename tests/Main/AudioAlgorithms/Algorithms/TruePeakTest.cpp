@@ -1,0 +1,318 @@
+// True-peak measurement: the EBU Tech 3341 kind of test signals with their
+// expected dBTP, accuracy over frequency, latency, block splits, and every
+// form of UpsamplerTruePeak_x4 and TruePeak against ref.
+//
+// EBU Tech 3341 accepts a true-peak reading from -0.4 dB to +0.2 dB of the
+// expected value. The signals are built here with analytically known true
+// peaks: sines at fs/4 and fs/6 whose crests fall between samples, the fs/4
+// sine whose samples are all +-1.0 while its true peak is +3.01 dBTP, a
+// 1 kHz sine, a smoothly gated burst and a single full-scale sample.
+#include <gtest/gtest.h>
+
+#include <cmath>
+
+#include "Algorithms/TruePeak.h"
+#include "Algorithms/UpsamplerTruePeak_x4.h"
+#include "KernelForms.h"
+
+using namespace kerneltest;
+using ora::numeric::TruePeak;
+using ora::numeric::TruePeakConfig;
+using ora::numeric::TruePeakFilter;
+using ora::numeric::UpsamplerTruePeak_x4;
+using ora::numeric::UpsamplerTruePeakConfig;
+using ora::system::ScopedDispatch;
+
+namespace {
+
+constexpr double kPi = 3.14159265358979323846;
+
+std::vector<float> Sine(double frequency, double rate, std::size_t frames, double amplitude, double phase) {
+    std::vector<float> x(frames);
+    for (std::size_t n = 0; n < frames; ++n)
+        x[n] = static_cast<float>(amplitude * std::sin(2.0 * kPi * frequency * static_cast<double>(n) / rate + phase));
+    return x;
+}
+
+double Db(double gain) { return 20.0 * std::log10(gain); }
+
+// Raised-cosine fades at both ends, so that the signal starts and ends in
+// silence without an edge.
+std::vector<float> Faded(std::vector<float> x, std::size_t fade = 200) {
+    for (std::size_t n = 0; n < fade && n < x.size(); ++n) {
+        const auto g = static_cast<float>(0.5 - 0.5 * std::cos(kPi * static_cast<double>(n) / fade));
+        x[n] *= g;
+        x[x.size() - 1 - n] *= g;
+    }
+    return x;
+}
+
+// The largest reading over the signal, leaving out its first and last
+// 100 samples: a sine switched on or off at once is another signal, whose
+// band-limited waveform overshoots at the edges. Test signals that start and
+// end in silence lose nothing.
+double Reading(const std::vector<float>& x, std::size_t block = 0, TruePeakFilter filter = TruePeakFilter::Standard) {
+    constexpr std::size_t kEdge = 100;
+    TruePeak meter(TruePeakConfig{1, 1.0f, filter});
+    if (block == 0) block = x.size();
+    float peak = 0.0f;
+    for (std::size_t done = 0; done < x.size(); done += block) {
+        const std::size_t n = std::min(block, x.size() - done);
+        // Blocks straddling an edge are split there.
+        const std::size_t latency = meter.GetLatency();
+        for (std::size_t i = 0; i < n;) {
+            const std::size_t at = done + i;
+            const std::size_t next = at < kEdge + latency ? kEdge + latency : x.size();
+            const std::size_t m = std::min(n - i, next - at);
+            const float reading = meter.Process(x.data() + at, m);
+            if (at >= kEdge + latency) peak = std::max(peak, reading);
+            i += m;
+        }
+    }
+    return peak;
+}
+
+struct Case {
+    const char* what;
+    std::vector<float> signal;
+    double expectedDb;
+};
+
+std::vector<Case> Tech3341Cases() {
+    const double rate = 48000.0;
+    const std::size_t frames = 48000;
+    std::vector<Case> cases;
+    // fs/4, crest 45 degrees from the samples: samples at -9.03 dBFS.
+    cases.push_back({"12 kHz at 45 degrees, -6 dBTP", Sine(12000, rate, frames, 0.5, kPi / 4), -6.0206});
+    // fs/6, crest halfway between samples: samples at -7.27 dBFS.
+    cases.push_back({"8 kHz, crest between samples, -6 dBTP", Sine(8000, rate, frames, 0.5, kPi / 3), -6.0206});
+    // Samples 1, 1, -1, -1: a 0 dBFS sample peak, +3.01 dBTP.
+    cases.push_back(
+        {"12 kHz at 45 degrees, samples at 0 dBFS", Sine(12000, rate, frames, std::sqrt(2.0), kPi / 4), 3.0103});
+    cases.push_back({"1 kHz, 0 dBTP", Sine(1000, rate, frames, 1.0, 0.37), 0.0});
+    // A 6 kHz burst of 10 ms with 2 ms raised-cosine edges, -3 dBTP.
+    std::vector<float> burst(frames, 0.0f);
+    const std::vector<float> tone = Sine(6000, rate, 480, std::pow(10.0, -3.0 / 20.0), 0.9);
+    for (std::size_t n = 0; n < 480; ++n) {
+        const double edge = std::min(1.0, std::min(double(n), double(479 - n)) / 96.0);
+        burst[20000 + n] = static_cast<float>(tone[n] * 0.5 * (1.0 - std::cos(kPi * edge)));
+    }
+    cases.push_back({"6 kHz burst, -3 dBTP", burst, -3.0});
+    std::vector<float> impulse(4800, 0.0f);
+    impulse[2400] = 1.0f;
+    cases.push_back({"single full-scale sample", impulse, 0.0});
+    return cases;
+}
+
+}  // namespace
+
+TEST(TruePeak, ReadsTheTech3341SignalsWithinTolerance) {
+    for (TruePeakFilter filter : {TruePeakFilter::Standard, TruePeakFilter::Wideband}) {
+        for (const Case& c : Tech3341Cases()) {
+            const double reading = Db(Reading(c.signal, 0, filter));
+            EXPECT_LE(reading, c.expectedDb + 0.2) << c.what;
+            EXPECT_GE(reading, c.expectedDb - 0.4) << c.what;
+            // Tighter than the tolerance: the refined reading is within 0.05 dB.
+            EXPECT_NEAR(reading, c.expectedDb, 0.05) << c.what;
+        }
+    }
+}
+
+TEST(TruePeak, SinesUpTo15kHzReadWithinAFewHundredthsOfADecibel) {
+    // Crests at every offset between samples, at rates where 15 kHz is the
+    // highest share of the band (44.1 kHz) and at fs/3, fs/4, where plain 4x
+    // points miss the crest the most.
+    double worst = 0.0;
+    for (TruePeakFilter filter : {TruePeakFilter::Standard, TruePeakFilter::Wideband})
+        for (double rate : {44100.0, 48000.0, 96000.0}) {
+            for (double frequency :
+                 {100.0, 997.0, 5000.0, 11025.0, 12000.0, 14700.0, 15000.0, rate / 3.0, rate / 4.0}) {
+                if (frequency > 15000.0) continue;
+                for (int k = 0; k < 8; ++k) {
+                    const double phase = 2.0 * kPi * k / 8.0 + 0.05;
+                    const double reading = Db(Reading(Sine(frequency, rate, 4096, 0.5, phase), 0, filter));
+                    worst = std::max(worst, std::fabs(reading - Db(0.5)));
+                    EXPECT_NEAR(reading, Db(0.5), 0.03) << frequency << " Hz at " << rate << ", phase " << k;
+                }
+            }
+        }
+    std::printf("worst true-peak error of sines up to 15 kHz: %.4f dB\n", worst);
+}
+
+TEST(TruePeak, TheWidebandFilterReadsSinesUpTo046OfTheRate) {
+    // Beyond the standard filter's band (0.34 of the rate).
+    for (double f : {0.36, 0.4, 0.43, 0.46}) {
+        for (int k = 0; k < 8; ++k) {
+            const double phase = 2.0 * kPi * k / 8.0 + 0.05;
+            const std::vector<float> x = Sine(f, 1.0, 4096, 0.5, phase);
+            EXPECT_NEAR(Db(Reading(x, 0, TruePeakFilter::Wideband)), Db(0.5), 0.05) << f << " phase " << k;
+        }
+    }
+}
+
+TEST(TruePeak, LatencyBlockSplitsFactorAndReset) {
+    EXPECT_EQ(TruePeak().GetLatency(), 6u);
+    EXPECT_EQ(TruePeak(TruePeakConfig{1, 1.0f, TruePeakFilter::Wideband}).GetLatency(), 24u);
+    EXPECT_EQ(UpsamplerTruePeak_x4().GetLatency(), 6u);
+    // An impulse enters the reading only once the latency has passed.
+    {
+        TruePeak meter;
+        std::vector<float> x(7, 0.0f);
+        x[0] = 1.0f;
+        EXPECT_LT(meter.Process(x.data(), 6), 1.0f);
+        EXPECT_FLOAT_EQ(meter.Process(x.data() + 6, 1), 1.0f);
+    }
+    // Any split of the stream gives the same largest reading.
+    const std::vector<float> x = RandomFloats(3000, 4);
+    const double whole = Reading(x);
+    for (std::size_t block : {1u, 5u, 64u, 257u}) EXPECT_EQ(Reading(x, block), whole) << block;
+
+    TruePeak scaled(TruePeakConfig{1, 0.5f});
+    EXPECT_FLOAT_EQ(scaled.Process(x.data(), x.size()) * 2.0f, TruePeak().Process(x.data(), x.size()));
+
+    // After a reset the meter has forgotten the loud history.
+    TruePeak meter;
+    std::vector<float> loud(50, 1.0f), quiet(50, 0.0f);
+    meter.Process(loud.data(), loud.size());
+    meter.Reset();
+    EXPECT_EQ(meter.Process(quiet.data(), quiet.size()), 0.0f);
+}
+
+TEST(TruePeak, ChannelsAreMeasuredApart) {
+    const std::vector<float> a = Faded(Sine(1000, 48000, 2000, 0.25, 0.0));
+    const std::vector<float> b = Faded(Sine(3000, 48000, 2000, 0.75, 1.0));
+    TruePeak meter(TruePeakConfig{2, 1.0f});
+    const float* channels[2] = {a.data(), b.data()};
+    const float both = meter.Process(channels, 2000);
+    EXPECT_NEAR(meter.GetChannelPeak(0), 0.25, 0.001);
+    EXPECT_NEAR(meter.GetChannelPeak(1), 0.75, 0.002);
+    EXPECT_EQ(both, meter.GetChannelPeak(1));
+}
+
+TEST(UpsamplerTruePeak_x4, InterpolatesBandLimitedSignalsBetweenSamples) {
+    // Phase 0 is the input itself, delayed; phases 1 to 3 land on the
+    // waveform a quarter, a half and three quarters of a sample later, to
+    // within the design's error up to its band edge.
+    struct Design {
+        TruePeakFilter filter;
+        std::size_t latency;
+        double bandEdge;
+        double error;
+    } designs[] = {{TruePeakFilter::Standard, 6, 0.34, 0.0016}, {TruePeakFilter::Wideband, 24, 0.46, 0.005}};
+    for (const Design& design : designs) {
+        for (double f : {0.0, 0.01, 0.1, 0.25, 0.3, 0.34, 0.4, 0.46}) {
+            if (f > design.bandEdge) continue;
+            const std::size_t frames = 600;
+            const std::vector<float> x = Sine(f, 1.0, frames, 1.0, 0.3);
+            std::vector<float> y(4 * frames);
+            UpsamplerTruePeak_x4 upsampler(UpsamplerTruePeakConfig{1, design.filter});
+            EXPECT_EQ(upsampler.GetLatency(), design.latency);
+            upsampler.Process(x.data(), y.data(), frames);
+            double worst = 0.0;
+            for (std::size_t m = 4 * 100; m < y.size(); ++m) {
+                const double t = static_cast<double>(m) / 4.0 - static_cast<double>(design.latency);
+                if (m % 4 == 0) {
+                    ASSERT_EQ(y[m], x[m / 4 - design.latency]);
+                }
+                worst = std::max(worst, std::fabs(y[m] - std::sin(2.0 * kPi * f * t + 0.3)));
+            }
+            EXPECT_LT(worst, design.error) << "at " << f << " of the rate";
+        }
+    }
+}
+
+TEST(UpsamplerTruePeak_x4, EveryFormGivesTheReferenceResult) {
+    const std::size_t total = AwkwardTotal();
+    const std::vector<float> x = RandomFloats(total, 9);
+    for (TruePeakFilter filter : {TruePeakFilter::Standard, TruePeakFilter::Wideband}) {
+        const UpsamplerTruePeakConfig config{1, filter};
+        std::vector<float> reference(4 * total);
+        {
+            ScopedDispatch forced(InstructionLevel::None, false);
+            UpsamplerTruePeak_x4 ref(config);
+            ref.Process(x.data(), reference.data(), total);
+        }
+        // Inputs below 1: a fused form stays within 2 ULPs of the sum of
+        // |taps| per tap.
+        const std::size_t taps = UpsamplerTruePeak_x4::TapsPerPhase(filter);
+        const float* phases = UpsamplerTruePeak_x4::PhaseTaps(filter);
+        double sumOfTaps = 0.0;
+        for (std::size_t i = 0; i < 3 * taps; ++i) sumOfTaps += std::fabs(phases[i]);
+        const double bound = static_cast<double>(taps) * std::ldexp(sumOfTaps, -22);
+        for (const Form& form : AllForms()) {
+            if (!Runnable(form)) continue;
+            ScopedDispatch forced(form.level, form.fma);
+            const char* name = ora::system::KernelFormName(form.form);
+            UpsamplerTruePeak_x4 upsampler(config);
+            EXPECT_STREQ(upsampler.FormName(), name);
+            std::size_t position = 0;
+            for (std::size_t n : AwkwardLengths()) {
+                Guarded<> in(n), out(4 * n);
+                std::copy_n(x.begin() + position, n, in.data());
+                upsampler.Process(in.data(), out.data(), n);
+                ASSERT_TRUE(out.GuardsIntact()) << name << " length " << n;
+                for (std::size_t i = 0; i < 4 * n; ++i) {
+                    const float want = reference[4 * position + i];
+                    if (Fused(form.form))
+                        ASSERT_NEAR(out[i], want, bound) << name;
+                    else
+                        ASSERT_EQ(out[i], want) << name << " at " << 4 * position + i;
+                }
+                position += n;
+            }
+        }
+    }
+}
+
+TEST(TruePeak, EveryFormGivesTheReferenceReading) {
+    std::vector<std::vector<float>> signals;
+    for (const Case& c : Tech3341Cases()) signals.push_back(c.signal);
+    signals.push_back(RandomFloats(5000, 3));
+    for (const Form& form : AllForms()) {
+        if (!Runnable(form)) continue;
+        for (const auto& signal : signals) {
+            float want;
+            {
+                ScopedDispatch forced(InstructionLevel::None, false);
+                want = TruePeak().Process(signal.data(), signal.size());
+            }
+            ScopedDispatch forced(form.level, form.fma);
+            const char* name = ora::system::KernelFormName(form.form);
+            TruePeak meter;
+            EXPECT_STREQ(meter.FormName(), name);
+            const float got = meter.Process(signal.data(), signal.size());
+            if (Fused(form.form))
+                EXPECT_LE(UlpDistance(got, want), 64) << name;
+            else
+                EXPECT_EQ(got, want) << name;
+        }
+        // Odd lengths from misaligned buffers, each reading against ref.
+        ScopedDispatch forced(form.level, form.fma);
+        const char* name = ora::system::KernelFormName(form.form);
+        TruePeak meter;
+        std::size_t position = 0;
+        const std::vector<float> x = RandomFloats(6000, 21);
+        std::vector<float> wants;
+        {
+            ScopedDispatch ref(InstructionLevel::None, false);
+            TruePeak refMeter;
+            for (std::size_t n : AwkwardLengths()) {
+                wants.push_back(refMeter.Process(x.data() + position, n));
+                position += n;
+            }
+        }
+        position = 0;
+        std::size_t index = 0;
+        for (std::size_t n : AwkwardLengths()) {
+            Guarded<> in(n);
+            std::copy_n(x.begin() + position, n, in.data());
+            const float got = meter.Process(in.data(), n);
+            if (Fused(form.form))
+                EXPECT_LE(UlpDistance(got, wants[index]), 64) << name << " length " << n;
+            else
+                EXPECT_EQ(got, wants[index]) << name << " length " << n;
+            position += n;
+            ++index;
+        }
+    }
+}
