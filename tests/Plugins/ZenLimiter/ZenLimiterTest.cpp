@@ -125,7 +125,7 @@ double OutputTruePeak(const std::vector<float>& output) {
 // that each rate meets each ceiling and each block size. Returns the closest
 // approach to the ceiling in dB (negative: under it).
 double ExpectCeilingHolds(const std::string& name, const std::function<std::vector<float>(double rate)>& make,
-                          float gainDb = 0.0f) {
+                          float gainDb = 0.0f, bool soft = false) {
     double closest = -100.0;
     for (std::size_t r = 0; r < std::size(kRates); ++r) {
         for (std::size_t k = 0; k < 2; ++k) {
@@ -136,6 +136,7 @@ double ExpectCeilingHolds(const std::string& name, const std::function<std::vect
             settings.ceilingDb = ceiling;
             settings.inputGainDb = gainDb;
             settings.releaseMs = k == 0 ? 1.0f : 0.0f;
+            settings.soft = soft;
             const std::vector<float> output = Limit(make(rate), settings, rate, block);
             const double peak = Db(OutputTruePeak(output));
             closest = std::max(closest, peak - ceiling);
@@ -273,6 +274,19 @@ TEST(ZenLimiter, NoiseAndMusicLikeMaterialStayUnderTheCeiling) {
                       "full-scale noise +12 dB", [](double) { return zentest::Noise(kFrames, 1.0, 4); }, 12.0f),
                   ExpectCeilingHolds(
                       "music-like", [](double rate) { return MusicLike(rate, kFrames); }, 6.0f)}));
+}
+
+TEST(ZenLimiter, WithSoftOnTheCeilingStillHolds) {
+    // The soft curve's harmonics put new peaks between samples.
+    ReportClosest(std::max(
+        {ExpectCeilingHolds(
+             "full-scale noise, soft", [](double) { return zentest::Noise(kFrames, 1.0, 5); }, 6.0f, true),
+         ExpectCeilingHolds(
+             "sine 9 kHz, soft", [](double rate) { return zentest::Sine(9000.0, rate, kFrames, 1.0); }, 6.0f, true),
+         ExpectCeilingHolds(
+             "square 3 kHz, soft", [](double rate) { return Square(3000.0, rate, kFrames, 1.0); }, 6.0f, true),
+         ExpectCeilingHolds(
+             "music-like, soft", [](double rate) { return MusicLike(rate, kFrames); }, 6.0f, true)}));
 }
 
 TEST(ZenLimiter, SinesAbove15kHzOvershootByLittle) {

@@ -103,9 +103,12 @@ void ZenLimiter::PrepareProcessing(float sampleRate, std::uint32_t maxBlockSize)
     m_blockBuffer.Dimension(channels, maxBlockSize, m_blockLength + m_truePeakLatency);
     m_lookAhead.Dimension(channels, maxBlockSize, m_lookAheadLength);
     m_truePeaks.clear();
+    m_softTruePeaks.clear();
     m_samplePeaks.clear();
+    m_softened.assign(maxBlockSize, 0.0f);
     for (std::uint32_t c = 0; c < channels; ++c) {
         m_truePeaks.push_back(std::make_unique<ora::numeric::TruePeak>(truePeak));
+        m_softTruePeaks.push_back(std::make_unique<ora::numeric::TruePeak>(truePeak));
         m_samplePeaks.push_back(std::make_unique<ora::numeric::FindMinMax>(ora::numeric::FindMinMaxConfig{1}));
     }
     m_gains.assign(m_blockLength, 1.0f);
@@ -125,6 +128,8 @@ void ZenLimiter::Clear() noexcept {
     m_blockBuffer.Reset();
     m_lookAhead.Reset();
     for (auto& truePeak : m_truePeaks) truePeak->Reset();
+    for (auto& truePeak : m_softTruePeaks) truePeak->Reset();
+    m_softMeasuring = false;
     for (auto& samplePeak : m_samplePeaks) samplePeak->Reset();
     m_blocks.fill(ChannelBlock{});
     m_knee = kSoftKneeMax;
@@ -152,9 +157,11 @@ void ZenLimiter::FinishBlock(std::uint32_t channelCount, float ceiling) noexcept
         m_callInputPeak[c] = std::max(m_callInputPeak[c], block.truePeak);
         block.soft = softOn && block.truePeak > ceiling;
         // The soft curve rises with |x|, so the block's largest softened
-        // sample is its largest sample softened.
-        peak = std::max(peak, block.soft ? Soften(block.samplePeak, knee) : block.truePeak);
+        // sample is its largest sample softened; its harmonics add peaks
+        // between samples, read from the softened copy.
+        peak = std::max(peak, block.soft ? std::max(Soften(block.samplePeak, knee), block.softTruePeak) : block.truePeak);
         block.truePeak = 0.0f;
+        block.softTruePeak = 0.0f;
     }
     m_knee = knee;
     m_target = peak > 0.0f ? std::min(1.0f, ceiling / peak) : 1.0f;
@@ -204,6 +211,15 @@ void ZenLimiter::ProcessBlock(float* const* channels, std::uint32_t channelCount
     const std::uint32_t samplePeakDone = m_blockLength - m_truePeakLatency;
     auto ceilingCursor = m_ceiling.Track(0);
     float ceiling = 0.0f;
+    // The softened copy is measured only while Soft is on; its readers start
+    // from silence when it is switched on.
+    const bool softOn = GetParameter(kSoft) != 0.0f;
+    if (softOn && !m_softMeasuring)
+        for (auto& truePeak : m_softTruePeaks) truePeak->Reset();
+    m_softMeasuring = softOn;
+    const float measureKnee =
+        std::max(kSoftKneeMin, std::min(static_cast<float>(m_ceiling[0].current.load(std::memory_order_relaxed)),
+                                        kSoftKneeMax));
     for (std::uint32_t done = 0; done < frames;) {
         const std::uint32_t boundary = m_position < samplePeakDone ? samplePeakDone : m_blockLength;
         const std::uint32_t n = std::min(frames - done, boundary - m_position);
@@ -211,6 +227,10 @@ void ZenLimiter::ProcessBlock(float* const* channels, std::uint32_t channelCount
             float* x = channels[c] + done;
             ChannelBlock& block = m_blocks[c];
             block.truePeak = std::max(block.truePeak, m_truePeaks[c]->Process(x, n));
+            if (softOn) {
+                for (std::uint32_t i = 0; i < n; ++i) m_softened[i] = Soften(x[i], measureKnee);
+                block.softTruePeak = std::max(block.softTruePeak, m_softTruePeaks[c]->Process(m_softened.data(), n));
+            }
             m_samplePeaks[c]->Process(x, n);
             m_blockBuffer.ProcessChannel(c, x, n);
             if (block.soft)

@@ -15,8 +15,9 @@
 // The true peak is read with the wideband 4x interpolator: the standard
 // 48-tap one misses much of what content near Nyquist (noise, squares,
 // clipped material) adds between samples. With "Soft" on, a block over the
-// ceiling is softened and then held to the ceiling by its largest sample, so
-// its peaks between samples may pass the ceiling.
+// ceiling is softened, and held by the larger of its largest softened sample
+// and the true peak of the softened signal (the curve adds harmonics whose
+// peaks fall between samples), so the ceiling holds with Soft on too.
 #pragma once
 
 #include <array>
@@ -110,6 +111,9 @@ private:
     zen::Delay m_blockBuffer;  // block length + true-peak latency
     zen::Delay m_lookAhead;
     std::vector<std::unique_ptr<ora::numeric::TruePeak>> m_truePeaks;  // one per channel
+    std::vector<std::unique_ptr<ora::numeric::TruePeak>> m_softTruePeaks;  // of the softened input
+    std::vector<float> m_softened;  // a segment softened, for its true peak
+    bool m_softMeasuring = false;
     std::vector<std::unique_ptr<ora::numeric::FindMinMax>> m_samplePeaks;
     ora::numeric::Vec m_vec;
     ora::numeric::FIRS m_gainRamp;  // spreads each drop over the look-ahead
@@ -117,6 +121,7 @@ private:
 
     struct ChannelBlock {
         float truePeak = 0.0f;    // running, of the block being measured
+        float softTruePeak = 0.0f;  // running, of the same block softened (Soft on)
         float samplePeak = 0.0f;  // of the block being measured, once complete
         bool soft = false;        // the block leaving the buffer takes the soft stage
     };
