@@ -30,7 +30,10 @@ build: configure
 run: build
 	@$(ZENFX) demo -o $(BUILD_DIR)/demo-input.wav
 	@$(ZENFX) process -o $(BUILD_DIR)/demo-output.wav \
-	    --plugin "Soft Clipper" --set Threshold=6 --set Shape=0.8 --set "Output Level=-1" \
+	    --plugin "De-Esser" \
+	    --plugin "Reverb" --preset "Studio Live Room" \
+	    --plugin "Soft Clipper" --preset "Gentle Rounding" \
+	    --plugin "Limiter" --set Ceiling=-1 \
 	    --meters-json $(BUILD_DIR)/demo-meters.json
 	@echo "Listen to $(BUILD_DIR)/demo-input.wav and $(BUILD_DIR)/demo-output.wav"
 
