@@ -20,26 +20,6 @@ double EnergyChangeDb(const std::vector<float>& out, const std::vector<float>& i
 
 }  // namespace
 
-TEST(ZenDeesser, DescriptorAndParameters) {
-    PluginHarness plugin("De-Esser");
-    const zen::PluginDescriptor* d = plugin.Instance().GetDescriptor();
-    EXPECT_EQ(std::tuple(d->code, d->version, d->inputChannelLimit, d->outputChannelLimit, d->listFlags),
-              std::tuple(1516596851, 1.0, 2u, 2u, 0u));  // "Zens"
-    EXPECT_STREQ(d->className, "ZenDeesser");
-    // Label and identifier cross on purpose: "Range" is the mode, RANGE the frequency.
-    const std::tuple<std::string, std::string, std::vector<float>> rows[] = {
-        {"ZenDeesser::ESS_ONLY", "Ess Only", {0, 1, 0, 1}}, {"ZenDeesser::RANGE", "Frequency", {700, 9000, 7000, 1}},
-        {"ZenDeesser::MODE", "Range", {0, 2, 0, 1}}, {"ZenDeesser::AMOUNT", "Amount", {0, 100, 50, 0.1f}}};
-    ASSERT_EQ(plugin.Audio().GetParameterCount(), 4u);
-    for (std::uint32_t i = 0; i < 4; ++i) {
-        zen::ParameterInfo info;
-        plugin.Audio().GetParameterInfo(i, info);
-        EXPECT_EQ(std::tuple(info.identifier, info.label, std::vector<float>{info.minimum, info.maximum,
-                                                                             info.defaultValue, info.step}),
-                  rows[i]);
-    }
-}
-
 TEST(ZenDeesser, ReducesSibilantsAndLeavesTheRestOfTheSpectrum) {
     for (float rate : {44100.0f, 48000.0f, 96000.0f}) {
         const zentest::SpeechLike speech = zentest::MakeSpeechLike(rate);

@@ -149,68 +149,46 @@ double ExpectCeilingHolds(const std::string& name, const std::function<std::vect
 
 void ReportClosest(double closest) { std::printf("closest approach to the ceiling: %+.3f dB\n", closest); }
 
+// Sines of 1.5 at two phases, one on a crest between samples.
+double SinesHold(std::initializer_list<double> frequencies) {
+    double closest = -100.0;
+    for (double frequency : frequencies) {
+        for (double phase : {0.7, kPi / 4}) {
+            const auto sine = [&](double rate) { return zentest::Sine(frequency, rate, kFrames, 1.5, phase); };
+            closest = std::max(closest, ExpectCeilingHolds("sine " + std::to_string(frequency) + " Hz", sine));
+        }
+    }
+    return closest;
+}
+
 }  // namespace
 
-TEST(ZenLimiter, DescriptorParametersAndMeters) {
+TEST(ZenLimiter, MetersPerChannelAndTheirRestingValues) {
     PluginHarness plugin("Limiter");
-    const zen::PluginDescriptor* d = plugin.Instance().GetDescriptor();
-    EXPECT_STREQ(d->name, "Limiter");
-    EXPECT_EQ(d->code, 1517177970);
-    EXPECT_EQ(d->version, 1.0);
-    EXPECT_EQ(d->inputChannelLimit, 32u);
-    EXPECT_EQ(d->outputChannelLimit, 32u);
-    EXPECT_STREQ(d->className, "ZenLimiter");
-    EXPECT_EQ(d->listFlags, 0u);
-    struct Row {
-        const char* identifier;
-        const char* label;
-        zen::ParameterKind kind;
-        float minimum, maximum, defaultValue, step;
-        const char* unit;
-    } rows[] = {
-        {"ZenLimiter::INPUT_GAIN", "Input Gain", zen::ParameterKind::Continuous, -18, 18, 0, 0.1f, "dB"},
-        {"ZenLimiter::THRESHOLD", "Ceiling", zen::ParameterKind::Continuous, -24, 0, 0, 0.1f, "dBTP"},
-        {"ZenLimiter::RELEASE", "Release", zen::ParameterKind::Continuous, 0, 1000, 1, 0.01f, "ms"},
-        {"ZenLimiter::SOFT", "Soft", zen::ParameterKind::Switch, 0, 1, 0, 1, ""},
-    };
-    ASSERT_EQ(plugin.Audio().GetParameterCount(), 4u);
-    for (std::uint32_t i = 0; i < 4; ++i) {
-        zen::ParameterInfo info;
-        ASSERT_TRUE(plugin.Audio().GetParameterInfo(i, info));
-        EXPECT_EQ(info.identifier, rows[i].identifier);
-        EXPECT_EQ(info.label, rows[i].label);
-        EXPECT_EQ(info.kind, rows[i].kind);
-        EXPECT_EQ(info.minimum, rows[i].minimum);
-        EXPECT_EQ(info.maximum, rows[i].maximum);
-        EXPECT_EQ(info.defaultValue, rows[i].defaultValue);
-        EXPECT_EQ(info.step, rows[i].step);
-        EXPECT_EQ(info.unit, rows[i].unit);
-    }
     EXPECT_FALSE(plugin.Audio().SetParameter(4, 0.0f));
-
     plugin.Prepare(2);
+    const char* meters[][2] = {{"Gain Reduction", "dB"}, {"Input True Peak 1", "dBTP"}, {"Output Peak 1", "dBFS"},
+                               {"Input True Peak 2", "dBTP"}, {"Output Peak 2", "dBFS"}};
     ASSERT_EQ(plugin.Audio().GetMeterCount(), 5u);
-    const char* meters[] = {"Gain Reduction", "Input True Peak 1", "Output Peak 1", "Input True Peak 2",
-                            "Output Peak 2"};
-    const char* units[] = {"dB", "dBTP", "dBFS", "dBTP", "dBFS"};
     for (std::uint32_t i = 0; i < 5; ++i) {
         zen::MeterInfo info;
         ASSERT_TRUE(plugin.Audio().GetMeterInfo(i, info));
-        EXPECT_EQ(info.name, meters[i]);
-        EXPECT_EQ(info.unit, units[i]);
+        EXPECT_EQ(std::pair(info.name, info.unit), std::pair<std::string, std::string>(meters[i][0], meters[i][1]));
     }
     // Before any audio: no gain reduction, silence on the level meters.
     EXPECT_EQ(plugin.Meter("Gain Reduction"), 0.0f);
     EXPECT_EQ(plugin.Meter("Output Peak 1"), -30.0f);
 }
 
-TEST(ZenLimiter, ReportedLatencyIsTheImpulseDelayAtEveryRate) {
-    for (float rate : kRates) {
-        PluginHarness plugin = Limiter(Settings{}, 1, rate, 256);
+TEST(ZenLimiter, ReportedLatencyIsTheImpulseDelayAtEveryRateAndBlockSize) {
+    for (std::size_t r = 0; r < std::size(kRates); ++r) {
+        const float rate = kRates[r];
+        const std::uint32_t block = kBlocks[r + 1];
+        PluginHarness plugin = Limiter(Settings{}, 1, rate, block);
         const std::uint32_t latency = plugin.Audio().GetLatency();
         // Block, true-peak latency and look-ahead: a few milliseconds.
         EXPECT_LT(latency / rate, 0.007) << rate;
-        const std::vector<float> output = plugin.Run(zentest::Impulse(4000, 1000, 0.5f), 1, 256)[0];
+        const std::vector<float> output = plugin.Run(zentest::Impulse(4000, 1000, 0.5f), 1, block)[0];
         EXPECT_EQ(zentest::ArgPeak(output), 1000 + latency) << rate;
         EXPECT_EQ(output[1000 + latency], 0.5f) << rate;
         // Below the ceiling nothing else is touched.
@@ -231,31 +209,11 @@ TEST(ZenLimiter, QuietSignalsPassUnchangedAndSilenceStaysSilent) {
     EXPECT_EQ(zentest::Peak(silence), 0.0f);
 }
 
-TEST(ZenLimiter, LowAndMiddleSinesStayUnderTheCeiling) {
-    double closest = -100.0;
-    for (double frequency : {50.0, 1000.0, 5000.0}) {
-        for (double phase : {0.7, kPi / 4}) {
-            closest =
-                std::max(closest, ExpectCeilingHolds("sine " + std::to_string(frequency) + " Hz", [&](double rate) {
-                             return zentest::Sine(frequency, rate, kFrames, 1.5, phase);
-                         }));
-        }
-    }
-    ReportClosest(closest);
-}
+TEST(ZenLimiter, LowAndMiddleSinesStayUnderTheCeiling) { ReportClosest(SinesHold({50.0, 1000.0, 5000.0})); }
 
+// fs/4 and fs/3 put the crests where 4x points miss them the most.
 TEST(ZenLimiter, HighSinesUpTo15kHzStayUnderTheCeiling) {
-    // fs/4 and fs/3 put the crests where 4x points miss them the most.
-    double closest = -100.0;
-    for (double frequency : {11025.0, 12000.0, 14700.0, 15000.0}) {
-        for (double phase : {0.7, kPi / 4}) {
-            closest =
-                std::max(closest, ExpectCeilingHolds("sine " + std::to_string(frequency) + " Hz", [&](double rate) {
-                             return zentest::Sine(frequency, rate, kFrames, 1.5, phase);
-                         }));
-        }
-    }
-    ReportClosest(closest);
+    ReportClosest(SinesHold({11025.0, 12000.0, 14700.0, 15000.0}));
 }
 
 TEST(ZenLimiter, SquaresImpulsesAndInterSamplePeaksStayUnderTheCeiling) {
@@ -361,41 +319,11 @@ TEST(ZenLimiter, GainNeverExceedsOneAndInputGainApplies) {
     for (std::size_t n = 9000; n < 11000; ++n) ASSERT_NEAR(output[n + latency], input[n] * gain, 1e-6f) << n;
 }
 
-TEST(ZenLimiter, ReleaseRecoversSlowerForLongerTimes) {
-    // After a loud second, a quiet tone: the time until the gain is back
-    // within 1 dB grows with the release time (its time constant is four
-    // times the setting), and a release of 0 ms recovers within milliseconds.
-    auto recovery = [](float releaseMs) {
-        Settings settings;
-        settings.ceilingDb = -12.0f;
-        settings.releaseMs = releaseMs;
-        std::vector<float> input = zentest::Sine(200.0, 48000.0, 96000, 0.1);
-        for (std::size_t n = 0; n < 48000; ++n) input[n] *= 10.0f;
-        PluginHarness plugin = Limiter(settings, 1, 48000.0f, 512);
-        const std::uint32_t latency = plugin.Audio().GetLatency();
-        const std::vector<float> output = plugin.Run(input, 1, 512)[0];
-        // Gain from the ratio at crests of the quiet tone.
-        std::size_t recovered = 0;
-        for (std::size_t n = 48000; n + latency < output.size(); ++n) {
-            if (std::fabs(input[n]) < 0.09f) continue;
-            const double gain = output[n + latency] / input[n];
-            EXPECT_LE(gain, 1.0 + 1e-6);
-            if (gain < std::pow(10.0, -1.0 / 20.0)) recovered = n - 48000;
-        }
-        return static_cast<double>(recovered) / 48.0;  // ms
-    };
-    // From -12.2 dB to -1 dB the reduction (1 - g) falls by 6.9 times: at
-    // least ln 6.9 time constants, more with the holds between releases.
-    const double instant = recovery(0.0f), fast = recovery(5.0f), slow = recovery(20.0f);
-    EXPECT_LT(instant, 20.0);
-    EXPECT_GT(fast, std::log(6.9) * 4.0 * 5.0);
-    EXPECT_NEAR(slow / fast, 4.0, 0.4);
-}
-
-TEST(ZenLimiter, ReleaseFollowsItsOnePoleLaw) {
+TEST(ZenLimiter, ReleaseFollowsItsOnePoleLawAndLetsGo) {
     // After a loud burst, a steady quiet level: where the gain moves, the
     // reduction (1 - g) shrinks by c = exp(-1 / (4 max(n, 1))) per sample,
-    // n the release time in samples (0 ms counts as one sample).
+    // n the release time in samples (0 ms counts as one sample); the holds
+    // between releases keep the recovery from 0 ms within milliseconds.
     for (float releaseMs : {0.0f, 1.0f, 10.0f}) {
         Settings settings;
         settings.ceilingDb = -12.0f;
@@ -418,6 +346,8 @@ TEST(ZenLimiter, ReleaseFollowsItsOnePoleLaw) {
             ++checked;
         }
         EXPECT_GT(checked, 5) << releaseMs;
+        EXPECT_TRUE(releaseMs > 0.0f || reduction(1100 + latency + 960) < 1.0 - std::pow(10.0, -1.0 / 20.0));
+        EXPECT_LT(reduction(output.size() - 1), 1e-3) << releaseMs;
     }
 }
 
