@@ -1,11 +1,11 @@
 #include "ZenfxRunner.h"
 
-#include <dirent.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
 #include <cstdio>
 #include <cstdlib>
+#include <filesystem>
 #include <fstream>
 #include <sstream>
 #include <stdexcept>
@@ -91,20 +91,11 @@ TempFolder::TempFolder() {
     m_path = path;
 }
 
-TempFolder::~TempFolder() {
-    for (const std::string& name : Files()) unlink((m_path + "/" + name).c_str());
-    rmdir(m_path.c_str());
-}
+TempFolder::~TempFolder() { std::filesystem::remove_all(m_path); }
 
 std::vector<std::string> TempFolder::Files() const {
     std::vector<std::string> names;
-    if (DIR* dir = opendir(m_path.c_str())) {
-        while (dirent* entry = readdir(dir)) {
-            const std::string name = entry->d_name;
-            if (name != "." && name != "..") names.push_back(name);
-        }
-        closedir(dir);
-    }
+    for (const auto& entry : std::filesystem::directory_iterator(m_path)) names.push_back(entry.path().filename());
     return names;
 }
 

@@ -26,8 +26,8 @@ std::vector<float> Ramp(std::size_t frames, float amplitude) {
 
 // Every field of `expected` (JSON text) has that value in `actual`.
 void ExpectFields(const nlohmann::json& actual, const char* expected) {
-    for (const auto& [key, value] : nlohmann::json::parse(expected).items())
-        EXPECT_EQ(actual.value(key, nlohmann::json()), value) << key;
+    const nlohmann::json fields = nlohmann::json::parse(expected);
+    for (const auto& [key, value] : fields.items()) EXPECT_EQ(actual.value(key, nlohmann::json()), value) << key;
 }
 
 std::size_t Lines(const std::string& text) { return static_cast<std::size_t>(std::count(text.begin(), text.end(), '\n')); }
