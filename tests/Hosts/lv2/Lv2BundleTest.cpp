@@ -299,26 +299,22 @@ TEST(Lv2Bundle, HostsThatShareBuffersGetTheSameResult) {
         run.Activate();
         const auto in = run.AudioPorts(true);
         const auto out = run.AudioPorts(false);
-        std::vector<float> left(1000), right(1000);
+        std::vector<float> a(1000), b(1000);
         for (std::size_t i = 0; i < 1000; ++i) {
-            left[i] = std::sin(0.01f * static_cast<float>(i));
-            right[i] = 0.3f * std::cos(0.023f * static_cast<float>(i));
+            a[i] = std::sin(0.01f * static_cast<float>(i));
+            b[i] = 0.3f * std::cos(0.023f * static_cast<float>(i));
         }
-        std::vector<float> a = left, b = right;
         run.ConnectAudio(in[0], a.data());
         run.ConnectAudio(in[1], b.data());
-        if (sharing == 1) {  // in place
-            run.ConnectAudio(out[0], a.data());
-            run.ConnectAudio(out[1], b.data());
-        } else if (sharing == 2) {  // crossed: left out over right in
-            run.ConnectAudio(out[0], b.data());
-            run.ConnectAudio(out[1], a.data());
-        }
+        // Separate buffers, in place, or crossed (left out over right in).
+        float* const outputs[3][2] = {{run.Audio(out[0]).data(), run.Audio(out[1]).data()},
+                                      {a.data(), b.data()},
+                                      {b.data(), a.data()}};
+        run.ConnectAudio(out[0], outputs[sharing][0]);
+        run.ConnectAudio(out[1], outputs[sharing][1]);
         run.Run(1000);
-        if (sharing == 0) return std::vector<std::vector<float>>{{run.Audio(out[0]).begin(), run.Audio(out[0]).begin() + 1000},
-                                                                  {run.Audio(out[1]).begin(), run.Audio(out[1]).begin() + 1000}};
-        if (sharing == 1) return std::vector<std::vector<float>>{a, b};
-        return std::vector<std::vector<float>>{b, a};
+        return std::vector<std::vector<float>>{{outputs[sharing][0], outputs[sharing][0] + 1000},
+                                               {outputs[sharing][1], outputs[sharing][1] + 1000}};
     };
     const auto separate = render(0);
     EXPECT_EQ(render(1), separate);

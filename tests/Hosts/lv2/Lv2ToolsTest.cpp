@@ -1,12 +1,12 @@
 // The bundles as Debian's LV2 tools see them: sord_validate against the
-// schemas Debian ships, lv2ls and lv2info listing every plug-in with its
-// ports, and lv2apply processing a WAV file exactly as zenfx does.
-#include <dirent.h>
+// schemas Debian ships, and lv2apply processing a WAV file exactly as zenfx
+// does.
 #include <gtest/gtest.h>
 
 #include <algorithm>
 #include <cmath>
 #include <cstdio>
+#include <filesystem>
 #include <set>
 
 #include "../zenfx/ZenfxRunner.h"
@@ -30,16 +30,9 @@ const Bundle kTest = {ZEN_LV2_TEST_BUNDLE, ZEN_TEST_LIBRARY_PATH};
 std::string Parent(const std::string& folder) { return folder.substr(0, folder.find_last_of('/')); }
 
 void CollectTtl(const std::string& folder, std::vector<std::string>& files) {
-    DIR* dir = opendir(folder.c_str());
-    if (dir == nullptr) return;
-    while (dirent* entry = readdir(dir)) {
-        const std::string name = entry->d_name;
-        if (name == "." || name == "..") continue;
-        const std::string path = folder + "/" + name;
-        if (name.size() > 4 && name.compare(name.size() - 4, 4, ".ttl") == 0) files.push_back(path);
-        else if (entry->d_type == DT_DIR) CollectTtl(path, files);
-    }
-    closedir(dir);
+    std::error_code missing;
+    for (const auto& entry : std::filesystem::recursive_directory_iterator(folder, missing))
+        if (entry.path().extension() == ".ttl") files.push_back(entry.path());
 }
 
 // An LV2 tool with only `bundle` on its path. A sanitizer build's adapter
@@ -72,39 +65,6 @@ TEST(Lv2Tools, SordValidateFindsNoErrorsAgainstDebiansSchemas) {
         const auto result = RunProgram("sord_validate", files);
         const std::string text = result.out + result.err;
         EXPECT_NE(text.find("Found 0 errors"), std::string::npos) << bundle.folder << "\n" << text;
-    }
-}
-
-TEST(Lv2Tools, Lv2lsAndLv2infoShowEveryPluginWithItsPorts) {
-    zenlv2::Library library({kShipped.library});
-    ASSERT_TRUE(library.IsLoaded()) << library.Error();
-    const auto listed = RunLv2Tool("lv2ls", kShipped, {});
-    ASSERT_EQ(listed.exitCode, 0) << listed.err;
-    std::set<std::string> uris;
-    for (std::size_t start = 0, end; (end = listed.out.find('\n', start)) != std::string::npos; start = end + 1)
-        uris.insert(listed.out.substr(start, end - start));
-
-    for (const auto& [key, entry] : library.Interface().GetPluginList(zen::kAudioPluginKind)) {
-        SCOPED_TRACE(key);
-        std::size_t layouts = 0;
-        for (const std::string& uri : uris) {
-            if (uri.rfind(zenlv2::Catalog::MakeUri(key, ""), 0) != 0) continue;
-            ++layouts;
-            const auto info = RunLv2Tool("lv2info", kShipped, {uri});
-            ASSERT_EQ(info.exitCode, 0) << info.err;
-            EXPECT_NE(info.out.find("Name:              " + entry.name), std::string::npos) << info.out;
-            EXPECT_NE(info.out.find("Has latency:       yes"), std::string::npos) << info.out;
-            EXPECT_NE(info.out.find("Symbol:      enabled"), std::string::npos);
-            const auto instance = library.Create(key);
-            AudioPlugin& audio = *zen::InterfaceCast<AudioPlugin>(instance.get());
-            for (std::uint32_t p = 0; p < audio.GetParameterCount(); ++p) {
-                zen::ParameterInfo parameter;
-                audio.GetParameterInfo(p, parameter);
-                EXPECT_NE(info.out.find("Name:        " + parameter.label + "\n"), std::string::npos)
-                    << parameter.label;
-            }
-        }
-        EXPECT_GE(layouts, 1u) << "lv2ls does not list " << key;
     }
 }
 
