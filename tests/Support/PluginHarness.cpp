@@ -64,6 +64,14 @@ float PluginHarness::Meter(const std::string& name) {
     throw std::runtime_error("no meter " + name);
 }
 
+PluginHarness Prepared(const std::string& name, const std::vector<std::pair<std::string, float>>& settings,
+                       std::uint32_t channels, float sampleRate, std::uint32_t maxBlock) {
+    PluginHarness plugin(name);
+    for (const auto& [parameter, value] : settings) plugin.Set(parameter, value);
+    plugin.Prepare(channels, sampleRate, maxBlock);
+    return plugin;
+}
+
 std::vector<std::string> RegisteredAudioKeys() {
     std::vector<std::string> keys;
     for (const auto& [key, entry] : GetZenPluginInterface()->GetPluginList(zen::kAudioPluginKind)) keys.push_back(key);

@@ -4,6 +4,7 @@
 
 #include <memory>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "zen/Zen.h"
@@ -38,6 +39,11 @@ private:
     std::unique_ptr<zen::PluginInstance> m_instance;
     AudioPlugin* m_audio = nullptr;
 };
+
+// The plug-in named `name` with `settings` (label or identifier, value) made
+// before Prepare, so no smoothing ramp runs.
+PluginHarness Prepared(const std::string& name, const std::vector<std::pair<std::string, float>>& settings,
+                       std::uint32_t channels = 1, float sampleRate = 48000.0f, std::uint32_t maxBlock = 512);
 
 // Every registered audio plug-in key of the library under test.
 std::vector<std::string> RegisteredAudioKeys();

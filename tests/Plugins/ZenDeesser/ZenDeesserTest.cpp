@@ -23,8 +23,7 @@ double EnergyChangeDb(const std::vector<float>& out, const std::vector<float>& i
 TEST(ZenDeesser, ReducesSibilantsAndLeavesTheRestOfTheSpectrum) {
     for (float rate : {44100.0f, 48000.0f, 96000.0f}) {
         const zentest::SpeechLike speech = zentest::MakeSpeechLike(rate);
-        PluginHarness plugin("De-Esser");  // defaults: 7 kHz, narrow, 50 %
-        plugin.Prepare(1, rate, 512);
+        PluginHarness plugin = zentest::Prepared("De-Esser", {}, 1, rate, 512);  // defaults: 7 kHz, narrow, 50 %
         const std::vector<float> out = plugin.Run(speech.samples, 1, 512)[0];
         EXPECT_LT(EnergyChangeDb(out, speech.samples, rate, 5000, 9000, speech.sibilants), -3.0) << rate;
         for (const auto& [low, high] : {std::pair{80, 500}, {500, 1500}, {1500, 3500}, {3500, 5000}})
@@ -37,9 +36,7 @@ TEST(ZenDeesser, AmountZeroIsTransparentAndMoreAmountReducesMore) {
     const zentest::SpeechLike speech = zentest::MakeSpeechLike(48000.0);
     double previous = 0.0;
     for (float amount : {0.0f, 25.0f, 50.0f, 100.0f}) {
-        PluginHarness plugin("De-Esser");
-        plugin.Set("Amount", amount);
-        plugin.Prepare(2);
+        PluginHarness plugin = zentest::Prepared("De-Esser", {{"Amount", amount}}, 2);
         const zentest::Channels out = plugin.Run(speech.samples, 2, 512);
         for (std::size_t n = 0; amount == 0.0f && n < out[0].size(); ++n)
             ASSERT_NEAR(out[1][n], speech.samples[n], 1e-6) << n;
@@ -55,10 +52,7 @@ TEST(ZenDeesser, AmountZeroIsTransparentAndMoreAmountReducesMore) {
 
 TEST(ZenDeesser, EssOnlyPlaysTheDetectedBand) {
     const zentest::SpeechLike speech = zentest::MakeSpeechLike(48000.0);
-    PluginHarness plugin("De-Esser");
-    plugin.Set("Ess Only", 1.0f);
-    plugin.Set("Frequency", 6500.0f);
-    plugin.Prepare(1);
+    PluginHarness plugin = zentest::Prepared("De-Esser", {{"Ess Only", 1.0f}, {"Frequency", 6500.0f}}, 1);
     const std::vector<float> out = plugin.Run(speech.samples, 1, 512)[0];
     // The band at its own level, the voice below it down by the band's boost (8.3 dB).
     EXPECT_NEAR(EnergyChangeDb(out, speech.samples, 48000.0, 6000, 7000, speech.sibilants), 0.0, 1.0);
@@ -66,8 +60,7 @@ TEST(ZenDeesser, EssOnlyPlaysTheDetectedBand) {
 }
 
 TEST(ZenDeesser, ReductionMeterReadsTheGainAppliedNow) {
-    PluginHarness plugin("De-Esser");
-    plugin.Prepare(2);
+    PluginHarness plugin = zentest::Prepared("De-Esser", {}, 2);
     EXPECT_EQ(plugin.Meter("Reduction"), 0.0f);
     const zentest::Channels in = {zentest::Sine(7000.0, 48000.0, 480, 0.5), zentest::Sine(200.0, 48000.0, 480, 0.2)};
     for (int block = 0; block < 20; ++block) {
@@ -83,9 +76,7 @@ TEST(ZenDeesser, ReductionMeterReadsTheGainAppliedNow) {
 TEST(ZenDeesser, NoLatencyMonoOrStereoAndSplitsDoNotMatter) {
     const std::vector<float> speech = zentest::MakeSpeechLike(48000.0, 3).samples;
     auto run = [&](std::uint32_t channels, std::size_t block) {
-        PluginHarness plugin("De-Esser");
-        plugin.Set("Range", 1.0f);  // "Wide"
-        plugin.Prepare(channels, 48000.0f, 512);
+        PluginHarness plugin = zentest::Prepared("De-Esser", {{"Range", 1.0f}}, channels, 48000.0f, 512);  // "Wide"
         EXPECT_EQ(plugin.Audio().GetLatency(), 0u);
         return plugin.Run(speech, channels, block);
     };
@@ -95,8 +86,7 @@ TEST(ZenDeesser, NoLatencyMonoOrStereoAndSplitsDoNotMatter) {
     EXPECT_EQ(run(2, 7)[0], stereo[0]);
     EXPECT_EQ(run(2, 5000)[0], stereo[0]);  // host blocks beyond the prepared size
 
-    PluginHarness plugin("De-Esser");
-    plugin.Prepare(1);
+    PluginHarness plugin = zentest::Prepared("De-Esser", {}, 1);
     EXPECT_EQ(zentest::ArgPeak(plugin.Run(zentest::Impulse(2048, 300, 0.5f))[0]), 300u);
     EXPECT_FALSE(plugin.Audio().ConfigureChannels(3, 3));
     EXPECT_FALSE(plugin.Audio().ConfigureChannels(1, 2));
@@ -104,15 +94,13 @@ TEST(ZenDeesser, NoLatencyMonoOrStereoAndSplitsDoNotMatter) {
 
 TEST(ZenDeesser, NonFiniteInputDoesNotPoisonLaterSamples) {
     const zentest::SpeechLike speech = zentest::MakeSpeechLike(48000.0, 4);
-    PluginHarness reference("De-Esser");
-    reference.Prepare(1);
+    PluginHarness reference = zentest::Prepared("De-Esser", {}, 1);
     const std::vector<float> clean = reference.Run(speech.samples)[0];
     for (float bad : {NAN, INFINITY}) {
         std::vector<float> input = speech.samples;
         const std::size_t at = speech.sibilants[1].first + 500;
         input[at] = bad;
-        PluginHarness plugin("De-Esser");
-        plugin.Prepare(1);
+        PluginHarness plugin = zentest::Prepared("De-Esser", {}, 1);
         const std::vector<float> out = plugin.Run(input, 1, 512)[0];
         for (std::size_t n = at + 1; n < out.size(); ++n) ASSERT_TRUE(std::isfinite(out[n])) << n;
         const std::size_t later = speech.vowels[2].first;

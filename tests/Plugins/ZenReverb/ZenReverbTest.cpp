@@ -39,8 +39,7 @@ TEST(ZenReverb, RoomDimensionsStayAboveTheEnginesMinimumAndFrequenciesAreLogarit
 }
 
 TEST(ZenReverb, ParametersReachTheEngineInItsUnits) {
-    PluginHarness plugin("Reverb");
-    plugin.Prepare(2);
+    PluginHarness plugin = zentest::Prepared("Reverb", {}, 2);
     plugin.Set("Pre-Delay", 20.0f);
     plugin.Set("Brightness", 25.0f);
     plugin.Set("Dry/Wet", 100.0f);
@@ -61,8 +60,7 @@ TEST(ZenReverb, ParametersReachTheEngineInItsUnits) {
 
 TEST(ZenReverb, LengthWidthAreaAndRatioMakeOneRoomInAnyOrder) {
     auto floor = [](const std::vector<std::pair<const char*, float>>& settings) {
-        PluginHarness plugin("Reverb");
-        plugin.Prepare(1);
+        PluginHarness plugin = zentest::Prepared("Reverb", {}, 1);
         for (const auto& [name, value] : settings) plugin.Set(name, value);
         plugin.Run(std::vector<float>(16, 0.0f));
         const zn_reverb& engine = *Impl(plugin).Engine();
@@ -92,9 +90,7 @@ TEST(ZenReverb, LengthWidthAreaAndRatioMakeOneRoomInAnyOrder) {
 
 TEST(ZenReverb, DryWetZeroPassesTheDrySignalUnchangedAtEveryRate) {
     for (float rate : {44100.0f, 48000.0f, 96000.0f, 192000.0f}) {
-        PluginHarness plugin("Reverb");
-        plugin.Set("Dry/Wet", 0.0f);
-        plugin.Prepare(2, rate, 512);
+        PluginHarness plugin = zentest::Prepared("Reverb", {{"Dry/Wet", 0.0f}}, 2, rate, 512);
         zentest::Channels io = {zentest::Noise(5000, 0.8, 1), zentest::Noise(5000, 0.8, 2)};
         const auto input = io;
         plugin.Process(io, 333);
@@ -105,9 +101,7 @@ TEST(ZenReverb, DryWetZeroPassesTheDrySignalUnchangedAtEveryRate) {
 
 TEST(ZenReverb, FullyWetHasNoDirectSoundAndLaterReflectionsAndTail) {
     for (float rate : {48000.0f, 96000.0f}) {
-        PluginHarness plugin("Reverb");
-        plugin.Set("Dry/Wet", 100.0f);
-        plugin.Prepare(1, rate, 512);
+        PluginHarness plugin = zentest::Prepared("Reverb", {{"Dry/Wet", 100.0f}}, 1, rate, 512);
         const auto out = plugin.Run(zentest::Impulse(static_cast<std::size_t>(rate)), 1, 256)[0];
         // The first reflection is 0.1 m or more behind the direct sound.
         const auto quiet = static_cast<std::size_t>(0.1 / 340.0 * rate);
@@ -119,8 +113,7 @@ TEST(ZenReverb, FullyWetHasNoDirectSoundAndLaterReflectionsAndTail) {
 }
 
 TEST(ZenReverb, PreDelayAloneLeavesTheLaneLengthsAlone) {
-    PluginHarness plugin("Reverb");
-    plugin.Prepare(2);
+    PluginHarness plugin = zentest::Prepared("Reverb", {}, 2);
     plugin.Run(std::vector<float>(64, 0.0f), 2);
     const zn_reverb& engine = *Impl(plugin).Engine();
     const auto lengths = engine.Runs(zn_reverb::kStepLaneLengths);
@@ -134,9 +127,7 @@ TEST(ZenReverb, PreDelayAloneLeavesTheLaneLengthsAlone) {
 
 TEST(ZenReverb, LayoutsFromMonoToEightChannels) {
     for (std::uint32_t channels : {1u, 2u, 5u, 8u}) {
-        PluginHarness plugin("Reverb");
-        plugin.Set("Dry/Wet", 100.0f);
-        plugin.Prepare(channels);
+        PluginHarness plugin = zentest::Prepared("Reverb", {{"Dry/Wet", 100.0f}}, channels);
         const auto out = plugin.Run(zentest::Impulse(24000), channels, 512);
         for (std::uint32_t c = 0; c < channels; ++c) EXPECT_GT(zentest::Rms(out[c], 4800, 14400), 1e-4) << channels;
         if (channels > 1) {
@@ -159,9 +150,7 @@ TEST(ZenReverb, ChangesWhilePlayingDoNotClick) {
         {"Late Rev. Low Freq", 80.0f}, {"Dry/Wet", 30.0f},      {"Direct Gain", -20.0f},
         {"Early Refl. Gain", 6.0f}, {"Late Rev. Gain", -12.0f}, {"T@-60dB", 0.3f},
     };
-    PluginHarness plugin("Reverb");
-    plugin.Set("Dry/Wet", 100.0f);
-    plugin.Prepare(1);
+    PluginHarness plugin = zentest::Prepared("Reverb", {{"Dry/Wet", 100.0f}}, 1);
     const std::size_t part = 12000;
     plugin.Run(zentest::Sine(150.0, 48000.0, 48000, 0.5), 1, 512);
     double phase = 48000.0;
@@ -179,9 +168,7 @@ TEST(ZenReverb, ChangesWhilePlayingDoNotClick) {
 }
 
 TEST(ZenReverb, NonFiniteInputDoesNotPoisonTheRoom) {
-    PluginHarness plugin("Reverb");
-    plugin.Set("T@-60dB", 20.0f);
-    plugin.Prepare(2);
+    PluginHarness plugin = zentest::Prepared("Reverb", {{"T@-60dB", 20.0f}}, 2);
     zentest::Channels io = {zentest::Noise(2048, 0.5, 1), zentest::Noise(2048, 0.5, 2)};
     io[0][100] = NAN;
     io[1][200] = INFINITY;
@@ -195,9 +182,7 @@ TEST(ZenReverb, NonFiniteInputDoesNotPoisonTheRoom) {
 }
 
 TEST(ZenReverb, ANewRateRebuildsTheEngineForItsOwnRate) {
-    PluginHarness plugin("Reverb");
-    plugin.Set("Room Length", 9.0f);
-    plugin.Prepare(2, 48000.0f);
+    PluginHarness plugin = zentest::Prepared("Reverb", {{"Room Length", 9.0f}}, 2, 48000.0f);
     plugin.Run(std::vector<float>(64, 0.0f), 2);
     const auto lengthAt48 = Impl(plugin).Engine()->Param().tail.core.lengths(0);
     plugin.Prepare(2, 96000.0f);
@@ -214,8 +199,7 @@ TEST(ZenReverb, ANewRateRebuildsTheEngineForItsOwnRate) {
 TEST(ZenReverb, SameOutputInAnyBlockSplitAtHighRates) {
     const auto input = zentest::Noise(7000, 0.5, 3);
     auto run = [&](std::size_t block) {
-        PluginHarness plugin("Reverb");
-        plugin.Prepare(1, 192000.0f, 512);
+        PluginHarness plugin = zentest::Prepared("Reverb", {}, 1, 192000.0f, 512);
         return plugin.Run(input, 1, block)[0];
     };
     const auto whole = run(512);

@@ -14,12 +14,8 @@ namespace {
 
 // The plug-in at settings applied before processing (no ramps).
 PluginHarness Clipper(float thresholdDb, float shape, float outputDb, std::uint32_t channels = 1) {
-    PluginHarness plugin("Soft Clipper");
-    plugin.Set("Threshold", thresholdDb);
-    plugin.Set("Shape", shape);
-    plugin.Set("Output Level", outputDb);
-    plugin.Prepare(channels);
-    return plugin;
+    return zentest::Prepared("Soft Clipper", {{"Threshold", thresholdDb}, {"Shape", shape}, {"Output Level", outputDb}},
+                             channels);
 }
 
 float ProcessOne(PluginHarness& plugin, float x) { return plugin.Run({x})[0][0]; }
