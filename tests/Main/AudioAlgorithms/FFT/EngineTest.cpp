@@ -123,29 +123,22 @@ TEST(FftEngine, RefusesPipelinesAndBuffersItCannotRun) {
     config.frameLength = 256;
     config.fftLength = 256;
     config.hop = 64;
-    {
+    auto refused = [&](const char* check) {
         CheckRecorder checks;
         EXPECT_FALSE(engine.Configure(config));
         ASSERT_FALSE(checks.Checks().empty());
-        EXPECT_EQ(checks.Checks().back(), "!m_pipeline.empty()");
-    }
-    {
-        CheckRecorder checks;
-        config.pipeline = {&in, &toPolar};
-        EXPECT_FALSE(engine.Configure(config));
-        ASSERT_FALSE(checks.Checks().empty());
-        EXPECT_EQ(checks.Checks().back(), "last.m_traits == plugin::OUTPUT");
-    }
-    {
-        CheckRecorder checks;
-        config.pipeline = {&in, &out};
-        config.hop = 0;
-        EXPECT_FALSE(engine.Configure(config));
-        config.hop = 64;
-        config.fftLength = 128;  // shorter than a frame
-        EXPECT_FALSE(engine.Configure(config));
-        EXPECT_EQ(checks.Checks().size(), 2u);
-    }
+        if (check) EXPECT_EQ(checks.Checks().back(), check);
+        else EXPECT_EQ(checks.Checks().size(), 1u);
+    };
+    refused("!m_pipeline.empty()");
+    config.pipeline = {&in, &toPolar};
+    refused("last.m_traits == plugin::OUTPUT");
+    config.pipeline = {&in, &out};
+    config.hop = 0;
+    refused(nullptr);
+    config.hop = 64;
+    config.fftLength = 128;  // shorter than a frame
+    refused(nullptr);
     config.fftLength = 256;
     ASSERT_TRUE(engine.Configure(config));
     EXPECT_TRUE(engine.GetContext().out->at(0).is_linearized());
