@@ -24,6 +24,10 @@ public:
 
 zen::PluginInstance* CreateNothing(void*, zen::HostServices*, const zen::PluginDescriptor*) { return nullptr; }
 
+std::unique_ptr<zen::PluginInstance> Create(int kind, const char* key) {
+    return std::unique_ptr<zen::PluginInstance>(GetZenPluginInterface()->CreatePlugin(kind, key));
+}
+
 }  // namespace
 
 template class ZenControlPlugin<TestConsoleSettings>;
@@ -66,7 +70,7 @@ TEST(PluginInterface, CreatesByExactKeyOfItsOwnKindOnly) {
     }
     for (const char* key : {"soft clipper:1517179747", "Soft Clipper", "Blur:1517175404", "Krush:1517177714"})
         EXPECT_EQ(library->CreatePlugin(zen::kAudioPluginKind, key), nullptr) << key;
-    std::unique_ptr<zen::PluginInstance> clipper(library->CreatePlugin(zen::kAudioPluginKind, "Soft Clipper:1517179747"));
+    const auto clipper = Create(zen::kAudioPluginKind, "Soft Clipper:1517179747");
     ASSERT_NE(clipper, nullptr);
     EXPECT_EQ(clipper->GetKind(), zen::kAudioPluginKind);
     EXPECT_STREQ(clipper->GetName(), "Soft Clipper");
@@ -76,8 +80,7 @@ TEST(PluginInterface, CreatesByExactKeyOfItsOwnKindOnly) {
 }
 
 TEST(PluginInterface, CastsByInterfaceName) {
-    std::unique_ptr<zen::PluginInstance> clipper(
-        GetZenPluginInterface()->CreatePlugin(zen::kAudioPluginKind, "Soft Clipper:1517179747"));
+    const auto clipper = Create(zen::kAudioPluginKind, "Soft Clipper:1517179747");
     EXPECT_EQ(clipper->QueryInterface("zen::PluginInstance"), clipper.get());
     EXPECT_NE(zen::InterfaceCast<AudioPlugin>(clipper.get()), nullptr);
     EXPECT_NE(zen::InterfaceCast<ZenControlValueHost>(clipper.get()), nullptr);
@@ -103,7 +106,7 @@ TEST(PluginInterface, HostServicesReachNewInstances) {
     int context = 0;
     library->SetHostContext(&context);
     library->SetHostServices(&services);
-    std::unique_ptr<zen::PluginInstance> clipper(library->CreatePlugin(zen::kAudioPluginKind, "Soft Clipper:1517179747"));
+    const auto clipper = Create(zen::kAudioPluginKind, "Soft Clipper:1517179747");
     library->SetHostServices(nullptr);
     library->SetHostContext(nullptr);
     auto* impl = dynamic_cast<ZenAudioPluginImpl*>(clipper.get());
@@ -138,14 +141,12 @@ TEST(PluginRegistries, TheFirstRegistrationWinsWithAnAssertion) {
     EXPECT_FALSE(zen::ControlPluginRegistry::Instance().Register(
         "Test Console Settings", [](zen::HostServices*) -> zen::PluginInstance* { return nullptr; }));
     EXPECT_EQ(assertions.Assertions().size(), 2u);
-    std::unique_ptr<zen::PluginInstance> settings(
-        GetZenPluginInterface()->CreatePlugin(zen::kControlPluginKind, "Test Console Settings"));
+    const auto settings = Create(zen::kControlPluginKind, "Test Console Settings");
     EXPECT_NE(settings, nullptr);
 }
 
 TEST(ControlPlugin, ParametersStateAndCasts) {
-    std::unique_ptr<zen::PluginInstance> settings(
-        GetZenPluginInterface()->CreatePlugin(zen::kControlPluginKind, "Test Console Settings"));
+    const auto settings = Create(zen::kControlPluginKind, "Test Console Settings");
     ASSERT_NE(settings, nullptr);
     EXPECT_EQ(settings->GetKind(), zen::kControlPluginKind);
     EXPECT_EQ(settings->GetDescriptor(), nullptr);
@@ -158,8 +159,7 @@ TEST(ControlPlugin, ParametersStateAndCasts) {
     EXPECT_FALSE(control->SetParameter(2, 1.0f));
     const std::string state = control->SaveState();
 
-    std::unique_ptr<zen::PluginInstance> other(
-        GetZenPluginInterface()->CreatePlugin(zen::kControlPluginKind, "Test Console Settings"));
+    const auto other = Create(zen::kControlPluginKind, "Test Console Settings");
     ControlPlugin* restored = zen::InterfaceCast<ControlPlugin>(other.get());
     ASSERT_TRUE(restored->LoadState(state));
     EXPECT_FLOAT_EQ(restored->GetParameter(0), -4.5f);
