@@ -28,17 +28,12 @@ struct Record {
 
 }  // namespace
 
-TEST(ParameterDefinition, TableNumbersRowsAndPrefixesIdentifiers) {
+TEST(ParameterDefinition, TableNumbersRowsAndPrefixesIdentifiersWithTheClass) {
     const auto& table = Table();
     ASSERT_EQ(table.size(), 6u);
     for (std::size_t i = 0; i < table.size(); ++i) EXPECT_EQ(table[i].index, i);
     EXPECT_EQ(table[0].identifier, "TaperTest::GAIN");
-    EXPECT_EQ(table[0].label, "Gain");
-    EXPECT_EQ(table[0].unit, "dB");
-    EXPECT_EQ(table[3].kind, zen::ParameterKind::List);
-    EXPECT_EQ(table[3].maximum, 4.0f);
-    EXPECT_EQ(table[3].choices.size(), 5);
-    EXPECT_EQ(table[5].kind, zen::ParameterKind::Switch);
+    EXPECT_EQ(table[3].maximum, 4.0f);  // a list's last index
     EXPECT_EQ(table[1].Taper(), zen::ParameterTaper::Logarithmic);
     EXPECT_EQ(table[3].Taper(), zen::ParameterTaper::List);
     EXPECT_EQ(table[5].Taper(), zen::ParameterTaper::Linear);
@@ -54,24 +49,22 @@ TEST(ParameterDefinition, ConstrainKeepsValuesInRangeAndOnSteps) {
     EXPECT_EQ(table[5].Constrain(0.4f), 0.0f);
 }
 
-TEST(PluginParameter, LinearPosition) {
+TEST(PluginParameter, LinearPositionFollowsEveryChange) {
     Record gain(0);
     EXPECT_FLOAT_EQ(gain.parameter.ValueToPosition(-18.0f), 0.0f);
     EXPECT_FLOAT_EQ(gain.parameter.ValueToPosition(6.0f), 1.0f);
-    EXPECT_FLOAT_EQ(gain.parameter.ValueToPosition(0.0f), 0.75f);
-    EXPECT_FLOAT_EQ(gain.parameter.GetPosition(), 0.75f);  // cache of the default's position
+    EXPECT_FLOAT_EQ(gain.parameter.GetPosition(), 0.75f);  // the default's, 0 dB
+    EXPECT_FLOAT_EQ(gain.parameter.Exchange(6.0f), 0.0f);   // gives the previous value back
+    EXPECT_FLOAT_EQ(gain.parameter.GetPosition(), 1.0f);
 }
 
-TEST(PluginParameter, LogarithmicPosition) {
+TEST(PluginParameter, LogarithmicPositionEvenFromAMinimumOfZero) {
     Record freq(1);
     EXPECT_NEAR(freq.parameter.ValueToPosition(20.0f), 0.0f, 1e-6);
     EXPECT_NEAR(freq.parameter.ValueToPosition(22000.0f), 1.0f, 1e-6);
     // Geometric mean sits in the middle.
     EXPECT_NEAR(freq.parameter.ValueToPosition(std::sqrt(20.0f * 22000.0f)), 0.5f, 1e-5);
     EXPECT_NEAR(freq.parameter.PositionToValue(0.5f), std::sqrt(20.0f * 22000.0f), 0.01f);
-}
-
-TEST(PluginParameter, LogarithmicMinimumZeroGivesLargeNegativePosition) {
     Record fromZero(2);
     const float position = fromZero.parameter.ValueToPosition(0.0f);
     EXPECT_FALSE(std::isnan(position));
@@ -79,7 +72,7 @@ TEST(PluginParameter, LogarithmicMinimumZeroGivesLargeNegativePosition) {
     EXPECT_NEAR(fromZero.parameter.ValueToPosition(100.0f), 1.0f, 1e-6);
 }
 
-TEST(PluginParameter, ListPositionIsIndexOverLastIndex) {
+TEST(PluginParameter, ListPositionIsIndexOverLastIndexEvenForOneEntry) {
     Record shape(3);
     EXPECT_EQ(shape.parameter.GetDiscreteValues().size(), 5u);
     EXPECT_FLOAT_EQ(shape.parameter.ValueToPosition(0.0f), 0.0f);
@@ -88,19 +81,9 @@ TEST(PluginParameter, ListPositionIsIndexOverLastIndex) {
     EXPECT_FLOAT_EQ(shape.parameter.ValueToPosition(4.0f), 1.0f);
     EXPECT_FLOAT_EQ(shape.parameter.ValueToPosition(4.5f), 0.0f);  // above the last entry: 0, not 1
     EXPECT_FLOAT_EQ(shape.parameter.PositionToValue(0.74f), 3.0f);
-}
-
-TEST(PluginParameter, SingleEntryListDividesByOne) {
-    Record one(4);
+    Record one(4);  // a single entry divides by one, not by zero
     EXPECT_FLOAT_EQ(one.parameter.ValueToPosition(0.0f), 0.0f);
     EXPECT_FLOAT_EQ(one.parameter.PositionToValue(1.0f), 0.0f);
-}
-
-TEST(PluginParameter, ExchangeReturnsPreviousAndRefreshesPosition) {
-    Record gain(0);
-    EXPECT_FLOAT_EQ(gain.parameter.Exchange(6.0f), 0.0f);
-    EXPECT_FLOAT_EQ(gain.parameter.GetValue(), 6.0f);
-    EXPECT_FLOAT_EQ(gain.parameter.GetPosition(), 1.0f);
 }
 
 TEST(PluginParameter, PositionRoundTripsForEveryTaper) {

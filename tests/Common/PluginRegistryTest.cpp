@@ -24,6 +24,10 @@ public:
 
 zen::PluginInstance* CreateNothing(void*, zen::HostServices*, const zen::PluginDescriptor*) { return nullptr; }
 
+std::unique_ptr<zen::PluginInstance> Create(int kind, const char* key) {
+    return std::unique_ptr<zen::PluginInstance>(GetZenPluginInterface()->CreatePlugin(kind, key));
+}
+
 }  // namespace
 
 template class ZenControlPlugin<TestConsoleSettings>;
@@ -43,41 +47,30 @@ TEST(PluginInterface, KeysAreNameColonDecimalCode) {
     EXPECT_EQ(zen::MakePluginKey("Limiter", 1517177970), "Limiter:1517177970");
 }
 
-TEST(PluginInterface, ListsAudioPluginsByKeyWithTheirEntries) {
+TEST(PluginInterface, ListsAudioPluginsByKeyAndControlPluginsByName) {
     const auto list = GetZenPluginInterface()->GetPluginList(zen::kAudioPluginKind);
     const auto it = list.find("Soft Clipper:1517179747");
     ASSERT_NE(it, list.end());
     EXPECT_EQ(it->second.name, "Soft Clipper");
     EXPECT_EQ(it->second.channelCount, 32u);
-    EXPECT_EQ(it->second.reserved0, 0u);
-    EXPECT_EQ(it->second.reserved1, 0u);
-    EXPECT_EQ(it->second.listFlags, 0u);
+    EXPECT_EQ(it->second.reserved0 | it->second.reserved1 | it->second.listFlags, 0u);
     for (const auto& [key, entry] : list) EXPECT_EQ(key.rfind(entry.name + ":", 0), 0u) << key;
+    const auto controls = GetZenPluginInterface()->GetPluginList(zen::kControlPluginKind);
+    const auto settings = controls.find("Test Console Settings");
+    ASSERT_NE(settings, controls.end());
+    EXPECT_EQ(settings->second.name, "Test Console Settings");
+    EXPECT_EQ(settings->second.channelCount, 0u);
 }
 
-TEST(PluginInterface, ListsControlPluginsByName) {
-    const auto list = GetZenPluginInterface()->GetPluginList(zen::kControlPluginKind);
-    const auto it = list.find("Test Console Settings");
-    ASSERT_NE(it, list.end());
-    EXPECT_EQ(it->second.name, "Test Console Settings");
-    EXPECT_EQ(it->second.channelCount, 0u);
-}
-
-TEST(PluginInterface, OtherKindsAreEmptyAndCreateNothing) {
+TEST(PluginInterface, CreatesByExactKeyOfItsOwnKindOnly) {
     zen::PluginInterface* library = GetZenPluginInterface();
     for (int kind : {-1, 1, 3, 100}) {
         EXPECT_TRUE(library->GetPluginList(kind).empty()) << kind;
         EXPECT_EQ(library->CreatePlugin(kind, "Soft Clipper:1517179747"), nullptr) << kind;
     }
-}
-
-TEST(PluginInterface, CreatesByExactKeyOnly) {
-    zen::PluginInterface* library = GetZenPluginInterface();
-    EXPECT_EQ(library->CreatePlugin(zen::kAudioPluginKind, "soft clipper:1517179747"), nullptr);
-    EXPECT_EQ(library->CreatePlugin(zen::kAudioPluginKind, "Soft Clipper"), nullptr);
-    EXPECT_EQ(library->CreatePlugin(zen::kAudioPluginKind, "Blur:1517175404"), nullptr);
-    EXPECT_EQ(library->CreatePlugin(zen::kAudioPluginKind, "Krush:1517177714"), nullptr);
-    std::unique_ptr<zen::PluginInstance> clipper(library->CreatePlugin(zen::kAudioPluginKind, "Soft Clipper:1517179747"));
+    for (const char* key : {"soft clipper:1517179747", "Soft Clipper", "Blur:1517175404", "Krush:1517177714"})
+        EXPECT_EQ(library->CreatePlugin(zen::kAudioPluginKind, key), nullptr) << key;
+    const auto clipper = Create(zen::kAudioPluginKind, "Soft Clipper:1517179747");
     ASSERT_NE(clipper, nullptr);
     EXPECT_EQ(clipper->GetKind(), zen::kAudioPluginKind);
     EXPECT_STREQ(clipper->GetName(), "Soft Clipper");
@@ -87,8 +80,7 @@ TEST(PluginInterface, CreatesByExactKeyOnly) {
 }
 
 TEST(PluginInterface, CastsByInterfaceName) {
-    std::unique_ptr<zen::PluginInstance> clipper(
-        GetZenPluginInterface()->CreatePlugin(zen::kAudioPluginKind, "Soft Clipper:1517179747"));
+    const auto clipper = Create(zen::kAudioPluginKind, "Soft Clipper:1517179747");
     EXPECT_EQ(clipper->QueryInterface("zen::PluginInstance"), clipper.get());
     EXPECT_NE(zen::InterfaceCast<AudioPlugin>(clipper.get()), nullptr);
     EXPECT_NE(zen::InterfaceCast<ZenControlValueHost>(clipper.get()), nullptr);
@@ -114,7 +106,7 @@ TEST(PluginInterface, HostServicesReachNewInstances) {
     int context = 0;
     library->SetHostContext(&context);
     library->SetHostServices(&services);
-    std::unique_ptr<zen::PluginInstance> clipper(library->CreatePlugin(zen::kAudioPluginKind, "Soft Clipper:1517179747"));
+    const auto clipper = Create(zen::kAudioPluginKind, "Soft Clipper:1517179747");
     library->SetHostServices(nullptr);
     library->SetHostContext(nullptr);
     auto* impl = dynamic_cast<ZenAudioPluginImpl*>(clipper.get());
@@ -133,7 +125,7 @@ TEST(AudioPluginRegistry, WithheldDescriptorsAreNeverEntered) {
     EXPECT_EQ(zen::AudioPluginRegistry::Instance().Find("Blur:1517175404"), nullptr);
 }
 
-TEST(AudioPluginRegistry, FirstRegistrationWinsWithAnAssertion) {
+TEST(PluginRegistries, TheFirstRegistrationWinsWithAnAssertion) {
     zentest::AssertionRecorder assertions;
     auto& registry = zen::AudioPluginRegistry::Instance();
     const zen::AudioPluginRegistry::Node* before = registry.Find("Soft Clipper:1517179747");
@@ -145,21 +137,16 @@ TEST(AudioPluginRegistry, FirstRegistrationWinsWithAnAssertion) {
     EXPECT_EQ(assertions.Assertions()[0].message, "0");
     EXPECT_NE(assertions.Assertions()[0].file.find("Common/AudioPluginRegistry"), std::string::npos);
     EXPECT_EQ(registry.Find("Soft Clipper:1517179747")->factory, original);
-}
 
-TEST(ControlPluginRegistry, FirstRegistrationWinsWithAnAssertion) {
-    zentest::AssertionRecorder assertions;
     EXPECT_FALSE(zen::ControlPluginRegistry::Instance().Register(
         "Test Console Settings", [](zen::HostServices*) -> zen::PluginInstance* { return nullptr; }));
-    EXPECT_EQ(assertions.Assertions().size(), 1u);
-    std::unique_ptr<zen::PluginInstance> settings(
-        GetZenPluginInterface()->CreatePlugin(zen::kControlPluginKind, "Test Console Settings"));
+    EXPECT_EQ(assertions.Assertions().size(), 2u);
+    const auto settings = Create(zen::kControlPluginKind, "Test Console Settings");
     EXPECT_NE(settings, nullptr);
 }
 
 TEST(ControlPlugin, ParametersStateAndCasts) {
-    std::unique_ptr<zen::PluginInstance> settings(
-        GetZenPluginInterface()->CreatePlugin(zen::kControlPluginKind, "Test Console Settings"));
+    const auto settings = Create(zen::kControlPluginKind, "Test Console Settings");
     ASSERT_NE(settings, nullptr);
     EXPECT_EQ(settings->GetKind(), zen::kControlPluginKind);
     EXPECT_EQ(settings->GetDescriptor(), nullptr);
@@ -172,8 +159,7 @@ TEST(ControlPlugin, ParametersStateAndCasts) {
     EXPECT_FALSE(control->SetParameter(2, 1.0f));
     const std::string state = control->SaveState();
 
-    std::unique_ptr<zen::PluginInstance> other(
-        GetZenPluginInterface()->CreatePlugin(zen::kControlPluginKind, "Test Console Settings"));
+    const auto other = Create(zen::kControlPluginKind, "Test Console Settings");
     ControlPlugin* restored = zen::InterfaceCast<ControlPlugin>(other.get());
     ASSERT_TRUE(restored->LoadState(state));
     EXPECT_FLOAT_EQ(restored->GetParameter(0), -4.5f);

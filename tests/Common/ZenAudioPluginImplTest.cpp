@@ -11,33 +11,23 @@
 
 using zentest::PluginHarness;
 
-TEST(ZenAudioPluginImpl, DefaultLayoutAndLimits) {
+TEST(ZenAudioPluginImpl, RefusesLayoutsRatesAndBlocksItCannotTake) {
     PluginHarness plugin("Test Delay");
     AudioPlugin& audio = plugin.Audio();
     EXPECT_EQ(audio.GetInputChannelCount(), 2u);
     EXPECT_EQ(audio.GetOutputChannelCount(), 2u);
+    std::vector<float> x = {1.0f, 2.0f};
+    float* channels[2] = {x.data(), x.data()};
+    EXPECT_FALSE(audio.Process(channels, 1));  // before Prepare: untouched
+    EXPECT_EQ(x[0], 1.0f);
     EXPECT_TRUE(audio.ConfigureChannels(1, 1));
     EXPECT_FALSE(audio.ConfigureChannels(3, 3));  // beyond the descriptor's limit
     EXPECT_FALSE(audio.ConfigureChannels(2, 1));  // outputs must match inputs
     EXPECT_FALSE(audio.ConfigureChannels(0, 0));
     EXPECT_EQ(audio.GetInputChannelCount(), 1u);
-}
-
-TEST(ZenAudioPluginImpl, PrepareRefusesNonsense) {
-    PluginHarness plugin("Test Delay");
-    EXPECT_FALSE(plugin.Audio().Prepare(0.0f, 512));
-    EXPECT_FALSE(plugin.Audio().Prepare(NAN, 512));
-    EXPECT_FALSE(plugin.Audio().Prepare(48000.0f, 0));
-    EXPECT_FALSE(plugin.Audio().Prepare(1e6f, 512));
-    EXPECT_TRUE(plugin.Audio().Prepare(22050.0f, 1));
-}
-
-TEST(ZenAudioPluginImpl, ProcessBeforePrepareLeavesBuffersUntouched) {
-    PluginHarness plugin("Test Delay");
-    std::vector<float> x = {1.0f, 2.0f};
-    float* channels[2] = {x.data(), x.data()};
-    EXPECT_FALSE(plugin.Audio().Process(channels, 1));
-    EXPECT_EQ(x[0], 1.0f);
+    for (float rate : {0.0f, NAN, 1e6f}) EXPECT_FALSE(audio.Prepare(rate, 512)) << rate;
+    EXPECT_FALSE(audio.Prepare(48000.0f, 0));
+    EXPECT_TRUE(audio.Prepare(22050.0f, 1));
 }
 
 TEST(ZenAudioPluginImpl, ParameterIndicesValuesAndClamping) {

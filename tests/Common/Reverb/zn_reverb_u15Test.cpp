@@ -60,20 +60,20 @@ void ExpectDecay(float rate, float t60) {
 
 }  // namespace
 
-TEST(zn_reverb_u15, DecayYouSetIsTheDecayYouGetAt48k) {
-    for (float t60 : {0.3f, 0.5f, 1.0f, 2.0f, 5.0f, 10.0f}) ExpectDecay(48000.0f, t60);
-}
+class DecayYouSet : public testing::TestWithParam<std::pair<float, float>> {};
 
-TEST(zn_reverb_u15, DecayYouSetIsTheDecayYouGetAt44k1) {
-    for (float t60 : {0.3f, 3.0f}) ExpectDecay(44100.0f, t60);
-}
+TEST_P(DecayYouSet, IsTheDecayYouGet) { ExpectDecay(GetParam().first, GetParam().second); }
 
-TEST(zn_reverb_u15, DecayYouSetIsTheDecayYouGetAt96kAnd192k) {
-    // The resampled objects run the same room at 48 kHz.
-    ExpectDecay(96000.0f, 0.3f);
-    ExpectDecay(96000.0f, 1.5f);
-    ExpectDecay(192000.0f, 1.0f);
-}
+// The resampled objects at 96 and 192 kHz run the same room at 48 kHz.
+INSTANTIATE_TEST_SUITE_P(RatesAndTimes, DecayYouSet,
+                         testing::Values(std::pair{48000.0f, 0.3f}, std::pair{48000.0f, 0.5f}, std::pair{48000.0f, 1.0f},
+                                         std::pair{48000.0f, 2.0f}, std::pair{48000.0f, 5.0f}, std::pair{48000.0f, 10.0f},
+                                         std::pair{44100.0f, 0.3f}, std::pair{44100.0f, 3.0f}, std::pair{96000.0f, 0.3f},
+                                         std::pair{96000.0f, 1.5f}, std::pair{192000.0f, 1.0f}),
+                         [](const testing::TestParamInfo<std::pair<float, float>>& p) {
+                             return "At" + std::to_string(int(p.param.first)) + "HzT60Of" +
+                                    std::to_string(int(p.param.second * 1000)) + "ms";
+                         });
 
 TEST(zn_reverb_u15, HighsDecayFasterAsTheRatioFalls) {
     const float t60 = 1.0f;

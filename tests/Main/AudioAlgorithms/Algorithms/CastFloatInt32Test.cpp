@@ -17,25 +17,15 @@ TEST(CastFloatInt32, RoundsTiesToEvenSaturatesAndSendsNaNToZero) {
     std::vector<std::int32_t> out(in.size());
     const CastFloatInt32 cast;
     cast.ToInt32(in.data(), out.data(), in.size(), 1.0f);
-    const std::vector<std::int32_t> want = {0,
-                                            2,
-                                            2,
-                                            0,
-                                            -2,
-                                            1,
-                                            std::numeric_limits<std::int32_t>::max() - 127,
-                                            std::numeric_limits<std::int32_t>::min(),
-                                            1,
-                                            -1,
-                                            0,
-                                            std::numeric_limits<std::int32_t>::max() - 127};
-    EXPECT_EQ(out, want);
+    const std::int32_t top = std::numeric_limits<std::int32_t>::max() - 127;  // the largest float below 2^31
+    const std::int32_t bottom = std::numeric_limits<std::int32_t>::min();
+    EXPECT_EQ(out, (std::vector<std::int32_t>{0, 2, 2, 0, -2, 1, top, bottom, 1, -1, 0, top}));
     // Full scale at the PCM scale: +1.0 saturates just below 2^31, -1.0 is exact.
     const float ends[2] = {1.0f, -1.0f};
     std::int32_t pcm[2];
     cast.ToInt32(ends, pcm, 2, CastFloatInt32::kPcm32Scale);
-    EXPECT_EQ(pcm[0], 2147483520);
-    EXPECT_EQ(pcm[1], std::numeric_limits<std::int32_t>::min());
+    EXPECT_EQ(pcm[0], top);
+    EXPECT_EQ(pcm[1], bottom);
 }
 
 TEST(CastFloatInt32, TwentyFourBitSamplesRoundTripExactly) {

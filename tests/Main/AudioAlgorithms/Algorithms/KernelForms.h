@@ -1,7 +1,6 @@
 // The kernel forms of the algorithm library, each forced in turn, for tests
 // that compare every form with the reference form. Forms this processor
-// cannot run are skipped, not failed. Parameterised suites derive from
-// FormTest; loops over the forms use ForEachForm.
+// cannot run are skipped, not failed.
 #pragma once
 
 #include <gtest/gtest.h>
@@ -50,10 +49,6 @@ inline bool Fused(ora::system::KernelForm form) {
     return form == ora::system::KernelForm::M128Fma || form == ora::system::KernelForm::M256Fma;
 }
 
-inline std::string Name(const testing::TestParamInfo<Form>& info) {
-    return ora::system::KernelFormName(info.param.form);
-}
-
 // Lengths that catch tails and vector-width mistakes.
 inline const std::vector<std::size_t>& AwkwardLengths() {
     static const std::vector<std::size_t> lengths = {0,  1,  2,  3,  4,  5,  6,  7,  8,   9,   10,
@@ -76,30 +71,12 @@ inline std::vector<float> RandomFloats(std::size_t n, std::uint32_t seed, float 
     return v;
 }
 
-// A buffer with a guard zone after `size` floats, starting one float past a
-// 64-byte boundary so that no form relies on alignment.
-class GuardedBuffer {
-public:
-    static constexpr std::size_t kGuard = 32;
-    static constexpr float kSentinel = 12345.0f;
-    explicit GuardedBuffer(std::size_t size) : m_storage(size + kGuard + 17, kSentinel), m_size(size) {
-        const auto address = reinterpret_cast<std::uintptr_t>(m_storage.data());
-        m_offset = ((64 - address % 64) % 64) / sizeof(float) + 1;
-        std::fill(data(), data() + size, 0.0f);
-    }
-    float* data() { return m_storage.data() + m_offset; }
-    std::vector<float> Values() { return std::vector<float>(data(), data() + m_size); }
-    bool GuardIntact() {
-        for (std::size_t i = 0; i < kGuard; ++i)
-            if (data()[m_size + i] != kSentinel) return false;
-        return true;
-    }
-
-private:
-    std::vector<float> m_storage;
-    std::size_t m_size;
-    std::size_t m_offset = 0;
-};
+// Symmetric taps of `length` from their first half.
+inline std::vector<float> Symmetric(const std::vector<float>& half, std::size_t length) {
+    std::vector<float> h(length);
+    for (std::size_t k = 0; k < length; ++k) h[k] = half[std::min(k, length - 1 - k)];
+    return h;
+}
 
 // Samples one float past a 64-byte boundary, with guard zones before and
 // after them that must stay untouched; for floats and 32-bit integers.
@@ -116,6 +93,7 @@ public:
     }
     T* data() { return m_store.data() + m_offset; }
     T& operator[](std::size_t i) { return data()[i]; }
+    std::vector<T> Values() { return std::vector<T>(data(), data() + m_size); }
     bool GuardsIntact() const {
         for (std::size_t i = m_offset - kGuard; i < m_offset; ++i)
             if (std::memcmp(&m_store[i], &kPattern, sizeof(T)) != 0) return false;
@@ -153,12 +131,5 @@ void ForEachForm(bool hasFusedForms, Body body) {
         body(form, hasFusedForms ? name : name.substr(0, name.find("_fma")));
     }
 }
-
-class FormTest : public testing::TestWithParam<Form> {
-protected:
-    void SetUp() override {
-        if (!Runnable(GetParam())) GTEST_SKIP() << "this processor cannot run the form";
-    }
-};
 
 }  // namespace kerneltest

@@ -1,5 +1,6 @@
 // The 16-lane damping and the 16-lane tone correction: responses, the
-// denormal guard, state carried across blocks and forms, every form against ref.
+// denormal guard and the state a rebuild to another form keeps (the forms
+// against ref are in FormEquivalenceTest).
 #include <gtest/gtest.h>
 
 #include <cfloat>
@@ -23,6 +24,7 @@ std::vector<float> SteadyGains(Filter& filter, bool alternating) {
     for (std::size_t f = 0; f < frames; ++f)
         for (int i = 0; i < 16; ++i) in[f * 16 + i] = alternating && f % 2 ? -1.0f : 1.0f;
     filter.Process(in.data(), out.data(), frames);
+    filter.Reset();
     std::vector<float> gains(16);
     for (int i = 0; i < 16; ++i) gains[i] = std::fabs(out[(frames - 1) * 16 + i]);
     return gains;
@@ -37,17 +39,21 @@ void Coefficients(float* c, float* g) {
 
 }  // namespace
 
-TEST(Lpf16, UnitDcGainTimesTheLaneGainAndDampedNyquist) {
+TEST(Lpf16, BothLowPassesHaveTheLaneGainAtDcAndADampedNyquist) {
     float c[16], g[16];
     Coefficients(c, g);
-    Lpf16 dc, nyquist;
-    dc.SetCoefficients(c, g);
-    nyquist.SetCoefficients(c, g);
-    const auto atDc = SteadyGains(dc, false);
-    const auto atNyquist = SteadyGains(nyquist, true);
+    Lpf16 damping;
+    damping.SetCoefficients(c, g);
+    Lpfm16 tone;  // unit gain
+    tone.SetCoefficients(c);
+    const auto dampingDc = SteadyGains(damping, false), dampingNyquist = SteadyGains(damping, true);
+    const auto toneDc = SteadyGains(tone, false), toneNyquist = SteadyGains(tone, true);
     for (int i = 0; i < 16; ++i) {
-        EXPECT_NEAR(atDc[i], g[i], 1e-5) << i;
-        EXPECT_NEAR(atNyquist[i], g[i] * (1.0f + c[i]) / (1.0f - c[i]), 1e-4) << i;
+        const float nyquist = (1.0f + c[i]) / (1.0f - c[i]);
+        EXPECT_NEAR(dampingDc[i], g[i], 1e-5) << i;
+        EXPECT_NEAR(dampingNyquist[i], g[i] * nyquist, 1e-4) << i;
+        EXPECT_NEAR(toneDc[i], 1.0f, 1e-5) << i;
+        EXPECT_NEAR(toneNyquist[i], nyquist, 1e-4) << i;
     }
 }
 
@@ -71,80 +77,33 @@ TEST(Lpf16, DecayingStateNeverTurnsDenormal) {
     }
 }
 
-TEST(Lpfm16, LowPassOfUnitDcGainPerChannel) {
-    float c[16], unused[16];
-    Coefficients(c, unused);
-    Lpfm16 dc, nyquist;
-    dc.SetCoefficients(c);
-    nyquist.SetCoefficients(c);
-    const auto atDc = SteadyGains(dc, false);
-    const auto atNyquist = SteadyGains(nyquist, true);
-    for (int i = 0; i < 16; ++i) {
-        EXPECT_NEAR(atDc[i], 1.0f, 1e-5) << i;
-        EXPECT_NEAR(atNyquist[i], (1.0f + c[i]) / (1.0f - c[i]), 1e-4) << i;
-    }
-}
-
-class LowPassForms : public kerneltest::FormTest {};
-
-TEST_P(LowPassForms, Lpf16AgreesWithRefAndCarriesStateAcrossBlocks) {
-    float c[16], g[16];
-    Coefficients(c, g);
-    const std::size_t frames = 999;
-    const auto in = kerneltest::RandomFloats(frames * 16, 5);
-    std::vector<float> expected(frames * 16);
-    {
-        ScopedDispatch forced(ora::system::InstructionLevel::None, false);
-        Lpf16 ref;
-        ref.SetCoefficients(c, g);
-        ref.Process(in.data(), expected.data(), frames);
-    }
-    ScopedDispatch forced(GetParam().level, GetParam().fma);
-    Lpf16 form;
-    form.SetCoefficients(c, g);
-    EXPECT_EQ(form.Form(), GetParam().form);
-    kerneltest::GuardedBuffer out(frames * 16);
-    std::size_t done = 0;
-    for (std::size_t block : kerneltest::AwkwardLengths()) {  // 0..17, 65 and the rest
-        const std::size_t n = std::min(block, frames - done);
-        form.Process(in.data() + done * 16, out.data() + done * 16, n);
-        done += n;
-    }
-    form.Process(in.data() + done * 16, out.data() + done * 16, frames - done);
-    const auto got = out.Values();
-    EXPECT_TRUE(out.GuardIntact());
-    for (std::size_t i = 0; i < got.size(); ++i) {
-        if (kerneltest::Fused(GetParam().form)) ASSERT_NEAR(got[i], expected[i], 2e-6f) << i;
-        else ASSERT_EQ(got[i], expected[i]) << i;
-    }
-}
-
-TEST_P(LowPassForms, Lpfm16AgreesWithRefAndARebuildKeepsTheState) {
+TEST(Lpfm16, ARebuildToAnotherFormKeepsTheState) {
     float c[16], unused[16];
     Coefficients(c, unused);
     const std::size_t frames = 300;
     const auto in = kerneltest::RandomFloats(frames * 16, 6);
-    std::vector<float> expected(frames * 16), got(frames * 16);
+    std::vector<float> expected(frames * 16);
     {
         ScopedDispatch forced(ora::system::InstructionLevel::None, false);
         Lpfm16 ref;
         ref.SetCoefficients(c);
         ref.Process(in.data(), expected.data(), frames);
     }
-    Lpfm16 filter;
-    filter.SetCoefficients(c);
-    {
-        ScopedDispatch forced(ora::system::InstructionLevel::None, false);
-        filter.Rebuild();
-        filter.Process(in.data(), got.data(), 100);
-    }
-    ScopedDispatch forced(GetParam().level, GetParam().fma);
-    filter.Rebuild();  // the state carries over to the new form
-    filter.Process(in.data() + 1600, got.data() + 1600, frames - 100);
-    for (std::size_t i = 0; i < got.size(); ++i) {
-        if (kerneltest::Fused(GetParam().form)) ASSERT_NEAR(got[i], expected[i], 2e-6f) << i;
-        else ASSERT_EQ(got[i], expected[i]) << i;
-    }
+    kerneltest::ForEachForm(true, [&](const kerneltest::Form& form, const std::string& name) {
+        std::vector<float> got(frames * 16);
+        Lpfm16 filter;
+        filter.SetCoefficients(c);
+        {
+            ScopedDispatch forced(ora::system::InstructionLevel::None, false);
+            filter.Rebuild();
+            filter.Process(in.data(), got.data(), 100);
+        }
+        filter.Rebuild();  // back to the form forced outside
+        EXPECT_EQ(filter.FormName(), name);
+        filter.Process(in.data() + 1600, got.data() + 1600, frames - 100);
+        for (std::size_t i = 0; i < got.size(); ++i) {
+            if (kerneltest::Fused(form.form)) ASSERT_NEAR(got[i], expected[i], 2e-6f) << name << " at " << i;
+            else ASSERT_EQ(got[i], expected[i]) << name << " at " << i;
+        }
+    });
 }
-
-INSTANTIATE_TEST_SUITE_P(Forms, LowPassForms, testing::ValuesIn(kerneltest::AllForms()), kerneltest::Name);

@@ -1,5 +1,5 @@
 // Polyphase up- and down-samplers: pass band, image and alias rejection,
-// group delay, multichannel reference, every form against ref.
+// group delay, multichannel reference (the forms are in FormEquivalenceTest).
 #include <gtest/gtest.h>
 
 #include <cmath>
@@ -10,19 +10,12 @@
 #include "Algorithms/KaiserLowPass.h"
 #include "Algorithms/Upsampler.h"
 #include "KernelForms.h"
+#include "Support/Signals.h"
 
 using namespace ora::numeric;
-using ora::system::ScopedDispatch;
+using zentest::kPi;
 
 namespace {
-
-constexpr double kPi = 3.141592653589793;
-
-std::vector<float> Sine(double f, double fs, std::size_t n) {
-    std::vector<float> x(n);
-    for (std::size_t i = 0; i < n; ++i) x[i] = static_cast<float>(std::sin(2.0 * kPi * f * double(i) / fs));
-    return x;
-}
 
 // Amplitude of frequency f over x[from, from + n), n a whole number of periods.
 double Amplitude(const std::vector<float>& x, double f, double fs, std::size_t from, std::size_t n) {
@@ -59,7 +52,7 @@ TEST(KaiserLowPass, UnitDcGainSymmetricAndDeepStopBand) {
 TEST(Upsampler, PassesTheBandRejectsImagesAndDelaysByHalfItsLength) {
     for (std::size_t factor : {2u, 4u, 8u}) {
         const double fs = 48000.0, high = fs * double(factor);
-        const auto out = Upsample(factor, Sine(1000.0, fs, 9600), 512);
+        const auto out = Upsample(factor, zentest::Sine(1000.0, fs, 9600), 512);
         const std::size_t n = 48 * 100 * factor;  // 100 periods, after the warm-up
         EXPECT_NEAR(Amplitude(out, 1000.0, high, 4000 * factor, n), 1.0, 0.002) << factor;
         for (double image : {fs - 1000.0, fs + 1000.0})
@@ -85,7 +78,7 @@ TEST(Downsampler, PassesTheBandAndRejectsAliases) {
         const double low = 48000.0, fs = low * double(factor);
         Downsampler down({factor, 32, {}, 1, 2048});
         auto run = [&](double f) {
-            const auto in = Sine(f, fs, 9600 * factor);
+            const auto in = zentest::Sine(f, fs, 9600 * factor);
             std::vector<float> out(9600);
             for (std::size_t done = 0; done < in.size(); done += 2048) {
                 down.Process(in.data() + done, out.data() + done / factor, std::min<std::size_t>(2048, in.size() - done));
@@ -124,62 +117,3 @@ TEST(Polyphase, BadShapesAreRefused) {
     EXPECT_THROW(Downsampler({1, 8, {}, 1, 64}), std::invalid_argument);
     EXPECT_THROW(Upsampler({2, 8, {}, 0, 64}), std::invalid_argument);
 }
-
-class PolyphaseForms : public kerneltest::FormTest {
-protected:
-    static void ExpectClose(const std::vector<float>& got, const std::vector<float>& expected, bool fused) {
-        ASSERT_EQ(got.size(), expected.size());
-        for (std::size_t i = 0; i < got.size(); ++i) {
-            if (fused) ASSERT_NEAR(got[i], expected[i], 1e-5f) << i;
-            else ASSERT_EQ(got[i], expected[i]) << i;
-        }
-    }
-};
-
-TEST_P(PolyphaseForms, UpsamplersAgreeWithRefInAnyBlockSplit) {
-    for (std::size_t factor : {2u, 4u, 8u}) {
-        const std::size_t total = 1200;
-        const auto in = kerneltest::RandomFloats(total, 7 + factor);
-        auto run = [&](bool asRef) {
-            ScopedDispatch forced(asRef ? ora::system::InstructionLevel::None : GetParam().level,
-                                  asRef ? false : GetParam().fma);
-            Upsampler up({factor, 12, {}, 1, 1000});
-            kerneltest::GuardedBuffer out(total * factor);
-            std::size_t done = 0;
-            for (std::size_t block : kerneltest::AwkwardLengths()) {
-                const std::size_t n = std::min(block, total - done);
-                up.Process(in.data() + done, out.data() + done * factor, n);
-                done += n;
-            }
-            up.Process(in.data() + done, out.data() + done * factor, total - done);
-            EXPECT_TRUE(out.GuardIntact()) << factor;
-            return out.Values();
-        };
-        ExpectClose(run(false), run(true), kerneltest::Fused(GetParam().form));
-    }
-}
-
-TEST_P(PolyphaseForms, DownsamplersAgreeWithRefInAnyBlockSplit) {
-    for (std::size_t factor : {2u, 4u}) {
-        const std::size_t total = 4000;
-        const auto in = kerneltest::RandomFloats(total, 9 + factor);
-        auto run = [&](bool asRef) {
-            ScopedDispatch forced(asRef ? ora::system::InstructionLevel::None : GetParam().level,
-                                  asRef ? false : GetParam().fma);
-            Downsampler down({factor, 12, {}, 1, total});
-            kerneltest::GuardedBuffer out(total / factor);
-            std::size_t done = 0;
-            for (std::size_t blocks : kerneltest::AwkwardLengths()) {
-                const std::size_t n = std::min(blocks * factor, total - done);
-                down.Process(in.data() + done, out.data() + done / factor, n);
-                done += n;
-            }
-            down.Process(in.data() + done, out.data() + done / factor, total - done);
-            EXPECT_TRUE(out.GuardIntact()) << factor;
-            return out.Values();
-        };
-        ExpectClose(run(false), run(true), kerneltest::Fused(GetParam().form));
-    }
-}
-
-INSTANTIATE_TEST_SUITE_P(Forms, PolyphaseForms, testing::ValuesIn(kerneltest::AllForms()), kerneltest::Name);

@@ -1,4 +1,5 @@
-// The 15-line mixing matrix: orthogonality, losslessness, every form against ref.
+// The 15-line mixing matrix: its design, orthogonality and losslessness
+// (the forms are in FormEquivalenceTest).
 #include <gtest/gtest.h>
 
 #include <cmath>
@@ -8,7 +9,6 @@
 #include "KernelForms.h"
 
 using namespace ora::numeric;
-using ora::system::ScopedDispatch;
 
 namespace {
 
@@ -60,32 +60,3 @@ TEST(U15p, KeepsTheEnergyOfAnyFrameAndIgnoresLane15) {
         EXPECT_EQ(m[f * 16 + 15], 7.0f);  // left as it was
     }
 }
-
-class U15pForms : public kerneltest::FormTest {};
-
-TEST_P(U15pForms, AgreeWithRefBitForBit) {
-    for (std::size_t frames : {0u, 1u, 2u, 3u, 17u, 65u}) {
-        const auto d = kerneltest::RandomFloats(16 * frames, 10 + frames, 3.0f);
-        const auto u = kerneltest::RandomFloats(16 * frames, 20 + frames, 3.0f);
-        std::vector<float> expected(16 * frames, -1.0f);
-        {
-            ScopedDispatch forced(ora::system::InstructionLevel::None, false);
-            U15p ref;
-            ref.Process(d.data(), u.data(), expected.data(), frames);
-        }
-        ScopedDispatch forced(GetParam().level, GetParam().fma);
-        U15p form;
-        kerneltest::GuardedBuffer out(16 * frames);
-        std::fill(out.data(), out.data() + 16 * frames, -1.0f);
-        form.Process(d.data(), u.data(), out.data(), frames);
-        EXPECT_EQ(out.Values(), expected) << frames << " frames, " << form.FormName();
-        EXPECT_TRUE(out.GuardIntact());
-        // In place over d.
-        std::vector<float> inPlace = d;
-        form.Process(inPlace.data(), u.data(), inPlace.data(), frames);
-        for (std::size_t f = 0; f < frames; ++f)
-            for (int i = 0; i < 15; ++i) ASSERT_EQ(inPlace[f * 16 + i], expected[f * 16 + i]);
-    }
-}
-
-INSTANTIATE_TEST_SUITE_P(Forms, U15pForms, testing::ValuesIn(kerneltest::AllForms()), kerneltest::Name);

@@ -121,7 +121,7 @@ TEST(PitchShiftEngine, AToneBurstStaysAlignedWithTheInput) {
     }
 }
 
-TEST(PitchShiftEngine, ZeroShiftIsNearlyTransparentAndDryGivesTheDelayedInput) {
+TEST(PitchShiftEngine, ZeroShiftIsNearlyTransparentAndTheMixIsLinearFromDryToWet) {
     const auto x = SpeechLike(kLength);
     ShifterSettings s;
     const auto y = zentest::Shift(x, s);
@@ -135,19 +135,13 @@ TEST(PitchShiftEngine, ZeroShiftIsNearlyTransparentAndDryGivesTheDelayedInput) {
     EXPECT_LT(differenceDb, -60.0);
 
     s.coarse = 5;
-    s.dryWet = 0.0f;
-    const auto dry = zentest::Shift(x, s);
-    for (std::size_t i = 0; i < kLength; ++i) ASSERT_EQ(dry[i], x[i]) << i;
-}
-
-TEST(PitchShiftEngine, DryWetMixesLinearly) {
-    const auto x = HarmonicTone(220.0, 3, 20000);
-    ShifterSettings s;
-    s.coarse = 3;
     const auto wet = zentest::Shift(x, s);
     s.dryWet = 25.0f;
     const auto mixed = zentest::Shift(x, s);
-    for (std::size_t i = 0; i < x.size(); i += 97) EXPECT_NEAR(mixed[i], 0.25f * wet[i] + 0.75f * x[i], 1e-5f) << i;
+    for (std::size_t i = 0; i < kLength; i += 97) EXPECT_NEAR(mixed[i], 0.25f * wet[i] + 0.75f * x[i], 1e-5f) << i;
+    s.dryWet = 0.0f;
+    const auto dry = zentest::Shift(x, s);
+    for (std::size_t i = 0; i < kLength; ++i) ASSERT_EQ(dry[i], x[i]) << i;
 }
 
 TEST(PitchShiftEngine, BlockSizeDoesNotChangeTheResult) {
@@ -163,14 +157,16 @@ TEST(PitchShiftEngine, BlockSizeDoesNotChangeTheResult) {
     }
 }
 
-TEST(PitchShiftEngine, LatencyIsTheLeastTheLowestRatioNeeds) {
+TEST(PitchShiftEngine, LatencyIsTheLeastTheLowestRatioNeedsAndNoOverlapIsRefused) {
     ora::pitchshift::EngineParam param(4096, 4, 4096, 2);
     ora::pitchshift::Engine engine(param);
     ASSERT_TRUE(engine.Configure(2));
-    // Half a frame, plus half a frame and the look-ahead at 13 semitones down.
-    const double least = 2048.0 + std::ceil((2048.0 + 2.0) / std::pow(2.0, -13.0 / 12.0)) + 8.0;
-    EXPECT_EQ(engine.Latency(), static_cast<std::size_t>(least));
+    // Half a frame, plus half a frame and the look-ahead (2) read at 13
+    // semitones down, plus 8: 2048 + ceil(2050 * 2^(13/12)) + 8.
     EXPECT_EQ(engine.Latency(), 6400u);
+    ora::pitchshift::EngineParam noOverlap(4096, 0, 4096, 2);
+    EXPECT_FALSE(noOverlap.m_stretch.IsValid());
+    EXPECT_FALSE(ora::pitchshift::Engine(noOverlap).Configure(1));
 }
 
 TEST(PitchShiftEngine, SettingsApplyInOrderUntilNoChangeIsPending) {
@@ -190,33 +186,8 @@ TEST(PitchShiftEngine, SettingsApplyInOrderUntilNoChangeIsPending) {
     engine.Apply(wanted, engine.Changes(wanted));
     EXPECT_EQ(engine.Pending(), 0u);
     EXPECT_EQ(engine.Changes(wanted), 0u);
-    EXPECT_FLOAT_EQ(param.m_interp.m_OutputRatio, static_cast<float>(std::pow(2.0, -287.5 / 1200.0)));
-    EXPECT_FLOAT_EQ(engine.Retimer().Stretch().WetGain(), 0.4f);
-    EXPECT_FLOAT_EQ(engine.Retimer().Stretch().DryGain(), 0.6f);
     EXPECT_EQ(param.m_stretch.mode, ora::fft::stretch::pv::Mode::PV);
-    EXPECT_EQ(param.m_stretch.algorithm, ora::fft::stretch::pv::Algorithm::PGHI);
-
     // Tiny differences are no change.
     wanted.fine += 1e-8f;
     EXPECT_EQ(engine.Changes(wanted), 0u);
-}
-
-TEST(PitchShiftEngine, ParameterSetsStartAtTheirDefaults) {
-    ora::pitchshift::EngineParam param(4096, 4, 4096, 2);
-    EXPECT_EQ(param.m_stretch.Bins(), 2049u);
-    EXPECT_EQ(param.m_stretch.Hop(), 1024u);
-    EXPECT_EQ(param.m_stretch.Gain(), 1.0f);
-    EXPECT_EQ(param.m_stretch.PeakCapacity(), 256u);
-    EXPECT_TRUE(param.m_stretch.IsValid());
-    EXPECT_EQ(param.m_interp.m_InputRate, 1.0f);
-    EXPECT_EQ(param.m_interp.m_OutputRatio, 1.0f);
-    EXPECT_EQ(param.m_rateControl.m_Origin, 0);
-    EXPECT_EQ(param.m_rateControl.m_Rate, 1.0f);
-    EXPECT_EQ(param.m_rateControl.m_Glide, 0.001f);
-    EXPECT_EQ(param.m_rateControl.m_FifoCapacity, 20000);
-
-    ora::pitchshift::EngineParam noOverlap(4096, 0, 4096, 2);
-    EXPECT_FALSE(noOverlap.m_stretch.IsValid());
-    ora::pitchshift::Engine engine(noOverlap);
-    EXPECT_FALSE(engine.Configure(1));
 }

@@ -29,82 +29,53 @@ TEST(CpuInfo, DetectionFillsTheFeatureFields) {
     EXPECT_EQ(info.avx2 && info.osAvx, __builtin_cpu_supports("avx2") != 0);
 }
 
-TEST(DispatchSettings, ForcedLevelZeroMakesEveryQueryFalse) {
-    ScopedDispatch forced(InstructionLevel::None, false);
-    for (bool feature : {HasSSE(), HasSSE2(), HasSSE3(), HasLevel4(), HasSSE41(), HasSSE42(), HasAVX(), HasAVX2(),
-                         HasFMA(), HasWideVectors()})
-        EXPECT_FALSE(feature);
-    EXPECT_EQ(ChooseKernelForm(), KernelForm::Ref);
-}
-
-TEST(DispatchSettings, ForcedLevelsAreOrdered) {
+TEST(DispatchSettings, ForcedLevelsAreOrderedAndStandInForTheProcessor) {
+    {
+        ScopedDispatch forced(InstructionLevel::None, false);
+        for (bool feature : {HasSSE(), HasSSE2(), HasSSE3(), HasLevel4(), HasSSE41(), HasSSE42(), HasAVX(), HasAVX2(),
+                             HasFMA(), HasWideVectors()})
+            EXPECT_FALSE(feature);
+    }
     {
         ScopedDispatch forced(InstructionLevel::SSSE3, false);
-        EXPECT_TRUE(HasSSE3());
-        EXPECT_TRUE(HasLevel4());
+        EXPECT_TRUE(HasSSE3() && HasLevel4());
         EXPECT_FALSE(HasSSE41());
+        // The forced counts replace the detected ones.
+        EXPECT_EQ(LogicalProcessorCount(), 64);
+        EXPECT_EQ(PhysicalCoreCount(), 4);
     }
-    {
-        ScopedDispatch forced(InstructionLevel::AVX2, true);
-        EXPECT_TRUE(HasSSE42());
-        EXPECT_TRUE(HasAVX());
-        EXPECT_TRUE(HasAVX2());
-        EXPECT_TRUE(HasFMA());
-        EXPECT_FALSE(HasWideVectors());
-    }
+    ScopedDispatch forced(InstructionLevel::AVX2, true);
+    EXPECT_TRUE(HasSSE42() && HasAVX() && HasAVX2() && HasFMA());
+    EXPECT_FALSE(HasWideVectors());
 }
 
-TEST(DispatchSettings, TheLadder) {
+TEST(DispatchSettings, EachFamilyClimbsItsOwnLadderOfForms) {
     struct Case {
         InstructionLevel level;
         bool fma;
-        KernelForm expected;
-    } cases[] = {
-        {InstructionLevel::AVX2, true, KernelForm::M256Fma}, {InstructionLevel::AVX, true, KernelForm::M256Fma},
-        {InstructionLevel::AVX, false, KernelForm::M256},    // AVX without FMA: plain 256-bit
-        {InstructionLevel::SSE42, true, KernelForm::M128Fma},  // FMA below AVX: 128-bit fused
-        {InstructionLevel::SSE2, false, KernelForm::M128},   {InstructionLevel::SSE, false, KernelForm::Ref},
-    };
-    for (const Case& c : cases) {
-        ScopedDispatch forced(c.level, c.fma);
-        EXPECT_EQ(ChooseKernelForm(), c.expected) << static_cast<int>(c.level) << " fma " << c.fma;
-    }
-}
-
-TEST(DispatchSettings, FamiliesWithoutFusedOrFloatFormsHaveTheirOwnLadders) {
-    struct Case {
-        InstructionLevel level;
-        bool fma;
-        KernelForm plain;
+        KernelForm withFma, plain;
         IntegerKernelForm integer;
     } cases[] = {
-        {InstructionLevel::AVX2, true, KernelForm::M256, IntegerKernelForm::M256Avx2},
-        {InstructionLevel::AVX, true, KernelForm::M256, IntegerKernelForm::M128Sse41},  // AVX without AVX2
-        {InstructionLevel::SSE42, true, KernelForm::M128, IntegerKernelForm::M128Sse41},
-        {InstructionLevel::SSSE3, false, KernelForm::M128, IntegerKernelForm::Ref},  // no 32-bit multiply yet
-        {InstructionLevel::None, false, KernelForm::Ref, IntegerKernelForm::Ref},
+        {InstructionLevel::AVX2, true, KernelForm::M256Fma, KernelForm::M256, IntegerKernelForm::M256Avx2},
+        // AVX without AVX2 has no 256-bit integers.
+        {InstructionLevel::AVX, true, KernelForm::M256Fma, KernelForm::M256, IntegerKernelForm::M128Sse41},
+        {InstructionLevel::AVX, false, KernelForm::M256, KernelForm::M256, IntegerKernelForm::M128Sse41},
+        // FMA below AVX: 128-bit fused.
+        {InstructionLevel::SSE42, true, KernelForm::M128Fma, KernelForm::M128, IntegerKernelForm::M128Sse41},
+        // No 32-bit integer multiply before SSE4.1.
+        {InstructionLevel::SSSE3, false, KernelForm::M128, KernelForm::M128, IntegerKernelForm::Ref},
+        {InstructionLevel::SSE2, false, KernelForm::M128, KernelForm::M128, IntegerKernelForm::Ref},
+        {InstructionLevel::SSE, false, KernelForm::Ref, KernelForm::Ref, IntegerKernelForm::Ref},
+        {InstructionLevel::None, false, KernelForm::Ref, KernelForm::Ref, IntegerKernelForm::Ref},
     };
     for (const Case& c : cases) {
         ScopedDispatch forced(c.level, c.fma);
+        EXPECT_EQ(ChooseKernelForm(), c.withFma) << static_cast<int>(c.level) << " fma " << c.fma;
         EXPECT_EQ(ChooseKernelFormWithoutFma(), c.plain) << static_cast<int>(c.level);
         EXPECT_EQ(ChooseIntegerKernelForm(), c.integer) << static_cast<int>(c.level);
     }
     EXPECT_STREQ(KernelFormName(IntegerKernelForm::M256Avx2), "m256_avx2");
     EXPECT_STREQ(KernelFormName(IntegerKernelForm::M128Sse41), "m128_sse41");
-}
-
-TEST(DispatchSettings, ForcedCountsStandInForTheDetectedOnes) {
-    ScopedDispatch forced(InstructionLevel::SSE2, false);
-    DispatchSettings& settings = DispatchSettings::Instance();
-    // The five forced integers, in order, with their defaults.
-    EXPECT_EQ(LogicalProcessorCount(), 64);
-    EXPECT_EQ(HighestStandardLeaf(), 32768);
-    EXPECT_EQ(InitialApicId(), 32768);
-    EXPECT_EQ(PhysicalCoreCount(), 4);
-    EXPECT_EQ(settings.GetForcedThreadsPerCore(), 2);
-    settings.SetForcedInitialApicId(3);
-    EXPECT_EQ(InitialApicId(), 3);
-    settings.SetForcedInitialApicId(32768);
 }
 
 TEST(DispatchSettings, DetectedModeFollowsTheProcessor) {
