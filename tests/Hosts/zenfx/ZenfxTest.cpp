@@ -230,47 +230,66 @@ TEST(ZenfxProcess, ValuesTakeUnitsAndChoicesAndLabelsWinOverUpperCaseNames) {
 
 // Each mistake: a non-zero exit, one line on stderr saying what is wrong,
 // no partial or temporary file left, and the files that were there intact.
-TEST(ZenfxErrors, EveryMistakeIsOneLineAndLeavesTheFolderAsItWas) {
+class ZenfxErrors : public testing::Test {
+protected:
+    using Mistakes = std::vector<std::pair<std::vector<std::string>, std::string>>;
+
+    void SetUp() override {
+        WriteAudio(in, {x}, kRate);
+        WriteAudio(folder / "out.wav", {x}, kRate);
+        WriteAudio(folder / "three.wav", {x, x, x}, kRate);
+        std::ofstream(folder / "text.wav") << "this is not audio\n";
+    }
+
+    void ExpectEach(const Mistakes& mistakes) {
+        for (const auto& [args, expected] : mistakes) {
+            const auto result = RunZenfx(args);
+            EXPECT_NE(result.exitCode, 0) << expected;
+            EXPECT_EQ(Lines(result.err), 1u) << result.err;
+            EXPECT_NE(result.err.find(expected), std::string::npos) << result.err;
+            EXPECT_EQ(folder.Files().size(), 4u) << expected << ": a partial or temporary file was left behind";
+        }
+        EXPECT_EQ(ReadAudio(in).samples, x);
+        EXPECT_EQ(ReadAudio(folder / "out.wav").samples, x);
+    }
+
+    // `head`, then "--plugin Soft Clipper", then `tail`.
+    static std::vector<std::string> Clipper(std::vector<std::string> head, const std::vector<std::string>& tail = {}) {
+        head.insert(head.end(), {"--plugin", "Soft Clipper"});
+        head.insert(head.end(), tail.begin(), tail.end());
+        return head;
+    }
+
     TempFolder folder;
     const std::vector<float> x = Ramp(100, 0.5f);
-    WriteAudio(folder / "in.wav", {x}, kRate);
-    WriteAudio(folder / "out.wav", {x}, kRate);
-    WriteAudio(folder / "three.wav", {x, x, x}, kRate);
-    std::ofstream(folder / "text.wav") << "this is not audio\n";
     const std::string in = folder / "in.wav", o = folder / "o.wav";
-    const std::vector<std::string> clipper = {"--plugin", "Soft Clipper"};
-    const auto cmd = [](std::vector<std::string> a, const std::vector<std::string>& b = {}) {
-        a.insert(a.end(), b.begin(), b.end());
-        return a;
-    };
-    const std::pair<std::vector<std::string>, std::string> mistakes[] = {
+};
+
+TEST_F(ZenfxErrors, UnknownNamesAndBadValuesSayWhatIsWrong) {
+    ExpectEach({
         {{"process", "-o", o, "--plugin", "Soft Cliper"}, "did you mean 'Soft Clipper'"},
         {{"info", "Sft Clipper"}, "did you mean 'Soft Clipper'"},
-        {cmd({"process", "-o", o}, cmd(clipper, {"--set", "Treshold=3"})), "did you mean 'Threshold'"},
-        {cmd({"process", "-o", o}, cmd(clipper, {"--set", "Threshold=30"})), "out of range (-18 to 18 dB)"},
-        {cmd({"process", "-o", o}, cmd(clipper, {"--set", "Threshold=loud"})), "not a value"},
-        {cmd({"process", "-o", o}, cmd(clipper, {"--set", "Threshold=3 Hz"})), "takes dB"},
-        {cmd({"process", folder / "missing.wav", "-o", o}, clipper), "cannot read"},
-        {cmd({"process", folder / "text.wav", "-o", o}, clipper), "cannot read"},
-        {cmd({"process", "-o", folder / "o.mp3"}, clipper), "unknown file type"},
-        {cmd({"process", "-o", folder / "o.flac", "--format", "float"}, clipper), "cannot hold float"},
+        {Clipper({"process", "-o", o}, {"--set", "Treshold=3"}), "did you mean 'Threshold'"},
+        {Clipper({"process", "-o", o}, {"--set", "Threshold=30"}), "out of range (-18 to 18 dB)"},
+        {Clipper({"process", "-o", o}, {"--set", "Threshold=loud"}), "not a value"},
+        {Clipper({"process", "-o", o}, {"--set", "Threshold=3 Hz"}), "takes dB"},
+        {Clipper({"process", "-o", folder / "out.wav"}, {"--set", "Shape=7"}), "out of range"},
+    });
+}
+
+TEST_F(ZenfxErrors, FileAndUsageMistakesLeaveEveryFileAsItWas) {
+    ExpectEach({
+        {Clipper({"process", folder / "missing.wav", "-o", o}), "cannot read"},
+        {Clipper({"process", folder / "text.wav", "-o", o}), "cannot read"},
+        {Clipper({"process", "-o", folder / "o.mp3"}), "unknown file type"},
+        {Clipper({"process", "-o", folder / "o.flac", "--format", "float"}), "cannot hold float"},
         {{"--library", ZEN_TEST_LIBRARY_PATH, "process", folder / "three.wav", "-o", o, "--plugin", "Test Delay"},
          "'Test Delay' does not accept 3 channels (it takes 1 or 2)"},
-        {cmd({"process", in, "-o", in}, clipper), "is the input file"},
-        {cmd({"process", in, "-o", folder / "./in.wav"}, clipper), "is the input file"},
-        {cmd({"process", "-o", folder / "out.wav"}, cmd(clipper, {"--set", "Shape=7"})), "out of range"},
-        {cmd({"process", "--set", "a=1", "-o", o}, clipper), "comes before any --plugin"},
+        {Clipper({"process", in, "-o", in}), "is the input file"},
+        {Clipper({"process", in, "-o", folder / "./in.wav"}), "is the input file"},
+        {Clipper({"process", "--set", "a=1", "-o", o}), "comes before any --plugin"},
         {{"process", "-o", o}, "at least one --plugin"},
-        {cmd({"process"}, clipper), "--output"},
+        {Clipper({"process"}), "--output"},
         {{"frobnicate"}, "zenfx"},
-    };
-    for (const auto& [args, expected] : mistakes) {
-        const auto result = RunZenfx(args);
-        EXPECT_NE(result.exitCode, 0) << expected;
-        EXPECT_EQ(Lines(result.err), 1u) << result.err;
-        EXPECT_NE(result.err.find(expected), std::string::npos) << result.err;
-        EXPECT_EQ(folder.Files().size(), 4u) << expected << ": a partial or temporary file was left behind";
-    }
-    EXPECT_EQ(ReadAudio(folder / "in.wav").samples, x);
-    EXPECT_EQ(ReadAudio(folder / "out.wav").samples, x);
+    });
 }
