@@ -1,16 +1,17 @@
 // FIRS, 128-bit fused multiply-add form.
 #include "Algorithms/simd/FIRKernels.h"
-#include "Algorithms/simd/m128/FilterLoops_m128.h"
+#include "Algorithms/simd/FilterBodies.h"
+#include "Algorithms/simd/m128/VecM128.h"
 
 namespace ora::numeric::kernels {
 
 void FIRS_c1_m128_fma(const float* run, const float* half, std::size_t length, float* out, std::size_t frames) {
-    FirSymmetricOne<FusedMulAdd>(run, half, length, out, frames);
+    simd::FirSymmetricOne<VecM128Fma>(run, half, length, out, frames);
 }
 
 void FIRS_c2_m128_fma(const float* run0, const float* run1, const float* half, std::size_t length, float* out0,
                       float* out1, std::size_t frames) {
-    FirSymmetricTwo<FusedMulAdd>(run0, run1, half, length, out0, out1, frames);
+    simd::FirSymmetricTwo<VecM128Fma>(run0, run1, half, length, out0, out1, frames);
 }
 
 }  // namespace ora::numeric::kernels

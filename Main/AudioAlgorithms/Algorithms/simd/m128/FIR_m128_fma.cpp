@@ -1,16 +1,17 @@
 // FIR, 128-bit fused multiply-add form.
 #include "Algorithms/simd/FIRKernels.h"
-#include "Algorithms/simd/m128/FilterLoops_m128.h"
+#include "Algorithms/simd/FilterBodies.h"
+#include "Algorithms/simd/m128/VecM128.h"
 
 namespace ora::numeric::kernels {
 
 void FIR_c1_m128_fma(const float* run, const float* reversed, std::size_t taps, float* out, std::size_t frames) {
-    FirOne<FusedMulAdd>(run, reversed, taps, out, frames);
+    simd::FirOne<VecM128Fma>(run, reversed, taps, out, frames);
 }
 
 void FIR_c2_m128_fma(const float* run0, const float* run1, const float* reversed, std::size_t taps, float* out0,
                      float* out1, std::size_t frames) {
-    FirTwo<FusedMulAdd>(run0, run1, reversed, taps, out0, out1, frames);
+    simd::FirTwo<VecM128Fma>(run0, run1, reversed, taps, out0, out1, frames);
 }
 
 }  // namespace ora::numeric::kernels

@@ -1,16 +1,17 @@
 // FIR, 256-bit plain form.
 #include "Algorithms/simd/FIRKernels.h"
-#include "Algorithms/simd/m256/FilterLoops_m256.h"
+#include "Algorithms/simd/FilterBodies.h"
+#include "Algorithms/simd/m256/VecM256.h"
 
 namespace ora::numeric::kernels {
 
 void FIR_c1_m256(const float* run, const float* reversed, std::size_t taps, float* out, std::size_t frames) {
-    FirOne<SeparateMulAdd>(run, reversed, taps, out, frames);
+    simd::FirOne<VecM256>(run, reversed, taps, out, frames);
 }
 
 void FIR_c2_m256(const float* run0, const float* run1, const float* reversed, std::size_t taps, float* out0,
                  float* out1, std::size_t frames) {
-    FirTwo<SeparateMulAdd>(run0, run1, reversed, taps, out0, out1, frames);
+    simd::FirTwo<VecM256>(run0, run1, reversed, taps, out0, out1, frames);
 }
 
 }  // namespace ora::numeric::kernels

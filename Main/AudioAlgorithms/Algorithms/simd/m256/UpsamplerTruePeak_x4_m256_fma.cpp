@@ -1,12 +1,13 @@
 // UpsamplerTruePeak_x4, 256-bit fused multiply-add form.
 #include "Algorithms/simd/TruePeakKernels.h"
-#include "Algorithms/simd/m256/FilterLoops_m256.h"
+#include "Algorithms/simd/FilterBodies.h"
+#include "Algorithms/simd/m256/VecM256.h"
 
 namespace ora::numeric::kernels {
 
 void UpsamplerTruePeak_x4_m256_fma(const float* run, const float* phases, std::size_t taps, float* out,
                                    std::size_t frames) {
-    UpsampleTruePeak<FusedMulAdd>(run, phases, taps, out, frames);
+    simd::UpsampleTruePeak<VecM256Fma>(run, phases, taps, out, frames);
 }
 
 }  // namespace ora::numeric::kernels
