@@ -4,7 +4,7 @@
 set -eu
 
 PACKAGES="
-  build-essential cmake ninja-build pkg-config binutils
+  build-essential cmake ninja-build pkg-config binutils ccache
   qtbase5-dev qtbase5-dev-tools
   libboost-dev libboost-thread-dev libboost-system-dev
   libpugixml-dev

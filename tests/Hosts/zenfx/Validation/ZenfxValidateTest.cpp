@@ -7,7 +7,7 @@
 #include <set>
 #include <sstream>
 
-#include "ZenfxRunner.h"
+#include "../ZenfxRunner.h"
 
 using zentest::RunZenfx;
 
