@@ -45,7 +45,7 @@ Instance::Instance(std::unique_ptr<zen::PluginInstance> instance, AudioPlugin& a
       m_scratch(static_cast<std::size_t>(m_ports.Inputs()) * kScratchFrames),
       m_parameterPorts(m_ports.ParameterCount(), nullptr),
       m_sent(m_ports.ParameterCount(), std::numeric_limits<float>::quiet_NaN()),
-      m_meterPorts(m_ports.MeterCount(), nullptr) {}
+      m_meterPorts(audio.GetMeterCount(), nullptr) {}
 
 void Instance::ReadFeatures(const LV2_Feature* const* features) {
     const auto* map = static_cast<const LV2_URID_Map*>(FindFeature(features, LV2_URID__map));

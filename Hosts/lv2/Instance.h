@@ -74,7 +74,7 @@ private:
     const float* m_enabled = nullptr;
     float m_sentEnabled = 1.0f;
     float* m_latency = nullptr;
-    std::vector<float*> m_meterPorts;
+    std::vector<float*> m_meterPorts;  // by meter index; null for arrays and rings
     // Set by Restore: every port value is sent again, so ports win over the
     // restored text for whatever they carry.
     std::atomic<bool> m_resend{false};

@@ -48,13 +48,14 @@ PortMap::PortMap(const AudioPlugin& audio, std::uint32_t inputs, std::uint32_t o
         port.name = port.parameter.label;
         Add(std::move(port));
     }
-    m_meterCount = audio.GetMeterCount();
-    for (std::uint32_t m = 0; m < m_meterCount; ++m) {
+    for (std::uint32_t m = 0; m < audio.GetMeterCount(); ++m) {
         Port port{PortType::Meter, m, {}, {}, {}, {}};
         audio.GetMeterInfo(m, port.meter);
-        port.symbol = MakeSymbol(port.meter.name);
+        if (port.meter.kind != zen::MeterKind::Level && port.meter.kind != zen::MeterKind::Value) continue;
+        port.symbol = MakeSymbol(port.meter.identifier);
         port.name = port.meter.name;
         Add(std::move(port));
+        ++m_meterCount;
     }
 }
 

@@ -1,8 +1,10 @@
 // The LV2 ports of one plug-in in one channel layout, in index order:
 // audio inputs, audio outputs, "enabled" (the host's bypass), "latency",
-// one control input per parameter, one control output per meter. Fixed ports
-// come first and meters last, so a parameter added to a table moves only the
-// meters' indices. Symbols come from parameter identifiers and meter names.
+// one control input per parameter, one control output per level or value
+// meter (array and ring meters have no port: a control port carries one
+// number). Fixed ports come first and meters last, so a parameter added to a
+// table moves only the meters' indices. Symbols come from the parameters' and
+// meters' identifiers.
 #pragma once
 
 #include <cstdint>
@@ -33,10 +35,11 @@ public:
     std::uint32_t Inputs() const { return m_inputs; }
     std::uint32_t Outputs() const { return m_outputs; }
     std::uint32_t ParameterCount() const { return m_parameterCount; }
-    std::uint32_t MeterCount() const { return m_meterCount; }
+    std::uint32_t MeterCount() const { return m_meterCount; }  // meter ports
 
     // "threshold" from "ZenSoftClipper::THRESHOLD", "input_peak_1" from
-    // "Input Peak 1": lower case, [a-z0-9_], never starting with a digit.
+    // "ZenSoftClipper::INPUT_PEAK_1": lower case, [a-z0-9_], never starting
+    // with a digit.
     static std::string MakeSymbol(const std::string& text);
 
 private:

@@ -1,6 +1,12 @@
 // The entry, the registries and the interface object, as a host sees them.
 #include <gtest/gtest.h>
 
+#include <cstddef>
+#include <cstdio>
+#include <memory>
+#include <string>
+#include <vector>
+
 #include "Common/AudioPluginRegistry.h"
 #include "Common/ZenAudioPluginImpl.h"
 #include "Common/ZenControlPlugin.h"
@@ -90,31 +96,100 @@ TEST(PluginInterface, CastsByInterfaceName) {
     EXPECT_EQ(clipper->QueryInterface(nullptr), nullptr);
 }
 
-TEST(PluginInterface, HostServicesReachNewInstances) {
-    struct Services : zen::HostServices {
-        int calls = 0;
-    } services;
-    services.GetChannelIndex = [](zen::HostServices* self) -> std::int64_t {
-        ++static_cast<Services*>(self)->calls;
-        return 7;
-    };
-    services.GetSessionId = [](zen::HostServices* self) -> std::int64_t {
-        ++static_cast<Services*>(self)->calls;
-        return 99;
-    };
+namespace {
+
+// A host's services with an action table: "Echo" answers its arguments
+// joined by commas; every other action is unknown.
+struct EchoServices : zen::HostServices {
+    EchoServices() : zen::HostServices{sizeof(zen::HostServices), zen::kHostServicesVersion, nullptr, nullptr, nullptr} {
+        GetChannelIndex = [](zen::HostServices*) -> std::int64_t { return 7; };
+        GetSessionId = [](zen::HostServices*) -> std::int64_t { return 99; };
+        CallAction = [](zen::HostServices* self, const char* action, const char* const* arguments,
+                        std::uint32_t count, char* result, std::uint32_t capacity) {
+            auto* services = static_cast<EchoServices*>(self);
+            services->actions.push_back(action);
+            if (std::string(action) != "Echo") return false;
+            std::string answer;
+            for (std::uint32_t i = 0; i < count; ++i) answer += (i > 0 ? "," : "") + std::string(arguments[i]);
+            std::snprintf(result, capacity, "%s", answer.c_str());
+            return true;
+        };
+    }
+    std::vector<std::string> actions;
+};
+
+// Creates the Soft Clipper with these services (and a context) set on the library.
+std::unique_ptr<zen::PluginInstance> CreateWithServices(zen::HostServices* services, void* context = nullptr) {
     zen::PluginInterface* library = GetZenPluginInterface();
-    int context = 0;
-    library->SetHostContext(&context);
-    library->SetHostServices(&services);
-    const auto clipper = Create(zen::kAudioPluginKind, "Soft Clipper:1517179747");
+    library->SetHostContext(context);
+    library->SetHostServices(services);
+    auto instance = Create(zen::kAudioPluginKind, "Soft Clipper:1517179747");
     library->SetHostServices(nullptr);
     library->SetHostContext(nullptr);
+    return instance;
+}
+
+}  // namespace
+
+TEST(PluginInterface, HostServicesReachNewInstancesAndRouteActions) {
+    EchoServices services;
+    int context = 0;
+    const auto clipper = CreateWithServices(&services, &context);
     auto* impl = dynamic_cast<ZenAudioPluginImpl*>(clipper.get());
     ASSERT_NE(impl, nullptr);
-    EXPECT_EQ(services.calls, 2);
     EXPECT_EQ(impl->GetHostContext(), &context);
+    EXPECT_EQ(impl->GetHostServices(), &services);
     EXPECT_EQ(impl->GetHostChannelIndex(), 7);
     EXPECT_EQ(impl->GetHostSessionId(), 99);
+
+    std::string result = "stale";
+    EXPECT_TRUE(impl->CallHostAction("Echo", {"zen:Limiter:1517177970", "2", ""}, &result));
+    EXPECT_EQ(result, "zen:Limiter:1517177970,2,");
+    EXPECT_TRUE(impl->CallHostAction("Echo"));
+    EXPECT_FALSE(impl->CallHostAction("AudioLevellerEngine", {"1"}, &result));  // unknown to this host
+    EXPECT_EQ(result, "");
+    EXPECT_EQ(services.actions, (std::vector<std::string>{"Echo", "Echo", "AudioLevellerEngine"}));
+}
+
+TEST(PluginInterface, AHostWithAnOlderOrNoServicesStructStillWorks) {
+    // The struct as a host built before CallAction lays it out, alone on the
+    // heap: reading past it would be caught by the address sanitizer.
+    struct OlderServices {
+        std::uint32_t structSize;
+        std::uint32_t version;
+        std::int64_t (*GetChannelIndex)(zen::HostServices*);
+        std::int64_t (*GetSessionId)(zen::HostServices*);
+    };
+    static_assert(sizeof(OlderServices) == offsetof(zen::HostServices, CallAction), "the older layout");
+    auto older = std::make_unique<OlderServices>(OlderServices{
+        sizeof(OlderServices), 0, [](zen::HostServices*) -> std::int64_t { return 3; },
+        [](zen::HostServices*) -> std::int64_t { return 42; }});
+    auto* services = reinterpret_cast<zen::HostServices*>(older.get());
+    const auto clipper = CreateWithServices(services);
+    auto* impl = dynamic_cast<ZenAudioPluginImpl*>(clipper.get());
+    ASSERT_NE(impl, nullptr);
+    EXPECT_EQ(impl->GetHostChannelIndex(), 3);
+    EXPECT_EQ(impl->GetHostSessionId(), 42);
+    std::string result = "stale";
+    EXPECT_FALSE(impl->CallHostAction("LoadPlugin", {"zen:Limiter:1517177970"}, &result));
+    EXPECT_EQ(result, "");
+
+    // Shorter still: only the channel index is covered.
+    older->structSize = offsetof(zen::HostServices, GetSessionId);
+    const auto shorter = CreateWithServices(services);
+    EXPECT_EQ(dynamic_cast<ZenAudioPluginImpl&>(*shorter).GetHostChannelIndex(), 3);
+    EXPECT_EQ(dynamic_cast<ZenAudioPluginImpl&>(*shorter).GetHostSessionId(), 0);
+
+    // Null entries and no services at all: defaults, and no actions.
+    EchoServices empty;
+    empty.GetChannelIndex = nullptr;
+    empty.CallAction = nullptr;
+    const auto partial = CreateWithServices(&empty);
+    EXPECT_EQ(dynamic_cast<ZenAudioPluginImpl&>(*partial).GetHostChannelIndex(), -1);
+    EXPECT_FALSE(dynamic_cast<ZenAudioPluginImpl&>(*partial).CallHostAction("Echo"));
+    const auto alone = CreateWithServices(nullptr);
+    EXPECT_EQ(dynamic_cast<ZenAudioPluginImpl&>(*alone).GetHostServices(), nullptr);
+    EXPECT_FALSE(dynamic_cast<ZenAudioPluginImpl&>(*alone).CallHostAction("Echo"));
 }
 
 TEST(AudioPluginRegistry, WithheldDescriptorsAreNeverEntered) {

@@ -1,10 +1,13 @@
 // The audio plug-in base as a host drives it, through the test-only
-// "Test Delay" plug-in (latency, smoothed gain, a list parameter).
+// "Test Delay" plug-in (latency, a smoothed gain, a stepped list parameter,
+// meters of every kind).
 #include <gtest/gtest.h>
 
 #include <cmath>
+#include <iterator>
 #include <thread>
 
+#include "Common/Decibels.h"
 #include "Support/PluginHarness.h"
 #include "Support/Signals.h"
 #include "TestPlugins/ZenTestDelay.h"
@@ -137,33 +140,63 @@ TEST(ZenAudioPluginImpl, LongBlocksAreSplitAtThePreparedMaximum) {
     for (std::size_t n = 3; n < input.size(); ++n) ASSERT_EQ(out[1][n], input[n - 3]) << n;
 }
 
-TEST(ZenAudioPluginImpl, ChangesReachTheAudioThreadBeforeTheNextBlock) {
+TEST(ZenAudioPluginImpl, SteppedValuesReachTheAudioThreadBeforeTheNextBlock) {
     PluginHarness plugin("Test Delay");
     plugin.Prepare(1, 48000.0f, 64);
     auto& impl = dynamic_cast<ZenTestDelay&>(plugin.Instance());
-    plugin.Run(zentest::Noise(64), 1);
-    EXPECT_EQ(impl.UpdatesSeen(), 3);  // every parameter once after Prepare
+    auto runOnAnAudioThread = [&] {
+        std::thread::id audio;
+        std::thread([&] {
+            audio = std::this_thread::get_id();
+            plugin.Run(zentest::Noise(64), 1);
+        }).join();
+        return audio;
+    };
+    EXPECT_EQ(impl.UpdatesSeen(), 0);  // nothing before the first block
+    std::thread::id audio = runOnAnAudioThread();
+    EXPECT_EQ(impl.UpdateThread(), audio);
+    // Every stepped parameter once after Prepare; the smoothed gain never comes this way.
+    EXPECT_EQ(impl.UpdatesSeen(), 2);
+    EXPECT_EQ(impl.ParametersUpdated(), (1u << ZenTestDelay::kDelay) | (1u << ZenTestDelay::kMode));
     plugin.Set("Mode", 1.0f);
     plugin.Set("Mode", 0.0f);
+    plugin.Set("Gain", -3.0f);
+    EXPECT_EQ(impl.UpdatesSeen(), 2);
+    audio = runOnAnAudioThread();
+    EXPECT_EQ(impl.UpdateThread(), audio);
+    EXPECT_EQ(impl.UpdatesSeen(), 3);  // coalesced: one update per changed parameter
     plugin.Run(zentest::Noise(64), 1);
-    EXPECT_EQ(impl.UpdatesSeen(), 4);  // coalesced: one update per changed parameter
+    EXPECT_EQ(impl.UpdatesSeen(), 3);
+    plugin.Prepare(1, 48000.0f, 64);
     plugin.Run(zentest::Noise(64), 1);
-    EXPECT_EQ(impl.UpdatesSeen(), 4);
+    EXPECT_EQ(impl.UpdatesSeen(), 5);  // and again after every Prepare
 }
 
-TEST(ZenAudioPluginImpl, GainRampsWhileProcessingButNotBefore) {
-    PluginHarness plugin("Test Delay");
-    plugin.Set("Delay", 0.0f);
-    plugin.Set("Gain", -6.0f);  // before processing: at once
-    plugin.Prepare(1, 48000.0f, 256);
-    auto out = plugin.Run(std::vector<float>(256, 1.0f), 1);
-    EXPECT_NEAR(out[0][0], std::pow(10.0f, -6.0f / 20.0f), 1e-6);
+TEST(ZenAudioPluginImpl, SmoothedValuesJumpBeforeProcessingAndRampWithTheSharedLawWhileProcessing) {
+    for (float rate : {48000.0f, 96000.0f}) {
+        PluginHarness plugin("Test Delay");
+        plugin.Set("Delay", 0.0f);
+        plugin.Set("Gain", -6.0f);  // before processing: at once
+        plugin.Prepare(1, rate, 256);
+        auto out = plugin.Run(std::vector<float>(256, 1.0f), 1);
+        const float start = std::pow(10.0f, -6.0f / 20.0f);
+        EXPECT_FLOAT_EQ(out[0][0], start) << rate;
+        EXPECT_FLOAT_EQ(out[0][255], start) << rate;
 
-    plugin.Set("Gain", 0.0f);  // while running: a ramp, no jump
-    out = plugin.Run(std::vector<float>(256, 1.0f), 1);
-    EXPECT_LT(out[0][0], 0.51f);
-    EXPECT_GT(out[0][255], out[0][0]);
-    EXPECT_LT(out[0][255], 0.99f);
+        // While running: one step per sample of g = a g + (1 - a) target, a =
+        // exp(-2 pi / (200 ms fs)), from the first sample of the next block.
+        plugin.Set("Gain", 0.0f);
+        out = plugin.Run(std::vector<float>(256, 1.0f), 1);
+        const double a = std::exp(-2.0 * 3.141592653589793 / (0.2 * rate));
+        for (std::size_t n = 0; n < 256; ++n) {
+            const double expected = 1.0 + (start - 1.0) * std::pow(a, static_cast<double>(n + 1));
+            ASSERT_NEAR(out[0][n], expected, 1e-6) << rate << " Hz, sample " << n;
+        }
+        // Prepared again: not running, so a change jumps once more.
+        plugin.Prepare(1, rate, 256);
+        plugin.Set("Gain", -12.0f);
+        EXPECT_FLOAT_EQ(plugin.Run(std::vector<float>(1, 1.0f), 1)[0][0], std::pow(10.0f, -12.0f / 20.0f));
+    }
 }
 
 TEST(ZenAudioPluginImpl, ParametersChangeSafelyFromAnotherThread) {
@@ -187,6 +220,118 @@ TEST(ZenAudioPluginImpl, ParametersChangeSafelyFromAnotherThread) {
     stop = true;
     ui.join();
     EXPECT_TRUE(finite);
+}
+
+TEST(ZenAudioPluginImpl, MetersExpandTheDeclaredTableForTheChannelLayout) {
+    PluginHarness plugin("Test Delay");
+    AudioPlugin& audio = plugin.Audio();
+    plugin.Prepare(2);
+    const struct {
+        const char* identifier;
+        const char* name;
+        zen::MeterKind kind;
+        std::uint32_t size, capacity;
+    } expected[] = {
+        {"ZenTestDelay::OUTPUT_PEAK_1", "Output Peak 1", zen::MeterKind::Level, 1, 0},
+        {"ZenTestDelay::OUTPUT_PEAK_2", "Output Peak 2", zen::MeterKind::Level, 1, 0},
+        {"ZenTestDelay::LAST_SAMPLES", "Last Samples", zen::MeterKind::Array, ZenTestDelay::kLastSampleCount, 0},
+        {"ZenTestDelay::POINTS", "Points", zen::MeterKind::Ring, 2, ZenTestDelay::kPointCapacity},
+    };
+    ASSERT_EQ(audio.GetMeterCount(), std::size(expected));
+    for (std::uint32_t i = 0; i < std::size(expected); ++i) {
+        zen::MeterInfo info;
+        ASSERT_TRUE(audio.GetMeterInfo(i, info));
+        EXPECT_EQ(info.identifier, expected[i].identifier);
+        EXPECT_EQ(info.name, expected[i].name);
+        EXPECT_EQ(info.kind, expected[i].kind) << info.name;
+        EXPECT_EQ(info.size, expected[i].size) << info.name;
+        EXPECT_EQ(info.capacity, expected[i].capacity) << info.name;
+    }
+    zen::MeterInfo past;
+    EXPECT_FALSE(audio.GetMeterInfo(4, past));
+    ASSERT_TRUE(audio.ConfigureChannels(1, 1));
+    EXPECT_EQ(audio.GetMeterCount(), 3u);  // one output peak
+    ASSERT_TRUE(audio.GetMeterInfo(1, past));
+    EXPECT_EQ(past.name, "Last Samples");
+}
+
+TEST(ZenAudioPluginImpl, MetersReadWhatTheAudioThreadPublishedAndRestAfterReset) {
+    PluginHarness plugin = zentest::Prepared("Test Delay", {{"Delay", 0.0f}, {"Gain", -6.0f}}, 2);
+    AudioPlugin& audio = plugin.Audio();
+    std::vector<float> array(ZenTestDelay::kLastSampleCount, -1.0f);
+    // At rest: silence, zeros.
+    EXPECT_EQ(audio.GetMeter(0), zen::kMeterFloorDb);
+    ASSERT_TRUE(audio.ReadMeterArray(2, array.data(), ZenTestDelay::kLastSampleCount));
+    EXPECT_EQ(array, std::vector<float>(ZenTestDelay::kLastSampleCount, 0.0f));
+
+    zentest::Channels io = {zentest::Noise(100, 0.5, 1), zentest::Noise(100, 0.1, 2)};
+    plugin.Process(io);
+    EXPECT_FLOAT_EQ(audio.GetMeter(0), 20.0f * std::log10(zentest::Peak(io[0])));
+    EXPECT_FLOAT_EQ(audio.GetMeter(1), 20.0f * std::log10(zentest::Peak(io[1])));
+    ASSERT_TRUE(audio.ReadMeterArray(2, array.data(), ZenTestDelay::kLastSampleCount));
+    EXPECT_EQ(array, std::vector<float>(io[0].end() - ZenTestDelay::kLastSampleCount, io[0].end()));
+    // The wrong call for a meter's kind reads nothing.
+    EXPECT_EQ(audio.GetMeter(2), 0.0f);
+    EXPECT_FALSE(audio.ReadMeterArray(2, array.data(), ZenTestDelay::kLastSampleCount - 1));
+    EXPECT_FALSE(audio.ReadMeterArray(0, array.data(), ZenTestDelay::kLastSampleCount));
+    std::uint64_t cursor = 0;
+    EXPECT_EQ(audio.ReadMeterRing(2, cursor, array.data(), 1).records, 0u);
+
+    audio.Reset();
+    EXPECT_EQ(audio.GetMeter(1), zen::kMeterFloorDb);
+    ASSERT_TRUE(audio.ReadMeterArray(2, array.data(), ZenTestDelay::kLastSampleCount));
+    EXPECT_EQ(array, std::vector<float>(ZenTestDelay::kLastSampleCount, 0.0f));
+}
+
+TEST(ZenAudioPluginImpl, RingMetersDrainFromTheReadersCursorAndCountWhatWasLost) {
+    PluginHarness plugin = zentest::Prepared("Test Delay", {{"Delay", 0.0f}}, 2);
+    AudioPlugin& audio = plugin.Audio();
+    constexpr std::uint32_t kRing = 3;
+    constexpr std::uint32_t kCapacity = ZenTestDelay::kPointCapacity;
+    const zentest::Channels input = {zentest::Noise(1000, 0.5, 3), zentest::Noise(1000, 0.5, 4)};
+    auto run = [&](std::size_t from, std::size_t frames) {
+        zentest::Channels io = {std::vector<float>(input[0].begin() + from, input[0].begin() + from + frames),
+                                std::vector<float>(input[1].begin() + from, input[1].begin() + from + frames)};
+        plugin.Process(io, 64);
+    };
+    // Point n is the output frame n: (first channel, last channel).
+    auto expectPoints = [&](const std::vector<float>& records, std::size_t first, std::size_t count) {
+        for (std::size_t r = 0; r < count; ++r) {
+            ASSERT_EQ(records[2 * r], input[0][first + r]) << "point " << first + r;
+            ASSERT_EQ(records[2 * r + 1], input[1][first + r]) << "point " << first + r;
+        }
+    };
+    std::vector<float> records(2 * kCapacity);
+    std::uint64_t fast = 0, slow = 0;
+
+    run(0, 100);
+    zen::MeterRingRead read = audio.ReadMeterRing(kRing, fast, records.data(), 40);
+    EXPECT_EQ(read.records, 40u);
+    EXPECT_EQ(read.lost, 0u);
+    expectPoints(records, 0, 40);
+    read = audio.ReadMeterRing(kRing, fast, records.data(), kCapacity);
+    EXPECT_EQ(read.records, 60u);
+    expectPoints(records, 40, 60);
+    EXPECT_EQ(audio.ReadMeterRing(kRing, fast, records.data(), kCapacity).records, 0u);
+
+    // 900 more points: the slow reader, still at 0, lost all but the last 256.
+    run(100, 900);
+    read = audio.ReadMeterRing(kRing, slow, records.data(), kCapacity);
+    EXPECT_EQ(read.records, kCapacity);
+    EXPECT_EQ(read.lost, 1000u - kCapacity);
+    expectPoints(records, 1000 - kCapacity, kCapacity);
+    read = audio.ReadMeterRing(kRing, fast, records.data(), kCapacity);
+    EXPECT_EQ(read.lost, 900u - kCapacity);
+    EXPECT_EQ(slow, 1000u);
+    EXPECT_EQ(fast, 1000u);
+
+    // Prepare empties the ring; a cursor beyond it starts again from 0.
+    plugin.Prepare(2);
+    run(0, 10);
+    read = audio.ReadMeterRing(kRing, slow, records.data(), kCapacity);
+    EXPECT_EQ(read.records, 10u);
+    EXPECT_EQ(read.lost, 0u);
+    expectPoints(records, 0, 10);
 }
 
 TEST(ZenAudioPluginImpl, PresetsComeFromTheResourceTrees) {

@@ -10,6 +10,7 @@
 #include "AudioFile.h"
 #include "Commands.h"
 #include "DemoMaterial.h"
+#include "MeterJson.h"
 #include "ParameterValue.h"
 #include "ZenfxError.h"
 
@@ -118,7 +119,9 @@ int RunInfo(PluginLibrary& library, const InfoOptions& options) {
     for (std::uint32_t i = 0; i < audio.GetMeterCount(); ++i) {
         zen::MeterInfo m;
         audio.GetMeterInfo(i, m);
-        meters.push_back({{"index", i}, {"name", m.name}, {"unit", m.unit}, {"minimum", m.minimum}, {"maximum", m.maximum}});
+        nlohmann::json meter = DescribeMeter(m);
+        meter["index"] = i;
+        meters.push_back(meter);
     }
     row["meters"] = meters;
     row["presets"] = audio.GetPresetNames();
@@ -154,9 +157,18 @@ int RunInfo(PluginLibrary& library, const InfoOptions& options) {
     }
     std::fflush(stdout);
     std::cout << "\nMeters (" << channels << " channel" << (channels == 1 ? "" : "s") << "):\n";
-    for (const auto& m : meters)
+    for (const auto& m : meters) {
+        const std::string unit = m["unit"].get<std::string>();
+        std::string kind;
+        if (m["kind"] == "array") kind = ", array of " + std::to_string(m["size"].get<unsigned>());
+        if (m["kind"] == "ring")
+            kind = ", ring of " + std::to_string(m["capacity"].get<unsigned>()) + " x " +
+                   std::to_string(m["size"].get<unsigned>());
+        const std::string both = unit.empty() ? (kind.empty() ? "" : kind.substr(2)) : unit + kind;
+        const std::string details = both.empty() ? "" : " (" + both + ")";
         std::cout << "  " << std::setw(2) << m["index"].get<unsigned>() << "  " << m["name"].get<std::string>()
-                  << (m["unit"].get<std::string>().empty() ? "" : " (" + m["unit"].get<std::string>() + ")") << "\n";
+                  << details << "\n";
+    }
     if (meters.empty()) std::cout << "  none\n";
     std::cout << "\nPresets:\n";
     for (const std::string& preset : audio.GetPresetNames()) std::cout << "  " << preset << "\n";

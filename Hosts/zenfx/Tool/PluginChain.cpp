@@ -1,5 +1,6 @@
 #include "PluginChain.h"
 
+#include "MeterJson.h"
 #include "NameSuggestions.h"
 #include "ParameterValue.h"
 #include "ZenfxError.h"
@@ -91,11 +92,7 @@ nlohmann::json PluginChain::MetersJson() const {
     nlohmann::json plugins = nlohmann::json::array();
     for (const Stage& stage : m_stages) {
         nlohmann::json meters = nlohmann::json::array();
-        for (std::uint32_t i = 0; i < stage.audio->GetMeterCount(); ++i) {
-            zen::MeterInfo info;
-            stage.audio->GetMeterInfo(i, info);
-            meters.push_back({{"name", info.name}, {"unit", info.unit}, {"value", stage.audio->GetMeter(i)}});
-        }
+        for (std::uint32_t i = 0; i < stage.audio->GetMeterCount(); ++i) meters.push_back(ReadMeter(*stage.audio, i));
         plugins.push_back({{"name", stage.plugin.entry.name}, {"key", stage.plugin.key}, {"meters", meters}});
     }
     return {{"plugins", plugins}};

@@ -39,7 +39,8 @@ public:
 
     void Process(float* const* channels, std::uint64_t frames);
 
-    // Every stage's meters: [{name, key, meters: [{name, unit, value}]}].
+    // Every stage's meters: [{name, key, meters: [{identifier, name, unit,
+    // kind, value}]}] (see ReadMeter).
     nlohmann::json MetersJson() const;
 
     const std::vector<Stage>& Stages() const { return m_stages; }

@@ -82,7 +82,13 @@ CheckOutcome LifecycleChecks::ProcessBeforePrepare() {
     // Queries before Prepare must answer without crashing.
     (void)audio.GetLatency();
     (void)audio.GetTailLength();
-    for (std::uint32_t i = 0; i < audio.GetMeterCount(); ++i) (void)audio.GetMeter(i);
+    for (std::uint32_t i = 0; i < audio.GetMeterCount(); ++i) {
+        float values[1];
+        std::uint64_t cursor = 0;
+        (void)audio.GetMeter(i);
+        Require(!audio.ReadMeterArray(i, values, 1) && audio.ReadMeterRing(i, cursor, values, 1).records == 0,
+                "meter " + std::to_string(i) + " read an array or a ring before Prepare");
+    }
     audio.Reset();
 
     Require(plugin->Prepare(ValidationContext::kSampleRate, ValidationContext::kBlock), "Prepare was refused");

@@ -6,6 +6,7 @@
 #include <cmath>
 #include <iomanip>
 #include <limits>
+#include <set>
 #include <sstream>
 
 namespace zenfx {
@@ -252,12 +253,18 @@ CheckOutcome SignalChecks::Meters() {
         Require(!audio.GetMeterInfo(0, info), "no meters, but GetMeterInfo(0) answered true");
         return Skip("no meters");
     }
+    std::vector<zen::MeterInfo> infos(count);
+    std::set<std::string> identifiers;
     for (std::uint32_t i = 0; i < count; ++i) {
-        zen::MeterInfo info;
+        zen::MeterInfo& info = infos[i];
         Require(audio.GetMeterInfo(i, info), "GetMeterInfo(" + std::to_string(i) + ") answered false");
         Require(!info.name.empty(), "meter " + std::to_string(i) + " has no name");
+        Require(identifiers.insert(info.identifier).second && !info.identifier.empty(),
+                "meter '" + info.name + "' has no identifier of its own ('" + info.identifier + "')");
         Require(std::isfinite(info.minimum) && std::isfinite(info.maximum) && info.minimum < info.maximum,
                 "meter '" + info.name + "' has no display range");
+        Require(info.size >= 1 && (info.kind != zen::MeterKind::Ring || info.capacity >= 1),
+                "meter '" + info.name + "' holds no values");
     }
     zen::MeterInfo past;
     Require(!audio.GetMeterInfo(count, past), "GetMeterInfo answered true past the last meter");
@@ -266,23 +273,39 @@ CheckOutcome SignalChecks::Meters() {
     const std::uint32_t width = plugin->Width();
     const std::uint32_t block = ValidationContext::kBlock;
     const std::uint64_t latency = audio.GetLatency();
-    auto readAll = [&](const std::string& after) {
+    std::vector<std::uint64_t> cursors(count, 0);
+    // Rings keep a history, so a NaN that went in stays in it: they are
+    // checked after clean input only.
+    auto readAll = [&](const std::string& after, bool rings) {
         for (std::uint32_t i = 0; i < count; ++i) {
-            const float reading = audio.GetMeter(i);
-            Require(std::isfinite(reading),
-                    "meter " + std::to_string(i) + " reads " + std::to_string(reading) + " after " + after);
+            const zen::MeterInfo& info = infos[i];
+            const std::string which = "meter '" + info.name + "'";
+            std::vector<float> values(std::size_t{info.size} * std::max(1u, info.capacity));
+            if (info.kind == zen::MeterKind::Array) {
+                Require(audio.ReadMeterArray(i, values.data(), info.size),
+                        which + " could not be read after " + after);
+            } else if (info.kind == zen::MeterKind::Ring) {
+                const zen::MeterRingRead read = audio.ReadMeterRing(i, cursors[i], values.data(), info.capacity);
+                Require(read.records <= info.capacity, which + " delivered more records than it holds");
+                values.resize(std::size_t{read.records} * info.size);
+                if (!rings) continue;
+            } else {
+                values = {audio.GetMeter(i)};
+            }
+            for (float v : values)
+                Require(std::isfinite(v), which + " reads " + std::to_string(v) + " after " + after);
         }
     };
     plugin->Run(signals::Noise(width, 4 * block, kFullScale, m_context.Random()), block);
-    readAll("full-scale noise");
+    readAll("full-scale noise", true);
     plugin->Run(signals::Silence(width, 4 * block), block);
-    readAll("silence");
+    readAll("silence", true);
     if (plugin->HasAudioInput()) {
         Planar poisoned = signals::Noise(width, block, ValidationContext::kTestLevel, m_context.Random());
         poisoned[0][10] = std::numeric_limits<float>::quiet_NaN();
         plugin->Run(poisoned, block);
         plugin->Run(signals::Noise(width, 2 * block + latency, ValidationContext::kTestLevel, m_context.Random()), block);
-        readAll("a NaN and then finite input");
+        readAll("a NaN and then finite input", false);
     }
     return Pass(std::to_string(count) + " meters described; readings are numbers after noise, silence and NaN input");
 }

@@ -1,5 +1,6 @@
 #include "ThreadChecks.h"
 
+#include <algorithm>
 #include <atomic>
 #include <chrono>
 #include <sstream>
@@ -14,6 +15,25 @@ constexpr std::uint32_t kThreadBlock = 256;
 // two overlap however they are scheduled; it waits at most this long.
 constexpr int kEventsPerBlock = 2;
 constexpr auto kLongestWait = std::chrono::seconds(2);
+
+// Any meter read as an editor does, while the audio thread publishes: a
+// number, an array whole, or a ring drained from this reader's cursor.
+float ReadMeter(const AudioPlugin& audio, std::uint32_t index, std::vector<std::uint64_t>& cursors) {
+    zen::MeterInfo info;
+    if (!audio.GetMeterInfo(index, info)) return 0.0f;
+    if (info.kind == zen::MeterKind::Level || info.kind == zen::MeterKind::Value) return audio.GetMeter(index);
+    std::vector<float> values(std::size_t{info.size} * std::max(1u, info.capacity));
+    if (info.kind == zen::MeterKind::Array) {
+        if (!audio.ReadMeterArray(index, values.data(), info.size)) return 0.0f;
+    } else {
+        cursors.resize(std::max<std::size_t>(cursors.size(), index + 1));
+        const zen::MeterRingRead read = audio.ReadMeterRing(index, cursors[index], values.data(), info.capacity);
+        values.resize(std::size_t{info.size} * read.records);
+    }
+    float sum = 0.0f;
+    for (float v : values) sum += v;
+    return sum;
+}
 
 }  // namespace
 
@@ -58,6 +78,7 @@ CheckOutcome ThreadChecks::ParametersDuringProcessing() {
     std::vector<float> last = plugin->Values();
     bool lastBypass = false;
     std::size_t changes = 0, switches = 0;
+    std::vector<std::uint64_t> meterCursors;
     std::string refused;
     std::uniform_int_distribution<int> event(0, 15);
     while (!done.load()) {
@@ -68,7 +89,7 @@ CheckOutcome ThreadChecks::ParametersDuringProcessing() {
             ++switches;
         } else if (what == 1) {
             volatile float sink = 0.0f;
-            for (std::uint32_t m = 0; m < audio.GetMeterCount(); ++m) sink = sink + audio.GetMeter(m);
+            for (std::uint32_t m = 0; m < audio.GetMeterCount(); ++m) sink = sink + ReadMeter(audio, m, meterCursors);
             sink = sink + static_cast<float>(audio.GetLatency() + audio.GetTailLength());
             sink = sink + (audio.IsBypassed() ? 1.0f : 0.0f);
             (void)sink;

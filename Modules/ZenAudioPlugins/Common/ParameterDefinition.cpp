@@ -16,6 +16,19 @@ float ParameterDefinition::Constrain(float value) const {
     return value;
 }
 
+ParameterDefinition ParameterDefinition::Smoothed(WorkingValue working) const {
+    ParameterDefinition d = SmoothedSingle(working);
+    d.smoothedPerChannel = true;
+    return d;
+}
+
+ParameterDefinition ParameterDefinition::SmoothedSingle(WorkingValue working) const {
+    ParameterDefinition d = *this;
+    d.smoothing = working;
+    d.smoothedPerChannel = false;
+    return d;
+}
+
 ParameterInfo ParameterDefinition::ToInfo() const {
     ParameterInfo info;
     info.identifier = identifier.toStdString();

@@ -6,6 +6,13 @@
 //       SwitchParameter("IN", QT_TRANSLATE_NOOP("BiQuad", "In"), 0),
 //       ListParameter("SHAPE", QT_TRANSLATE_NOOP("BiQuad", "Shape"), {"LPF", ...}, 4),
 //       ...});
+//
+// A plug-in's row also says how the value reaches the audio path: stepped
+// (the default; UpdateProcessingParameter on the audio thread before the next
+// block), or smoothed through a working-value conversion:
+//
+//   ContinuousParameter("GAIN", ..., "dB").Smoothed(working::DbToGain)       // one element per channel
+//   ContinuousParameter("CEILING", ..., "dB").SmoothedSingle(CeilingGain)   // one for the plug-in
 #pragma once
 
 #include <QString>
@@ -14,6 +21,7 @@
 #include <initializer_list>
 #include <vector>
 
+#include "WorkingValues.h"
 #include "zen/ParameterInfo.h"
 
 namespace zen {
@@ -30,6 +38,15 @@ struct ParameterDefinition {
     float step = 0.0f;
     QString unit;
     QStringList choices;  // translated captions, list parameters only
+    // Plug-in parameters only: null for a stepped parameter, else the
+    // conversion to the smoothed working value.
+    WorkingValue smoothing = nullptr;
+    bool smoothedPerChannel = false;  // one smoothed element per channel, or one in all
+
+    bool IsSmoothed() const { return smoothing != nullptr; }
+    // This row, smoothed through `working`: one element per channel, or one.
+    ParameterDefinition Smoothed(WorkingValue working) const;
+    ParameterDefinition SmoothedSingle(WorkingValue working) const;
 
     ParameterTaper Taper() const {
         if (kind == ParameterKind::List) return ParameterTaper::List;

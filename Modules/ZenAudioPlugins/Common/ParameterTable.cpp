@@ -10,6 +10,17 @@ void ParameterTable::Build(const ParameterTableDefinition& definitions) {
     for (std::uint32_t i = 0; i < m_count; ++i) m_records[i].Init(definitions[i]);
 }
 
+void ParameterTable::Store(std::uint32_t index, float value) {
+    m_records[index].Exchange(value);
+    m_changes.fetch_add(1, std::memory_order_acq_rel);
+}
+
+void ParameterTable::MarkLoaded() {
+    for (std::uint32_t i = 0; i < m_count; ++i) m_records[i].MarkChanged();
+    m_changes.fetch_add(1, std::memory_order_acq_rel);
+    m_loads.fetch_add(1, std::memory_order_acq_rel);
+}
+
 std::int32_t ParameterTable::Find(const QString& identifierOrLabel) const {
     for (std::uint32_t i = 0; i < m_count; ++i)
         if (m_records[i].Definition().identifier == identifierOrLabel) return static_cast<std::int32_t>(i);

@@ -1,9 +1,11 @@
 // The parameter records of one plug-in instance, in index order, built from
-// the class's shared definitions; plus the text form of their values.
+// the class's shared definitions; plus the text form of their values, and the
+// counts through which editors notice changes without a lock or a signal.
 #pragma once
 
 #include <QJsonObject>
 #include <QString>
+#include <atomic>
 #include <cstdint>
 #include <memory>
 #include <utility>
@@ -27,6 +29,16 @@ public:
     PluginParameter& operator[](std::uint64_t index) { return m_records[index]; }
     const PluginParameter& operator[](std::uint64_t index) const { return m_records[index]; }
 
+    // Exchanges the value of a valid index and counts the change. Any thread;
+    // lock-free, never allocates.
+    void Store(std::uint32_t index, float value);
+
+    // Changes of any parameter so far, and states loaded so far. Any thread.
+    std::uint64_t GetChangeCount() const { return m_changes.load(std::memory_order_acquire); }
+    std::uint64_t GetLoadCount() const { return m_loads.load(std::memory_order_acquire); }
+    // After a state or preset was loaded: every parameter counts as changed.
+    void MarkLoaded();
+
     // Index by identifier, or by label when no identifier matches; -1 if none.
     std::int32_t Find(const QString& identifierOrLabel) const;
 
@@ -41,6 +53,8 @@ public:
 private:
     std::unique_ptr<PluginParameter[]> m_records;
     std::uint32_t m_count = 0;
+    std::atomic<std::uint64_t> m_changes{0};
+    std::atomic<std::uint64_t> m_loads{0};
 };
 
 }  // namespace zen

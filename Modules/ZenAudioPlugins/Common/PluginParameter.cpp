@@ -27,6 +27,7 @@ void PluginParameter::Init(const ParameterDefinition& definition) {
 float PluginParameter::Exchange(float value) {
     const float previous = m_value.exchange(value, std::memory_order_acq_rel);
     RefreshPosition();
+    MarkChanged();
     return previous;
 }
 

@@ -1,6 +1,7 @@
 // Per-instance record of one plug-in parameter: the live value (exchanged
-// atomically, so any thread may set it while the audio thread reads it) and
-// its normalised position under the parameter's taper.
+// atomically, so any thread may set it while the audio thread reads it), its
+// normalised position under the parameter's taper, and a count of changes
+// that editors compare with the count they last saw.
 #pragma once
 
 #include <atomic>
@@ -27,8 +28,11 @@ public:
     const std::vector<float>& GetDiscreteValues() const { return m_discreteValues; }
 
     float GetValue() const { return m_value.load(std::memory_order_acquire); }
-    // Returns the previous value.
+    // Returns the previous value; counts the change.
     float Exchange(float value);
+
+    std::uint32_t GetChangeCount() const { return m_changes.load(std::memory_order_acquire); }
+    void MarkChanged() { m_changes.fetch_add(1, std::memory_order_acq_rel); }
 
     float GetPosition() const { return m_position.load(std::memory_order_relaxed); }
     void RefreshPosition() { m_position.store(ValueToPosition(GetValue()), std::memory_order_relaxed); }
@@ -48,6 +52,7 @@ private:
     std::atomic<float> m_position{0.0f};
     std::vector<float> m_discreteValues;
     std::atomic<float> m_value{0.0f};
+    std::atomic<std::uint32_t> m_changes{0};
 };
 
 }  // namespace zen

@@ -18,13 +18,16 @@ void ZenAudioPluginImpl::AttachToHost(const zen::PluginDescriptor* descriptor, v
                                       zen::HostServices* hostServices) {
     m_descriptor = descriptor;
     m_hostContext = hostContext;
-    m_hostServices = hostServices;
-    if (hostServices != nullptr) {
-        if (hostServices->GetChannelIndex != nullptr) m_hostChannelIndex = hostServices->GetChannelIndex(hostServices);
-        if (hostServices->GetSessionId != nullptr) m_hostSessionId = hostServices->GetSessionId(hostServices);
-    }
+    m_host = zen::HostServicesClient(hostServices);
+    m_hostChannelIndex = m_host.ChannelIndex(m_hostChannelIndex);
+    m_hostSessionId = m_host.SessionId(m_hostSessionId);
     m_inputs = std::min(2u, descriptor->inputChannelLimit);
     m_outputs = std::min(2u, descriptor->outputChannelLimit);
+}
+
+bool ZenAudioPluginImpl::CallHostAction(const char* action, const std::vector<std::string>& arguments,
+                                        std::string* result) const {
+    return m_host.CallAction(action, arguments, result);
 }
 
 const char* ZenAudioPluginImpl::GetName() const { return m_descriptor != nullptr ? m_descriptor->name : ""; }
@@ -40,9 +43,21 @@ void* ZenAudioPluginImpl::QueryInterface(const char* interfaceName) {
 
 void ZenAudioPluginImpl::InitParameters(const zen::ParameterTableDefinition& definitions) {
     m_parameters.Build(definitions);
-    m_pendingWords = (m_parameters.GetCount() + 63) / 64;
-    m_pending.reset(new std::atomic<std::uint64_t>[m_pendingWords]);
-    for (std::uint32_t w = 0; w < m_pendingWords; ++w) m_pending[w].store(0);
+    m_pending.Resize(m_parameters.GetCount());
+    m_smoothed.clear();
+    m_smoothed.resize(m_parameters.GetCount());
+    for (std::uint32_t i = 0; i < m_parameters.GetCount(); ++i) {
+        const zen::ParameterDefinition& d = m_parameters[i].Definition();
+        if (!d.IsSmoothed()) continue;
+        m_smoothed[i] = std::make_unique<zen::SmoothedValueGroup>(d.smoothedPerChannel ? kMaxChannels : 1,
+                                                                  d.smoothing(d.defaultValue));
+        // Ramps only while this instance processes.
+        m_smoothed[i]->SetRampingFlag(&m_processing);
+    }
+}
+
+void ZenAudioPluginImpl::InitMeters(const zen::MeterTableDefinition& definitions) {
+    m_meters.Build(definitions, kMaxChannels);
 }
 
 bool ZenAudioPluginImpl::GetParameterInfo(std::uint32_t index, zen::ParameterInfo& info) const {
@@ -53,32 +68,28 @@ bool ZenAudioPluginImpl::GetParameterInfo(std::uint32_t index, zen::ParameterInf
 
 bool ZenAudioPluginImpl::SetParameter(std::uint32_t index, float value) {
     if (!m_parameters.Contains(index) || std::isnan(value)) return false;
-    return OnParameterChanged(index, m_parameters[index].Definition().Constrain(value));
+    OnParameterChanged(index, m_parameters[index].Definition().Constrain(value));
+    return true;
 }
 
 float ZenAudioPluginImpl::GetParameter(std::uint32_t index) const {
     return m_parameters.Contains(index) ? m_parameters[index].GetValue() : 0.0f;
 }
 
-bool ZenAudioPluginImpl::OnParameterChanged(std::uint32_t index, float value) {
-    if (!m_parameters.Contains(index)) return false;
-    m_parameters[index].Exchange(value);
-    m_pending[index / 64].fetch_or(std::uint64_t{1} << (index % 64), std::memory_order_release);
-    return true;
+void ZenAudioPluginImpl::OnParameterChanged(std::uint32_t index, float value) {
+    m_parameters.Store(index, value);
+    const zen::ParameterDefinition& d = m_parameters[index].Definition();
+    if (d.IsSmoothed())
+        m_smoothed[index]->SetTarget(d.smoothing(value));
+    else
+        m_pending.Mark(index);
 }
 
 void ZenAudioPluginImpl::UpdateProcessingParameter(std::uint32_t, float) {}
 
 void ZenAudioPluginImpl::ApplyPendingParameters() noexcept {
-    for (std::uint32_t w = 0; w < m_pendingWords; ++w) {
-        std::uint64_t bits = m_pending[w].exchange(0, std::memory_order_acq_rel);
-        while (bits != 0) {
-            const auto bit = static_cast<std::uint32_t>(__builtin_ctzll(bits));
-            bits &= bits - 1;
-            const std::uint32_t index = w * 64 + bit;
-            UpdateProcessingParameter(index, m_parameters[index].GetValue());
-        }
-    }
+    m_pending.TakeAll(
+        [this](std::uint32_t index) { UpdateProcessingParameter(index, m_parameters[index].GetValue()); });
 }
 
 std::string ZenAudioPluginImpl::SaveState() const {
@@ -93,6 +104,7 @@ bool ZenAudioPluginImpl::LoadState(const std::string& state) {
     for (const auto& [index, value] : contents.values) SetParameter(index, value);
     const QJsonValue bypass = contents.root.value(QStringLiteral("bypass"));
     if (bypass.isBool()) SetBypass(bypass.toBool());
+    m_parameters.MarkLoaded();
     return true;
 }
 
@@ -111,6 +123,21 @@ bool ZenAudioPluginImpl::ApplyNeutralSetting() {
     for (std::uint32_t i = 0; i < m_parameters.GetCount(); ++i)
         SetParameter(i, m_parameters[i].Definition().defaultValue);
     return true;
+}
+
+bool ZenAudioPluginImpl::GetMeterInfo(std::uint32_t index, zen::MeterInfo& info) const {
+    return m_meters.GetInfo(index, GetProcessChannelCount(), info);
+}
+
+float ZenAudioPluginImpl::GetMeter(std::uint32_t index) const { return m_meters.Read(index, GetProcessChannelCount()); }
+
+bool ZenAudioPluginImpl::ReadMeterArray(std::uint32_t index, float* values, std::uint32_t count) const {
+    return m_meters.ReadArray(index, GetProcessChannelCount(), values, count);
+}
+
+zen::MeterRingRead ZenAudioPluginImpl::ReadMeterRing(std::uint32_t index, std::uint64_t& cursor, float* records,
+                                                     std::uint32_t maxRecords) const {
+    return m_meters.ReadRing(index, GetProcessChannelCount(), cursor, records, maxRecords);
 }
 
 std::int32_t ZenAudioPluginImpl::FindParameter(const char* identifierOrLabel) const {
@@ -153,8 +180,9 @@ bool ZenAudioPluginImpl::Prepare(float sampleRate, std::uint32_t maxBlockSize) {
     zen::OnePoleSmoother::RefreshAll(sampleRate);
     m_parameters.RefreshPositions();
     try {
-        PrepareProcessing(sampleRate, maxBlockSize);
         const std::uint32_t channels = GetProcessChannelCount();
+        m_meters.Allocate(channels);
+        PrepareProcessing(sampleRate, maxBlockSize);
         m_bypassDelay.Dimension(channels, maxBlockSize, GetLatency());
         m_dry.assign(static_cast<std::size_t>(channels) * maxBlockSize, 0.0f);
     } catch (...) {  // allocation failures never reach the host
@@ -162,17 +190,20 @@ bool ZenAudioPluginImpl::Prepare(float sampleRate, std::uint32_t maxBlockSize) {
     }
     m_bypassFadeStep = static_cast<float>(1.0 / std::max(1.0, kBypassFadeSeconds * sampleRate));
     m_bypassMix = IsBypassed() ? 1.0f : 0.0f;
-    // Every parameter is applied again to the freshly prepared algorithms.
-    for (std::uint32_t w = 0; w < m_pendingWords; ++w) {
-        const std::uint32_t bits = std::min(64u, m_parameters.GetCount() - w * 64);
-        m_pending[w].store(bits == 64 ? ~std::uint64_t{0} : (std::uint64_t{1} << bits) - 1);
-    }
+    // Every stepped parameter is applied again to the freshly prepared algorithms.
+    for (std::uint32_t i = 0; i < m_parameters.GetCount(); ++i)
+        if (!m_parameters[i].Definition().IsSmoothed()) m_pending.Mark(i);
     m_prepared.store(true, std::memory_order_release);
     return true;
 }
 
-void ZenAudioPluginImpl::Reset() {
+void ZenAudioPluginImpl::ResetSignalState() noexcept {
     ResetProcessing();
+    m_meters.Rest();
+}
+
+void ZenAudioPluginImpl::Reset() {
+    ResetSignalState();
     m_bypassDelay.Reset();
     m_bypassMix = IsBypassed() ? 1.0f : 0.0f;
 }
@@ -237,6 +268,6 @@ void ZenAudioPluginImpl::ProcessChunk(float* const* io, std::uint32_t channelCou
     }
     m_bypassMix = mix;
     // Fully bypassed: drop state that would sound stale when switched back.
-    if (m_bypassMix == 1.0f) ResetProcessing();
+    if (m_bypassMix == 1.0f) ResetSignalState();
 }
 

@@ -1,27 +1,36 @@
 // Common base of every audio plug-in class. It carries the host interfaces,
 // the host's context and services, the sample rate and block size, the
-// parameter table with its tapers, latency, bypass and the bookkeeping that
-// moves parameter changes to the audio thread without locks.
+// parameter and meter tables, latency, bypass and the bookkeeping that moves
+// parameter changes to the audio thread without locks.
 //
 // A plug-in class derives from it and supplies:
-//   - a constructor that calls InitParameters with the class's table;
-//   - OnParameterChanged (any thread): call the base, then push derived
-//     values to smoothed value groups with SetTarget;
+//   - a constructor that calls InitParameters (and InitMeters) with the
+//     class's tables;
 //   - UpdateProcessingParameter (audio thread, before the next block, and for
-//     every parameter after Prepare): hand values to owned algorithms;
+//     every stepped parameter after Prepare): keep the value in a member or
+//     hand it to owned algorithms;
 //   - PrepareProcessing: prepare owned algorithms, size buffers, SetLatency;
-//   - ProcessBlock: the signal path, at most the prepared block size;
-//   - ResetProcessing, and the meters.
-// The class actually instantiated is ZenAudioPlugin<Class>.
+//   - ProcessBlock: the signal path, at most the prepared block size; reads
+//     smoothed parameters through Smoothed(index).Track(channel) and
+//     publishes meters;
+//   - ResetProcessing.
+// Parameter changes themselves are the base's: store, convert, SetTarget of
+// a smoothed parameter or hand-over of a stepped one, and a count for the
+// editors (ParameterWatcher). The class actually instantiated is
+// ZenAudioPlugin<Class>.
 #pragma once
 
 #include <QObject>
 #include <atomic>
 #include <cstdint>
 #include <memory>
+#include <string>
 #include <vector>
 
+#include "HostServicesClient.h"
+#include "MeterTable.h"
 #include "ParameterTable.h"
+#include "PendingBits.h"
 #include "SmoothedValueGroup.h"
 #include "Algorithms/Delay.h"
 #include "zen/AudioPlugin.h"
@@ -50,9 +59,14 @@ public:
     // Called once by the factory, right after construction.
     void AttachToHost(const zen::PluginDescriptor* descriptor, void* hostContext, zen::HostServices* hostServices);
     void* GetHostContext() const { return m_hostContext; }
-    zen::HostServices* GetHostServices() const { return m_hostServices; }
+    zen::HostServices* GetHostServices() const { return m_host.Services(); }
     std::int64_t GetHostChannelIndex() const { return m_hostChannelIndex; }
     std::int64_t GetHostSessionId() const { return m_hostSessionId; }
+
+    // Runs a host action ("LoadPlugin", "SetIntParameter", ...); false when
+    // the host offers no actions or refuses this one. UI thread; allocates.
+    bool CallHostAction(const char* action, const std::vector<std::string>& arguments = {},
+                        std::string* result = nullptr) const;
 
     // zen::PluginInstance
     int GetKind() const override { return zen::kAudioPluginKind; }
@@ -87,9 +101,13 @@ public:
     bool IsBlockBased() const override { return false; }
     bool LocksAudioPath() const override { return false; }
     bool ApplyNeutralSetting() override;
-    std::uint32_t GetMeterCount() const override { return 0; }
-    bool GetMeterInfo(std::uint32_t, zen::MeterInfo&) const override { return false; }
-    float GetMeter(std::uint32_t) const override { return 0.0f; }
+    // Meters come from the class's meter table (InitMeters).
+    std::uint32_t GetMeterCount() const final { return m_meters.GetCount(GetProcessChannelCount()); }
+    bool GetMeterInfo(std::uint32_t index, zen::MeterInfo& info) const final;
+    float GetMeter(std::uint32_t index) const final;
+    bool ReadMeterArray(std::uint32_t index, float* values, std::uint32_t count) const final;
+    zen::MeterRingRead ReadMeterRing(std::uint32_t index, std::uint64_t& cursor, float* records,
+                                     std::uint32_t maxRecords) const final;
 
     // ZenControlValueHost
     std::int32_t FindParameter(const char* identifierOrLabel) const override;
@@ -112,13 +130,37 @@ public:
 protected:
     ZenAudioPluginImpl();
 
+    // Builds the parameter records and a smoothed value group for every
+    // smoothed parameter, at the working value of its default.
     void InitParameters(const zen::ParameterTableDefinition& definitions);
+    // Builds the meters; a plug-in without a table has none.
+    void InitMeters(const zen::MeterTableDefinition& definitions);
 
-    // Base contract: false for an index out of range; else the value is
-    // exchanged atomically, its position refreshed and the parameter marked
-    // for UpdateProcessingParameter. Overrides call this first.
-    virtual bool OnParameterChanged(std::uint32_t index, float value);
+    // A stepped parameter's value, on the audio thread before the next block
+    // after a change, and for every stepped parameter after each Prepare.
+    // Smoothed parameters never come here.
     virtual void UpdateProcessingParameter(std::uint32_t index, float value);
+
+    // The group of a smoothed parameter; ProcessBlock advances it with
+    // Smoothed(index).Track(channel) (element 0 for SmoothedSingle).
+    zen::SmoothedValueGroup& Smoothed(std::uint32_t index) noexcept { return *m_smoothed[index]; }
+
+    // Publishing meters by row of the meter table (channel 0 for rows that
+    // are not per channel): level meters take a linear magnitude, value
+    // meters their value. Audio thread; never blocks or allocates.
+    void PublishMeter(std::uint32_t row, std::uint32_t channel, float value) noexcept {
+        m_meters.Publish(row, channel, value);
+    }
+    void PublishMeter(std::uint32_t row, float value) noexcept { m_meters.Publish(row, 0, value); }
+    void PublishArray(std::uint32_t row, std::uint32_t channel, const float* values) noexcept {
+        m_meters.PublishArray(row, channel, values);
+    }
+    void PushRing(std::uint32_t row, std::uint32_t channel, const float* record) noexcept {
+        m_meters.PushRing(row, channel, record);
+    }
+    // Level and value meters and arrays at rest, as after Reset. Audio thread
+    // or while not processing.
+    void ResetMeters() noexcept { m_meters.Rest(); }
 
     // Inputs and outputs within the descriptor's limits reach this check.
     // Default: as many outputs as inputs, or outputs only for plug-ins
@@ -132,17 +174,18 @@ protected:
     // Reports the latency; call from PrepareProcessing.
     void SetLatency(std::uint32_t samples) { m_latency.store(samples, std::memory_order_release); }
 
-    // Smoothed values ramp only while this instance processes.
-    void AttachSmoothedValue(zen::SmoothedValueGroup& group) { group.SetRampingFlag(&m_processing); }
-
 private:
+    // SetParameter once index and value are checked: store (counted for the
+    // editors), then SetTarget of the working value or the hand-over.
+    void OnParameterChanged(std::uint32_t index, float value);
     void ApplyPendingParameters() noexcept;
+    void ResetSignalState() noexcept;
     void ProcessChunk(float* const* channels, std::uint32_t channelCount, std::uint32_t frames) noexcept;
     void LeaveProcessing();
 
     const zen::PluginDescriptor* m_descriptor = nullptr;
     void* m_hostContext = nullptr;
-    zen::HostServices* m_hostServices = nullptr;
+    zen::HostServicesClient m_host;
     std::int64_t m_hostChannelIndex = -1;
     std::int64_t m_hostSessionId = 0;
 
@@ -152,8 +195,9 @@ private:
     std::uint32_t m_outputs = 0;
 
     zen::ParameterTable m_parameters;
-    std::unique_ptr<std::atomic<std::uint64_t>[]> m_pending;  // one bit per parameter
-    std::uint32_t m_pendingWords = 0;
+    zen::PendingBits m_pending;  // stepped parameters changed since the last block
+    std::vector<std::unique_ptr<zen::SmoothedValueGroup>> m_smoothed;  // by parameter; null when stepped
+    zen::MeterTable m_meters;
 
     std::atomic<bool> m_prepared{false};
     std::atomic<bool> m_processing{false};

@@ -8,7 +8,7 @@
 void ZenControlPluginImpl::AttachToHost(const char* registryName, const char* className, zen::HostServices* hostServices) {
     m_name = registryName;
     m_className = className;
-    m_hostServices = hostServices;
+    m_host = zen::HostServicesClient(hostServices);
 }
 
 void* ZenControlPluginImpl::QueryInterface(const char* interfaceName) {
@@ -37,7 +37,7 @@ float ZenControlPluginImpl::GetParameter(std::uint32_t index) const {
 
 bool ZenControlPluginImpl::OnParameterChanged(std::uint32_t index, float value) {
     if (!m_parameters.Contains(index)) return false;
-    m_parameters[index].Exchange(value);
+    m_parameters.Store(index, value);
     return true;
 }
 
@@ -47,6 +47,7 @@ bool ZenControlPluginImpl::LoadState(const std::string& state) {
     zen::StateText::Contents contents;
     if (!zen::StateText::Parse(state, m_className, m_parameters, contents)) return false;
     for (const auto& [index, value] : contents.values) SetParameter(index, value);
+    m_parameters.MarkLoaded();
     return true;
 }
 

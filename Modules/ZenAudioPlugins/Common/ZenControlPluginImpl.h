@@ -7,6 +7,7 @@
 #include <QObject>
 #include <QString>
 
+#include "HostServicesClient.h"
 #include "ParameterTable.h"
 #include "zen/ControlPlugin.h"
 #include "zen/PluginInstance.h"
@@ -18,7 +19,16 @@ class ZenControlPluginImpl : public QObject, public zen::PluginInstance, public 
 public:
     // Called once by the factory.
     void AttachToHost(const char* registryName, const char* className, zen::HostServices* hostServices);
-    zen::HostServices* GetHostServices() const { return m_hostServices; }
+    zen::HostServices* GetHostServices() const { return m_host.Services(); }
+
+    // Runs a host action; false when the host offers no actions or refuses
+    // this one. UI thread; allocates.
+    bool CallHostAction(const char* action, const std::vector<std::string>& arguments = {},
+                        std::string* result = nullptr) const {
+        return m_host.CallAction(action, arguments, result);
+    }
+
+    const zen::ParameterTable& Parameters() const { return m_parameters; }
 
     // zen::PluginInstance
     int GetKind() const override { return zen::kControlPluginKind; }
@@ -54,7 +64,7 @@ protected:
 private:
     const char* m_name = "";
     const char* m_className = "";
-    zen::HostServices* m_hostServices = nullptr;
+    zen::HostServicesClient m_host;
     zen::ParameterTable m_parameters;
 };
 

@@ -182,7 +182,34 @@ TEST(ZenfxProcess, DemoMaterialWhenNoInputIsGiven) {
     ASSERT_EQ(json["plugins"].size(), 1u);
     EXPECT_EQ(json["plugins"][0]["name"], "Soft Clipper");
     EXPECT_EQ(json["plugins"][0]["meters"].size(), 5u);
-    EXPECT_EQ(json["plugins"][0]["meters"][1]["name"], "Input Peak 1");
+    ExpectFields(json["plugins"][0]["meters"][1],
+                 R"({"identifier": "ZenSoftClipper::INPUT_PEAK_1", "name": "Input Peak 1", "kind": "level"})");
+}
+
+TEST(ZenfxProcess, MetersOfEveryKindMapToJson) {
+    TempFolder folder;
+    const std::vector<float> input = Ramp(1024, 0.5f);  // two whole blocks
+    WriteAudio(folder / "in.wav", {input}, kRate);
+    auto result = RunZenfx({"--library", ZEN_TEST_LIBRARY_PATH, "process", folder / "in.wav", "-o",
+                            folder / "out.wav", "--no-latency-compensation", "--plugin", "Test Delay", "--set",
+                            "Delay=0", "--meters-json", folder / "meters.json"});
+    ASSERT_EQ(result.exitCode, 0) << result.err;
+    std::ifstream file(folder / "meters.json");
+    const auto meters = nlohmann::json::parse(file)["plugins"][0]["meters"];
+    ASSERT_EQ(meters.size(), 3u);  // mono: one output peak, the array, the ring
+    ExpectFields(meters[0], R"({"identifier": "ZenTestDelay::OUTPUT_PEAK_1", "kind": "level"})");
+    EXPECT_TRUE(meters[0]["value"].is_number());
+    ExpectFields(meters[1], R"({"identifier": "ZenTestDelay::LAST_SAMPLES", "kind": "array"})");
+    EXPECT_EQ(meters[1]["value"].get<std::vector<float>>(), std::vector<float>(input.end() - 8, input.end()));
+    ExpectFields(meters[2], R"({"identifier": "ZenTestDelay::POINTS", "kind": "ring", "value": null})");
+
+    auto info = RunZenfx({"--library", ZEN_TEST_LIBRARY_PATH, "info", "Test Delay", "--json"});
+    ASSERT_EQ(info.exitCode, 0) << info.err;
+    const auto described = nlohmann::json::parse(info.out)["meters"];
+    ExpectFields(described[2], R"({"kind": "array", "size": 8})");
+    ExpectFields(described[3], R"({"kind": "ring", "size": 2, "capacity": 256})");
+    auto text = RunZenfx({"--library", ZEN_TEST_LIBRARY_PATH, "info", "Test Delay"});
+    EXPECT_NE(text.out.find("Points (ring of 256 x 2)"), std::string::npos) << text.out;
 }
 
 TEST(ZenfxProcess, PresetsThenSettings) {

@@ -11,7 +11,6 @@
 
 #include "Common/Algorithms/Delay.h"
 #include "Common/Decibels.h"
-#include "Common/SmoothedValueGroup.h"
 #include "Common/ZenAudioPlugin.h"
 #include "Common/ZenAudioPluginImpl.h"
 
@@ -36,7 +35,8 @@ public:
         auto table = tables.find(className);
         if (table == tables.end()) {
             zen::ParameterTableDefinition rows = zen::MakeParameterTable(
-                className, {zen::ContinuousParameter("GAIN", "Gain", -24.0f, 12.0f, 0.0f, 0.1f, "dB"),
+                className, {zen::ContinuousParameter("GAIN", "Gain", -24.0f, 12.0f, 0.0f, 0.1f, "dB")
+                                .Smoothed(zen::working::DbToGain),
                             zen::ContinuousParameter("SMOOTHING", "Smoothing", 0.0f, 0.99f, 0.0f, 0.01f)});
             table = tables.emplace(className, std::move(rows)).first;
         }
@@ -44,25 +44,20 @@ public:
     }
 
 protected:
-    explicit ZenFaultyGain(const char* className) {
-        InitParameters(Definitions(className));
-        AttachSmoothedValue(m_gain);
-    }
+    explicit ZenFaultyGain(const char* className) { InitParameters(Definitions(className)); }
 
-    bool OnParameterChanged(std::uint32_t index, float value) override {
-        if (!ZenAudioPluginImpl::OnParameterChanged(index, value)) return false;
-        if (index == kGain) m_gain.SetTarget(zen::DbToGain(value));
-        return true;
+    void UpdateProcessingParameter(std::uint32_t index, float value) override {
+        if (index == kSmoothing) m_smoothing = value;
     }
 
     void ProcessBlock(float* const* channels, std::uint32_t channelCount, std::uint32_t frames) noexcept override {
         for (std::uint32_t c = 0; c < channelCount; ++c) {
-            auto gain = m_gain.Track(c);
+            auto gain = Smoothed(kGain).Track(c);
             for (std::uint32_t i = 0; i < frames; ++i) channels[c][i] *= static_cast<float>(gain.Next());
         }
     }
 
-    zen::SmoothedValueGroup m_gain{kMaxChannels, 1.0f};
+    float m_smoothing = 0.0f;  // audio thread
 };
 
 // "Test Allocating": sizes a scratch vector on the audio thread instead of in
@@ -117,9 +112,8 @@ public:
         Faulty("Test Ignored Parameter", "ZenTestIgnoredParameter", 'I', 'g');
     ZenTestIgnoredParameter() : ZenFaultyGain(kDescriptor.className) {}
 
-protected:
-    bool OnParameterChanged(std::uint32_t index, float value) override {
-        return index == kGain || ZenFaultyGain::OnParameterChanged(index, value);
+    bool SetParameter(std::uint32_t index, float value) override {
+        return index == kGain || ZenFaultyGain::SetParameter(index, value);
     }
 };
 
@@ -153,7 +147,7 @@ public:
 
 protected:
     void ProcessBlock(float* const* channels, std::uint32_t channelCount, std::uint32_t frames) noexcept override {
-        const float s = GetParameter(kSmoothing);
+        const float s = m_smoothing;
         for (std::uint32_t c = 0; c < channelCount; ++c) {
             float y = m_state[c];
             for (std::uint32_t i = 0; i < frames; ++i) channels[c][i] = y = (1.0f - s) * channels[c][i] + s * y;
@@ -176,12 +170,13 @@ public:
     static constexpr zen::PluginDescriptor kDescriptor = Faulty("Test Racy", "ZenTestRacy", 'R', 'c');
     ZenTestRacy() : ZenFaultyGain(kDescriptor.className) {}
 
-protected:
-    bool OnParameterChanged(std::uint32_t index, float value) override {
-        if (!ZenFaultyGain::OnParameterChanged(index, value)) return false;
-        if (index == kGain) m_plainGain = zen::DbToGain(value);
+    bool SetParameter(std::uint32_t index, float value) override {
+        if (!ZenFaultyGain::SetParameter(index, value)) return false;
+        if (index == kGain) m_plainGain = zen::DbToGain(GetParameter(kGain));
         return true;
     }
+
+protected:
     void ProcessBlock(float* const* channels, std::uint32_t channelCount, std::uint32_t frames) noexcept override {
         for (std::uint32_t c = 0; c < channelCount; ++c)
             for (std::uint32_t i = 0; i < frames; ++i) channels[c][i] *= m_plainGain;

@@ -5,14 +5,14 @@
 //   2. Prepare(sampleRate, maxBlockSize)       UI thread, not while processing
 //   3. SetParameter / LoadState / SetBypass    any time, any thread (state: UI thread)
 //   4. Process(channels, frames)               audio thread, once per block
-//   5. GetLatency / GetMeter                   any time, any thread
+//   5. GetLatency / GetMeter / ReadMeterArray  any time, any thread (see each)
 // Repeat 2 (and 1) after a change of rate, block size or layout; destroy the
 // instance through zen::PluginInstance.
 //
 // Real-time promises: Process never allocates, locks, blocks, logs or throws
 // (a plug-in whose design needs a lock says so through LocksAudioPath).
-// SetParameter, GetParameter, SetBypass, GetLatency, GetMeter and the design
-// queries (GetTailLength, IsBlockBased, LocksAudioPath) are lock-free.
+// SetParameter, GetParameter, SetBypass, GetLatency, the meter reads and the
+// design queries (GetTailLength, IsBlockBased, LocksAudioPath) are lock-free.
 #pragma once
 
 #include <cstdint>
@@ -82,11 +82,35 @@ public:
     virtual void SetBypass(bool bypassed) = 0;
     virtual bool IsBypassed() const = 0;
 
-    // Meters of the last processed block; the count may change with the
-    // channel layout. Any thread; GetMeterInfo allocates.
+    // Meters, described and read by index; per-channel meters make the
+    // count follow the channel layout. Level and value meters hold their
+    // reading of the last processed block (GetMeter), arrays their last
+    // publication; Prepare and Reset return readings to rest (silence, no
+    // gain change, zeros) and Prepare empties rings. GetMeterCount and
+    // GetMeter: any thread, lock-free. GetMeterInfo: any thread; allocates.
     virtual std::uint32_t GetMeterCount() const = 0;
     virtual bool GetMeterInfo(std::uint32_t index, zen::MeterInfo& info) const = 0;
+    // Level meters in dB, value meters as published; 0 for arrays, rings and
+    // an index out of range.
     virtual float GetMeter(std::uint32_t index) const = 0;
+
+    // Copies an array meter's last publication, whole and consistent, into
+    // `values` (info.size floats). False when the meter is not an array,
+    // `count` is below its size, the instance is not prepared, or the audio
+    // thread published throughout several attempts. Any thread but not
+    // during Prepare or ConfigureChannels; lock-free, never waits for the
+    // audio thread.
+    virtual bool ReadMeterArray(std::uint32_t index, float* values, std::uint32_t count) const = 0;
+
+    // Drains a ring meter: copies up to maxRecords records (info.size floats
+    // each) written since `cursor` into `records` and advances `cursor`, a
+    // position the reader owns (start at 0). The audio thread never waits for
+    // readers: records overwritten before a slow reader got to them are
+    // skipped and counted in `lost`. A cursor beyond what was written (after
+    // Prepare emptied the ring) starts again from 0. Any thread but not
+    // during Prepare or ConfigureChannels; lock-free.
+    virtual zen::MeterRingRead ReadMeterRing(std::uint32_t index, std::uint64_t& cursor, float* records,
+                                             std::uint32_t maxRecords) const = 0;
 
 protected:
     ~AudioPlugin() = default;  // destroyed through zen::PluginInstance

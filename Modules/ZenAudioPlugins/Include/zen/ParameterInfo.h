@@ -33,11 +33,32 @@ struct ParameterInfo {
     std::vector<std::string> choices;  // captions of a list parameter, in value order
 };
 
+// What a meter publishes and how a host reads it.
+enum class MeterKind : std::uint32_t {
+    Level = 0,  // a magnitude; GetMeter reads it in dB
+    Value = 1,  // a number in its unit (a correlation, a loudness); GetMeter reads it as is
+    Array = 2,  // `size` values published together (a spectrum, band levels); ReadMeterArray
+    Ring = 3,   // a history of records of `size` values (goniometer points); ReadMeterRing
+};
+
 struct MeterInfo {
+    // Stable once released (LV2 port symbols and JSON keys come from it):
+    // class name, "::" and an upper-case name, with the channel number for a
+    // meter per channel: "ZenSoftClipper::INPUT_PEAK_1".
+    std::string identifier;
     std::string name;  // "Input Peak 1", "Gain Reduction"
     std::string unit;  // "dB", "dBTP", or empty
     float minimum = 0.0f;  // display range; readings may leave it
     float maximum = 0.0f;
+    MeterKind kind = MeterKind::Level;
+    std::uint32_t size = 1;      // values per reading: 1, an array's length, a ring record's width
+    std::uint32_t capacity = 0;  // rings: records held before the oldest is overwritten
+};
+
+// What one ReadMeterRing call delivered.
+struct MeterRingRead {
+    std::uint32_t records = 0;  // records copied
+    std::uint64_t lost = 0;     // records overwritten before this reader got to them
 };
 
 }  // namespace zen

@@ -75,12 +75,34 @@ struct PluginListEntry {
     std::uint32_t listFlags = 0;    // descriptor list flags (0 for control plug-ins)
 };
 
-// Services a host may hand to the library before creating instances. Each
-// function is called with the services object itself; any pointer may be null.
-// The library only stores the two values for each instance it creates.
+// Layout version of HostServices that this header describes.
+constexpr std::uint32_t kHostServicesVersion = 1;
+
+// Services a host may hand to the library before creating instances.
+//
+// Rules for hosts: set structSize to sizeof(HostServices) as your build sees
+// it and version to the kHostServicesVersion of your header; set every entry
+// you do not offer to null. New versions only append entries, and the library
+// reads an entry only when structSize covers it, so a host built against an
+// older header keeps working with a newer library and the other way round.
+// Each entry is called with the services object itself, which must outlive
+// the instances created while it was set.
 struct HostServices {
+    std::uint32_t structSize;  // sizeof(HostServices) as the host compiled it
+    std::uint32_t version;     // kHostServicesVersion of the host's header
+
+    // Asked once per audio instance, at its creation.
     std::int64_t (*GetChannelIndex)(HostServices* self);  // mixer channel the instance is inserted on
     std::int64_t (*GetSessionId)(HostServices* self);     // identifies the host session
+
+    // Runs a host action by name ("LoadPlugin", "SetIntParameter",
+    // "AudioLevellerEngine", ...) with text arguments. The host writes a
+    // NUL-terminated answer, possibly empty and cut to resultCapacity bytes,
+    // into result (null when resultCapacity is 0). False for an action the
+    // host does not know or could not run. Called from the UI thread, never
+    // from the audio thread; the host may allocate and block.
+    bool (*CallAction)(HostServices* self, const char* action, const char* const* arguments,
+                       std::uint32_t argumentCount, char* result, std::uint32_t resultCapacity);
 };
 
 }  // namespace zen

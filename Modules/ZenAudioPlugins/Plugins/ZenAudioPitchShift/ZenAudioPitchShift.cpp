@@ -78,11 +78,15 @@ bool ZenAudioPitchShift::BuildEngine() {
     } catch (const std::exception&) {
         return false;
     }
-    m_pEngine->SetJoint(m_joint);
-    m_pEngine->SetLog10Eps(m_log10Eps);
-    m_pEngine->SetMaxPeak(m_maxPeak);
-    m_pEngine->SetLog10Tol(m_log10Tol);
+    ApplyTuning();
     return true;
+}
+
+void ZenAudioPitchShift::ApplyTuning() noexcept {
+    m_pEngine->SetJoint(m_tuning.joint);
+    m_pEngine->SetLog10Eps(m_tuning.log10Eps);
+    m_pEngine->SetMaxPeak(m_tuning.maxPeak);
+    m_pEngine->SetLog10Tol(m_tuning.log10Tol);
 }
 
 // Hosts probe layouts, so a mismatch is a plain refusal, not a programming error.
@@ -113,43 +117,35 @@ bool ZenAudioPitchShift::ApplyNeutralSetting() {
     return SetParameter(kDryWet, 0.0f);
 }
 
-ora::pitchshift::Engine::Settings ZenAudioPitchShift::WantedSettings() const {
-    const zen::ParameterTable& p = Parameters();
-    ora::pitchshift::Engine::Settings s;
-    s.coarse = static_cast<std::int32_t>(std::lround(p[kCoarse].GetValue()));
-    s.fine = p[kFine].GetValue();
-    s.dryWet = p[kDryWet].GetValue();
-    s.algorithmType = static_cast<std::int32_t>(std::lround(p[kAlgoType].GetValue()));
-    s.algorithmMode = static_cast<std::int32_t>(std::lround(p[kAlgoMode].GetValue()));
-    return s;
+void ZenAudioPitchShift::UpdateProcessingParameter(std::uint32_t index, float value) {
+    switch (index) {
+        case kCoarse: m_wanted.coarse = static_cast<std::int32_t>(std::lround(value)); break;
+        case kFine: m_wanted.fine = value; break;
+        case kDryWet: m_wanted.dryWet = value; break;
+        case kJointOn: m_wantedTuning.joint = value >= 0.5f; break;
+        case kAlgoType: m_wanted.algorithmType = static_cast<std::int32_t>(std::lround(value)); break;
+        case kAlgoMode: m_wanted.algorithmMode = static_cast<std::int32_t>(std::lround(value)); break;
+        case kLog10EpsPeak: m_wantedTuning.log10Eps = value; break;
+        case kMaxPeak: m_wantedTuning.maxPeak = static_cast<int>(std::lround(value)); break;
+        case kLog10Tol: m_wantedTuning.log10Tol = value; break;
+        default: break;
+    }
 }
 
 void ZenAudioPitchShift::ApplyChanges(boost::upgrade_lock<boost::upgrade_mutex>& lock) noexcept {
-    const zen::ParameterTable& p = Parameters();
-    const auto wanted = WantedSettings();
-    const std::uint32_t bits = m_pEngine->Changes(wanted);
-    const bool joint = p[kJointOn].GetValue() >= 0.5f;
-    const float log10Eps = p[kLog10EpsPeak].GetValue();
-    const int maxPeak = static_cast<int>(std::lround(p[kMaxPeak].GetValue()));
-    const float log10Tol = p[kLog10Tol].GetValue();
-    const bool tuning = joint != m_joint || log10Eps != m_log10Eps || maxPeak != m_maxPeak || log10Tol != m_log10Tol;
+    const std::uint32_t bits = m_pEngine->Changes(m_wanted);
+    const bool tuning = m_wantedTuning != m_tuning;
     if (bits == 0 && m_pEngine->Pending() == 0 && !tuning && !m_settle) return;
 
     boost::upgrade_to_unique_lock<boost::upgrade_mutex> exclusive(lock);
-    m_pEngine->Apply(wanted, bits);
+    m_pEngine->Apply(m_wanted, bits);
     if (m_settle) {
         m_pEngine->Reset();  // nothing was processed since the last reset
         m_settle = false;
     }
     if (tuning) {
-        m_joint = joint;
-        m_log10Eps = log10Eps;
-        m_maxPeak = maxPeak;
-        m_log10Tol = log10Tol;
-        m_pEngine->SetJoint(joint);
-        m_pEngine->SetLog10Eps(log10Eps);
-        m_pEngine->SetMaxPeak(maxPeak);
-        m_pEngine->SetLog10Tol(log10Tol);
+        m_tuning = m_wantedTuning;
+        ApplyTuning();
     }
 }
 
@@ -185,14 +181,14 @@ void ZenAudioPitchShift::ProcessBlock(float* const* channels, std::uint32_t chan
 void ZenAudioPitchShift::ResetProcessing() {
     boost::unique_lock<boost::upgrade_mutex> lock(m_engineLock);
     // Back to the construction values; the next block compares the host's
-    // parameters with them and applies whatever differs.
-    m_maxPeak = 50;
-    m_log10Tol = -6.0f;
+    // settings with them and applies whatever differs.
+    m_tuning.maxPeak = Tuning{}.maxPeak;
+    m_tuning.log10Tol = Tuning{}.log10Tol;
     m_settle = true;
     if (!m_pEngine) return;
     m_pEngine->ForgetSettings();
-    m_pEngine->SetMaxPeak(m_maxPeak);
-    m_pEngine->SetLog10Tol(m_log10Tol);
+    m_pEngine->SetMaxPeak(m_tuning.maxPeak);
+    m_pEngine->SetLog10Tol(m_tuning.log10Tol);
     m_pEngine->Reset();
 }
 

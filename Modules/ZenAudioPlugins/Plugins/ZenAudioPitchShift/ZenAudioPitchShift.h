@@ -61,6 +61,7 @@ public:
     bool ApplyNeutralSetting() override;
 
 protected:
+    void UpdateProcessingParameter(std::uint32_t index, float value) override;
     bool AcceptsChannelConfiguration(std::uint32_t inputs, std::uint32_t outputs) const override;
     void PrepareProcessing(float sampleRate, std::uint32_t maxBlockSize) override;
     void ProcessBlock(float* const* channels, std::uint32_t channelCount, std::uint32_t frames) noexcept override;
@@ -70,7 +71,8 @@ private:
     // Builds the engine for the current channel count; the caller holds the
     // lock exclusively. False when it cannot be built.
     bool BuildEngine();
-    ora::pitchshift::Engine::Settings WantedSettings() const;
+    // Hands m_tuning to the engine; the caller holds the lock exclusively.
+    void ApplyTuning() noexcept;
     // Applies changed settings; the caller holds the lock at least upgradable.
     // The first application after a preparation or reset also settles the
     // engine there, so it starts at its settings instead of gliding to them.
@@ -84,9 +86,20 @@ private:
 
     bool m_settle = true;  // audio thread, or under the exclusive lock
 
-    // Reconstruction settings last handed to the engine (audio thread).
-    bool m_joint = true;
-    float m_log10Eps = -2.3f;
-    int m_maxPeak = 50;
-    float m_log10Tol = -6.0f;
+    // The phase reconstruction's settings.
+    struct Tuning {
+        bool joint = true;
+        float log10Eps = -2.3f;
+        int maxPeak = 50;
+        float log10Tol = -6.0f;
+        bool operator!=(const Tuning& o) const {
+            return joint != o.joint || log10Eps != o.log10Eps || maxPeak != o.maxPeak || log10Tol != o.log10Tol;
+        }
+    };
+    // The host's settings as handed over (audio thread).
+    ora::pitchshift::Engine::Settings m_wanted;
+    Tuning m_wantedTuning;
+    // The tuning last handed to the engine (audio thread, or under the
+    // exclusive lock).
+    Tuning m_tuning;
 };

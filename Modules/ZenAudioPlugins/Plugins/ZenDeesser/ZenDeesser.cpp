@@ -5,7 +5,6 @@
 #include <cmath>
 #include <iterator>
 
-#include "Common/Decibels.h"
 #include "Common/ZenAudioPlugin.h"
 
 const zen::PluginDescriptor ZenDeesser::kDescriptor = {
@@ -22,7 +21,10 @@ constexpr float kReductionMeterFloorDb = -18.0f;
 
 }  // namespace
 
-ZenDeesser::ZenDeesser() { InitParameters(Definitions()); }
+ZenDeesser::ZenDeesser() {
+    InitParameters(Definitions());
+    InitMeters(Meters());
+}
 
 const zen::ParameterTableDefinition& ZenDeesser::Definitions() {
     static const zen::ParameterTableDefinition table = zen::MakeParameterTable(
@@ -39,6 +41,16 @@ const zen::ParameterTableDefinition& ZenDeesser::Definitions() {
             zen::ContinuousParameter("AMOUNT", QT_TRANSLATE_NOOP("ZenDeesser", "Amount"), 0.0f, 100.0f, 50.0f, 0.1f,
                                      "%"),
         });
+    return table;
+}
+
+const zen::MeterTableDefinition& ZenDeesser::Meters() {
+    static const zen::MeterTableDefinition table = zen::MakeMeterTable(
+        "ZenDeesser", {
+                          zen::ValueMeter("REDUCTION", QT_TRANSLATE_NOOP("ZenDeesser", "Reduction"), "dB",
+                                          kReductionMeterFloorDb, 0.0f),
+                          zen::LevelMeter("OUTPUT", QT_TRANSLATE_NOOP("ZenDeesser", "Output"), "dBFS", -60.0f, 6.0f),
+                      });
     return table;
 }
 
@@ -62,38 +74,10 @@ void ZenDeesser::ProcessBlock(float* const* channels, std::uint32_t channelCount
     float peak = 0.0f;
     for (std::uint32_t c = 0; c < channelCount; ++c)
         for (std::uint32_t i = 0; i < frames; ++i) peak = std::max(peak, std::fabs(channels[c][i]));
-    m_outputPeak.store(peak, std::memory_order_relaxed);
+    PublishMeter(kReductionMeter, m_deesser.GetMeter(Deesser::kReductionMeter));
+    PublishMeter(kOutputMeter, peak);
 }
 
-void ZenDeesser::ResetProcessing() {
-    m_deesser.Reset();
-    m_outputPeak.store(0.0f, std::memory_order_relaxed);
-}
-
-bool ZenDeesser::GetMeterInfo(std::uint32_t index, zen::MeterInfo& info) const {
-    switch (index) {
-        case kReductionMeter:
-            info.name = QCoreApplication::translate("ZenDeesser", "Reduction").toStdString();
-            info.unit = "dB";
-            info.minimum = kReductionMeterFloorDb;
-            info.maximum = 0.0f;
-            return true;
-        case kOutputMeter:
-            info.name = QCoreApplication::translate("ZenDeesser", "Output").toStdString();
-            info.unit = "dBFS";
-            info.minimum = -60.0f;
-            info.maximum = 6.0f;
-            return true;
-        default: return false;
-    }
-}
-
-float ZenDeesser::GetMeter(std::uint32_t index) const {
-    switch (index) {
-        case kReductionMeter: return m_deesser.GetMeter(Deesser::kReductionMeter);
-        case kOutputMeter: return zen::GainToMeterDb(m_outputPeak.load(std::memory_order_relaxed));
-        default: return 0.0f;
-    }
-}
+void ZenDeesser::ResetProcessing() { m_deesser.Reset(); }
 
 template class ZenAudioPlugin<ZenDeesser>;

@@ -6,8 +6,6 @@
 // (UpdateProcessingParameter), so its coefficients never race the processing.
 #pragma once
 
-#include <atomic>
-
 #include "Common/Algorithms/Deesser.h"
 #include "Common/ZenAudioPluginImpl.h"
 
@@ -18,17 +16,14 @@ public:
     static const zen::PluginDescriptor kDescriptor;
 
     enum Parameter : std::uint32_t { kEssOnly, kFrequency, kMode, kAmount };
-    // Meters: the present gain reduction (dB, <= 0 while reducing) and the
-    // output peak of the last block (dBFS, loudest channel).
-    enum Meter : std::uint32_t { kReductionMeter, kOutputMeter, kMeterCount };
+    // Rows of the meter table: the present gain reduction (dB, <= 0 while
+    // reducing) and the output peak of the last block (loudest channel).
+    enum Meter : std::uint32_t { kReductionMeter, kOutputMeter };
 
     ZenDeesser();
 
     static const zen::ParameterTableDefinition& Definitions();
-
-    std::uint32_t GetMeterCount() const override { return kMeterCount; }
-    bool GetMeterInfo(std::uint32_t index, zen::MeterInfo& info) const override;
-    float GetMeter(std::uint32_t index) const override;
+    static const zen::MeterTableDefinition& Meters();
 
 protected:
     void UpdateProcessingParameter(std::uint32_t index, float value) override;
@@ -39,5 +34,4 @@ protected:
 
 private:
     Deesser m_deesser;
-    std::atomic<float> m_outputPeak{0.0f};  // linear
 };

@@ -21,8 +21,6 @@ constexpr std::uint64_t kHoldFactor = 4;
 // The release time constant, in units of the set release time.
 constexpr double kReleaseFactor = 4.0;
 
-float LevelDb(float peak, float silence) { return peak > 0.0f ? 20.0f * std::log10(peak) : silence; }
-
 // A raised-cosine window of `length` taps summing to 1, symmetric: its first
 // half, the middle included.
 std::vector<float> RampHalf(std::size_t length) {
@@ -40,10 +38,9 @@ std::vector<float> RampHalf(std::size_t length) {
 
 }  // namespace
 
-ZenLimiter::ZenLimiter() : m_ceiling(1, zen::DbToGainFloored(-kCeilingMarginDb)) {
+ZenLimiter::ZenLimiter() {
     InitParameters(Definitions());
-    AttachSmoothedValue(m_inputGain);
-    AttachSmoothedValue(m_ceiling);
+    InitMeters(Meters());
 }
 
 ZenLimiter::~ZenLimiter() = default;
@@ -53,14 +50,41 @@ const zen::ParameterTableDefinition& ZenLimiter::Definitions() {
         "ZenLimiter",
         {
             zen::ContinuousParameter("INPUT_GAIN", QT_TRANSLATE_NOOP("ZenLimiter", "Input Gain"), -18.0f, 18.0f, 0.0f,
-                                     0.1f, "dB"),
+                                     0.1f, "dB")
+                .Smoothed(zen::working::DbToGainFloored),
             zen::ContinuousParameter("THRESHOLD", QT_TRANSLATE_NOOP("ZenLimiter", "Ceiling"), -24.0f, 0.0f, 0.0f, 0.1f,
-                                     "dBTP"),
+                                     "dBTP")
+                .SmoothedSingle(CeilingGain),
             zen::ContinuousParameter("RELEASE", QT_TRANSLATE_NOOP("ZenLimiter", "Release"), 0.0f, 1000.0f, 1.0f, 0.01f,
                                      "ms"),
             zen::SwitchParameter("SOFT", QT_TRANSLATE_NOOP("ZenLimiter", "Soft"), 0.0f),
         });
     return table;
+}
+
+const zen::MeterTableDefinition& ZenLimiter::Meters() {
+    static const zen::MeterTableDefinition table = zen::MakeMeterTable(
+        "ZenLimiter",
+        {
+            zen::LevelMeter("GAIN_REDUCTION", QT_TRANSLATE_NOOP("ZenLimiter", "Gain Reduction"), "dB",
+                            kGainMeterFloorDb, 0.0f)
+                .SilenceReads(kGainMeterFloorDb)
+                .AtRest(1.0f),
+            // Input gain reaches +18 dB.
+            zen::LevelMeter("INPUT_TRUE_PEAK", QT_TRANSLATE_NOOP("ZenLimiter", "Input True Peak"), "dBTP",
+                            kLevelMeterFloorDb, 24.0f)
+                .SilenceReads(kLevelMeterFloorDb)
+                .PerChannel(),
+            zen::LevelMeter("OUTPUT_PEAK", QT_TRANSLATE_NOOP("ZenLimiter", "Output Peak"), "dBFS", kLevelMeterFloorDb,
+                            0.0f)
+                .SilenceReads(kLevelMeterFloorDb)
+                .PerChannel(),
+        });
+    return table;
+}
+
+float ZenLimiter::CeilingGain(float ceilingDb) {
+    return zen::DbToGainFloored(static_cast<double>(ceilingDb) - kCeilingMarginDb);
 }
 
 float ZenLimiter::Soften(float x, float knee) noexcept {
@@ -69,22 +93,8 @@ float ZenLimiter::Soften(float x, float knee) noexcept {
     return std::copysign(knee * std::tanh(magnitude / knee) / kTanhOne, x);
 }
 
-bool ZenLimiter::OnParameterChanged(std::uint32_t index, float value) {
-    if (!ZenAudioPluginImpl::OnParameterChanged(index, value)) return false;
-    switch (index) {
-        case kInputGain: m_inputGain.SetTarget(zen::DbToGainFloored(value)); break;
-        case kCeiling:
-        case kSoft: SetCeilingTarget(); break;
-        default: break;
-    }
-    return true;
-}
-
-void ZenLimiter::SetCeilingTarget() {
-    m_ceiling.SetTarget(zen::DbToGainFloored(static_cast<double>(GetParameter(kCeiling)) - kCeilingMarginDb));
-}
-
 void ZenLimiter::UpdateProcessingParameter(std::uint32_t index, float value) {
+    if (index == kSoft) m_soft = value != 0.0f;
     if (index != kRelease) return;
     const auto samples = static_cast<std::uint64_t>(static_cast<double>(GetSampleRate()) * value / 1000.0);
     const double c = std::exp(-1.0 / (kReleaseFactor * static_cast<double>(std::max<std::uint64_t>(samples, 1))));
@@ -141,15 +151,11 @@ void ZenLimiter::Clear() noexcept {
     // The first block ends once the true-peak latency has passed: from then
     // on a block's reading is complete as its first sample leaves the buffer.
     m_position = m_blockLength - m_truePeakLatency;
-    for (std::uint32_t c = 0; c < kMaxChannels; ++c) {
-        m_inputTruePeak[c].store(0.0f, std::memory_order_relaxed);
-        m_outputPeak[c].store(0.0f, std::memory_order_relaxed);
-    }
-    m_gainMeter.store(1.0f, std::memory_order_relaxed);
+    ResetMeters();
 }
 
 void ZenLimiter::FinishBlock(std::uint32_t channelCount, float ceiling) noexcept {
-    const bool softOn = GetParameter(kSoft) != 0.0f;
+    const bool softOn = m_soft;
     const float knee = std::max(kSoftKneeMin, std::min(ceiling, kSoftKneeMax));
     float peak = 0.0f;
     for (std::uint32_t c = 0; c < channelCount; ++c) {
@@ -199,7 +205,7 @@ void ZenLimiter::ProcessBlock(float* const* channels, std::uint32_t channelCount
         channelCount = std::min<std::uint32_t>(channelCount, static_cast<std::uint32_t>(m_truePeaks.size()));
     }
     for (std::uint32_t c = 0; c < channelCount; ++c) {
-        auto gain = m_inputGain.Track(c);
+        auto gain = Smoothed(kInputGain).Track(c);
         float* x = channels[c];
         for (std::uint32_t i = 0; i < frames; ++i) x[i] *= static_cast<float>(gain.Next());
     }
@@ -209,16 +215,17 @@ void ZenLimiter::ProcessBlock(float* const* channels, std::uint32_t channelCount
     // A block's sample peak is complete the true-peak latency before its
     // true peak, at this position.
     const std::uint32_t samplePeakDone = m_blockLength - m_truePeakLatency;
-    auto ceilingCursor = m_ceiling.Track(0);
+    zen::SmoothedValueGroup& ceilingGroup = Smoothed(kCeiling);
+    auto ceilingCursor = ceilingGroup.Track(0);
     float ceiling = 0.0f;
     // The softened copy is measured only while Soft is on; its readers start
     // from silence when it is switched on.
-    const bool softOn = GetParameter(kSoft) != 0.0f;
+    const bool softOn = m_soft;
     if (softOn && !m_softMeasuring)
         for (auto& truePeak : m_softTruePeaks) truePeak->Reset();
     m_softMeasuring = softOn;
     const float measureKnee =
-        std::max(kSoftKneeMin, std::min(static_cast<float>(m_ceiling[0].current.load(std::memory_order_relaxed)),
+        std::max(kSoftKneeMin, std::min(static_cast<float>(ceilingGroup[0].current.load(std::memory_order_relaxed)),
                                         kSoftKneeMax));
     for (std::uint32_t done = 0; done < frames;) {
         const std::uint32_t boundary = m_position < samplePeakDone ? samplePeakDone : m_blockLength;
@@ -257,40 +264,10 @@ void ZenLimiter::ProcessBlock(float* const* channels, std::uint32_t channelCount
         const float* y = channels[c];
         float peak = 0.0f;
         for (std::uint32_t i = 0; i < frames; ++i) peak = std::max(peak, std::fabs(y[i]));
-        m_outputPeak[c].store(peak, std::memory_order_relaxed);
-        if (m_callFinishedBlock) m_inputTruePeak[c].store(m_callInputPeak[c], std::memory_order_relaxed);
+        PublishMeter(kOutputPeakMeter, c, peak);
+        if (m_callFinishedBlock) PublishMeter(kInputTruePeakMeter, c, m_callInputPeak[c]);
     }
-    m_gainMeter.store(m_appliedGain, std::memory_order_relaxed);
-}
-
-std::uint32_t ZenLimiter::GetMeterCount() const { return 1 + 2 * GetProcessChannelCount(); }
-
-bool ZenLimiter::GetMeterInfo(std::uint32_t index, zen::MeterInfo& info) const {
-    if (index >= GetMeterCount()) return false;
-    if (index == kGainMeter) {
-        info.name = QCoreApplication::translate("ZenLimiter", "Gain Reduction").toStdString();
-        info.unit = "dB";
-        info.minimum = kGainMeterFloorDb;
-        info.maximum = 0.0f;
-        return true;
-    }
-    const std::uint32_t channel = (index - 1) / 2;
-    const bool input = (index - 1) % 2 == 0;
-    const QString name = input ? QCoreApplication::translate("ZenLimiter", "Input True Peak %1")
-                               : QCoreApplication::translate("ZenLimiter", "Output Peak %1");
-    info.name = name.arg(channel + 1).toStdString();
-    info.unit = input ? "dBTP" : "dBFS";
-    info.minimum = kLevelMeterFloorDb;
-    info.maximum = input ? 24.0f : 0.0f;  // input gain reaches +18 dB
-    return true;
-}
-
-float ZenLimiter::GetMeter(std::uint32_t index) const {
-    if (index >= GetMeterCount()) return 0.0f;
-    if (index == kGainMeter) return LevelDb(m_gainMeter.load(std::memory_order_relaxed), kGainMeterFloorDb);
-    const std::uint32_t channel = (index - 1) / 2;
-    const auto& peaks = (index - 1) % 2 == 0 ? m_inputTruePeak : m_outputPeak;
-    return LevelDb(peaks[channel].load(std::memory_order_relaxed), kLevelMeterFloorDb);
+    PublishMeter(kGainMeter, m_appliedGain);
 }
 
 template class ZenAudioPlugin<ZenLimiter>;

@@ -21,7 +21,6 @@
 #pragma once
 
 #include <array>
-#include <atomic>
 #include <cstdint>
 #include <memory>
 #include <vector>
@@ -31,7 +30,6 @@
 #include "Algorithms/TruePeak.h"
 #include "Algorithms/Vec.h"
 #include "Common/Algorithms/Delay.h"
-#include "Common/SmoothedValueGroup.h"
 #include "Common/ZenAudioPluginImpl.h"
 
 class ZenLimiter : public ZenAudioPluginImpl {
@@ -41,11 +39,9 @@ public:
     static const zen::PluginDescriptor kDescriptor;
 
     enum Parameter : std::uint32_t { kInputGain, kCeiling, kRelease, kSoft };
-
-    // Meters: 0 the gain in dB, then input true peak and output peak per channel.
-    static constexpr std::uint32_t kGainMeter = 0;
-    static constexpr std::uint32_t InputTruePeakMeter(std::uint32_t channel) { return 1 + 2 * channel; }
-    static constexpr std::uint32_t OutputPeakMeter(std::uint32_t channel) { return 2 + 2 * channel; }
+    // Rows of the meter table: the gain applied (read in dB), then each
+    // channel's input true peak and output peak.
+    enum Meter : std::uint32_t { kGainMeter, kInputTruePeakMeter, kOutputPeakMeter };
 
     // The ceiling is held this far below its setting, a margin for the
     // true-peak estimate.
@@ -67,19 +63,18 @@ public:
     ~ZenLimiter() override;
 
     static const zen::ParameterTableDefinition& Definitions();
+    static const zen::MeterTableDefinition& Meters();
 
+    // The working value of the ceiling: the linear gain of the setting less
+    // the margin.
+    static float CeilingGain(float ceilingDb);
     // The soft stage's curve for a sample with knee k.
     static float Soften(float x, float knee) noexcept;
     // Internal block and look-ahead lengths at the prepared rate.
     std::uint32_t GetBlockLength() const { return m_blockLength; }
     std::uint32_t GetLookAheadLength() const { return m_lookAheadLength; }
 
-    std::uint32_t GetMeterCount() const override;
-    bool GetMeterInfo(std::uint32_t index, zen::MeterInfo& info) const override;
-    float GetMeter(std::uint32_t index) const override;
-
 protected:
-    bool OnParameterChanged(std::uint32_t index, float value) override;
     void UpdateProcessingParameter(std::uint32_t index, float value) override;
     void PrepareProcessing(float sampleRate, std::uint32_t maxBlockSize) override;
     void ProcessBlock(float* const* channels, std::uint32_t channelCount, std::uint32_t frames) noexcept override;
@@ -87,15 +82,12 @@ protected:
 
 private:
     void Clear() noexcept;
-    void SetCeilingTarget();
     // The block whose true peak is now complete: its soft stage and target gain.
     void FinishBlock(std::uint32_t channelCount, float ceiling) noexcept;
     void ApplyGain(float* const* channels, std::uint32_t channelCount, std::size_t offset, std::size_t frames) noexcept;
 
-    zen::SmoothedValueGroup m_inputGain{kMaxChannels, 1.0f};  // linear
-    zen::SmoothedValueGroup m_ceiling;                        // C, linear
-
     // Audio thread.
+    bool m_soft = false;          // "Soft"
     float m_releaseGain = 1.0f;   // 1 - c
     float m_releaseCoeff = 0.0f;  // c
     float m_gain = 1.0f;          // g
@@ -129,8 +121,4 @@ private:
     float m_knee = kSoftKneeMax;  // of the block leaving the buffer
     float m_callInputPeak[kMaxChannels] = {};
     bool m_callFinishedBlock = false;
-
-    std::array<std::atomic<float>, kMaxChannels> m_inputTruePeak{};
-    std::array<std::atomic<float>, kMaxChannels> m_outputPeak{};
-    std::atomic<float> m_gainMeter{1.0f};
 };

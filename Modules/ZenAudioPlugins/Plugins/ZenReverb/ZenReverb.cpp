@@ -24,7 +24,10 @@ constexpr double kLaneLengthMargin = 1.01;
 
 }  // namespace
 
-ZenReverb::ZenReverb() { InitParameters(Definitions()); }
+ZenReverb::ZenReverb() {
+    InitParameters(Definitions());
+    for (std::size_t i = 0; i < m_floor.size(); ++i) m_floor[i] = Definitions()[kRoomLength + i].defaultValue;
+}
 
 ZenReverb::~ZenReverb() = default;
 
@@ -101,9 +104,8 @@ void ZenReverb::UpdateProcessingParameter(std::uint32_t index, float value) {
     if (!m_engine) return;
     m_engine->Set(RecordEntry(index), ToRecord(index, value));
     if (index == kRoomLength || index == kRoomWidth || index == kRoomSize || index == kRoomRatio) {
-        const zen::ParameterTable& p = Parameters();
-        const auto [length, width] = EffectiveFloor(p[kRoomLength].GetValue(), p[kRoomWidth].GetValue(),
-                                                    p[kRoomSize].GetValue(), p[kRoomRatio].GetValue());
+        m_floor[index - kRoomLength] = value;
+        const auto [length, width] = EffectiveFloor(m_floor[0], m_floor[1], m_floor[2], m_floor[3]);
         m_engine->Set(zn_reverb::kRoomLength, length);
         m_engine->Set(zn_reverb::kRoomWidth, width);
     }

@@ -16,6 +16,7 @@
 // with any of them when a host moves one alone.
 #pragma once
 
+#include <array>
 #include <memory>
 #include <utility>
 
@@ -72,4 +73,7 @@ protected:
 private:
     std::unique_ptr<zen::reverb::zn_reverb> m_engine;
     std::unique_ptr<zen::reverb::zn_reverb_u15> m_processor;
+    // "Room Length", "Room Width", "Room Size", "Room Ratio" as last handed
+    // over (audio thread).
+    std::array<float, 4> m_floor;
 };

@@ -4,7 +4,6 @@
 #include <algorithm>
 #include <cmath>
 
-#include "Common/Decibels.h"
 #include "Common/ZenAudioPlugin.h"
 
 const zen::PluginDescriptor ZenSoftClipper::kDescriptor = {
@@ -23,33 +22,39 @@ float TanhOne() {
 
 ZenSoftClipper::ZenSoftClipper() {
     InitParameters(Definitions());
-    AttachSmoothedValue(m_threshold);
-    AttachSmoothedValue(m_shape);
-    AttachSmoothedValue(m_outputGain);
+    InitMeters(Meters());
 }
 
 const zen::ParameterTableDefinition& ZenSoftClipper::Definitions() {
-    static const zen::ParameterTableDefinition table = zen::MakeParameterTable(
+    using namespace zen;
+    static const ParameterTableDefinition table = MakeParameterTable(
         "ZenSoftClipper",
         {
-            zen::ContinuousParameter("THRESHOLD", QT_TRANSLATE_NOOP("ZenSoftClipper", "Threshold"), -18.0f, 18.0f,
-                                     0.0f, 0.1f, "dB"),
-            zen::ContinuousParameter("SHAPE", QT_TRANSLATE_NOOP("ZenSoftClipper", "Shape"), 0.0f, 1.0f, 1.0f, 0.01f),
-            zen::ContinuousParameter("OUTPUT_GAIN", QT_TRANSLATE_NOOP("ZenSoftClipper", "Output Level"), -18.0f,
-                                     6.0f, 0.0f, 0.1f, "dB"),
+            ContinuousParameter("THRESHOLD", QT_TRANSLATE_NOOP("ZenSoftClipper", "Threshold"), -18.0f, 18.0f, 0.0f,
+                                0.1f, "dB")
+                .Smoothed(working::DbToGainFloored),
+            ContinuousParameter("SHAPE", QT_TRANSLATE_NOOP("ZenSoftClipper", "Shape"), 0.0f, 1.0f, 1.0f, 0.01f)
+                .Smoothed(working::Identity),
+            ContinuousParameter("OUTPUT_GAIN", QT_TRANSLATE_NOOP("ZenSoftClipper", "Output Level"), -18.0f, 6.0f,
+                                0.0f, 0.1f, "dB")
+                .Smoothed(working::DbToGain),
         });
     return table;
 }
 
-bool ZenSoftClipper::OnParameterChanged(std::uint32_t index, float value) {
-    if (!ZenAudioPluginImpl::OnParameterChanged(index, value)) return false;
-    switch (index) {
-        case kThreshold: m_threshold.SetTarget(zen::DbToGainFloored(value)); break;
-        case kShape: m_shape.SetTarget(value); break;
-        case kOutputGain: m_outputGain.SetTarget(zen::DbToGain(value)); break;
-        default: break;
-    }
-    return true;
+const zen::MeterTableDefinition& ZenSoftClipper::Meters() {
+    using namespace zen;
+    static const MeterTableDefinition table = MakeMeterTable(
+        "ZenSoftClipper",
+        {
+            // Drive reaches +18 dB above full scale.
+            LevelMeter("CLIPPING", QT_TRANSLATE_NOOP("ZenSoftClipper", "Clipping"), "dBFS", -60.0f, 24.0f),
+            LevelMeter("INPUT_PEAK", QT_TRANSLATE_NOOP("ZenSoftClipper", "Input Peak"), "dBFS", -60.0f, 6.0f)
+                .PerChannel(),
+            LevelMeter("OUTPUT_PEAK", QT_TRANSLATE_NOOP("ZenSoftClipper", "Output Peak"), "dBFS", -60.0f, 6.0f)
+                .PerChannel(),
+        });
+    return table;
 }
 
 float ZenSoftClipper::Clip(float x, float k, float s) noexcept {
@@ -62,9 +67,9 @@ float ZenSoftClipper::Clip(float x, float k, float s) noexcept {
 void ZenSoftClipper::ProcessBlock(float* const* channels, std::uint32_t channelCount, std::uint32_t frames) noexcept {
     float clipLevel = 0.0f;
     for (std::uint32_t c = 0; c < channelCount; ++c) {
-        auto threshold = m_threshold.Track(c);
-        auto shape = m_shape.Track(c);
-        auto outputGain = m_outputGain.Track(c);
+        auto threshold = Smoothed(kThreshold).Track(c);
+        auto shape = Smoothed(kShape).Track(c);
+        auto outputGain = Smoothed(kOutputGain).Track(c);
         float inputPeak = 0.0f;
         float outputPeak = 0.0f;
         float* samples = channels[c];
@@ -83,45 +88,10 @@ void ZenSoftClipper::ProcessBlock(float* const* channels, std::uint32_t channelC
             samples[i] = y;
             outputPeak = std::max(outputPeak, std::fabs(y));
         }
-        m_inputPeak[c].store(inputPeak, std::memory_order_relaxed);
-        m_outputPeak[c].store(outputPeak, std::memory_order_relaxed);
+        PublishMeter(kInputPeak, c, inputPeak);
+        PublishMeter(kOutputPeak, c, outputPeak);
     }
-    m_clipLevel.store(clipLevel, std::memory_order_relaxed);
-}
-
-void ZenSoftClipper::ResetProcessing() {
-    for (std::uint32_t c = 0; c < kMaxChannels; ++c) {
-        m_inputPeak[c].store(0.0f);
-        m_outputPeak[c].store(0.0f);
-    }
-    m_clipLevel.store(0.0f);
-}
-
-std::uint32_t ZenSoftClipper::GetMeterCount() const { return 1 + 2 * GetProcessChannelCount(); }
-
-bool ZenSoftClipper::GetMeterInfo(std::uint32_t index, zen::MeterInfo& info) const {
-    if (index >= GetMeterCount()) return false;
-    info.unit = "dBFS";
-    info.minimum = -60.0f;
-    info.maximum = 6.0f;
-    if (index == kClipMeter) {
-        info.name = QCoreApplication::translate("ZenSoftClipper", "Clipping").toStdString();
-        info.maximum = 24.0f;  // drive reaches +18 dB above full scale
-        return true;
-    }
-    const std::uint32_t channel = (index - 1) / 2;
-    const QString name = (index - 1) % 2 == 0 ? QCoreApplication::translate("ZenSoftClipper", "Input Peak %1")
-                                              : QCoreApplication::translate("ZenSoftClipper", "Output Peak %1");
-    info.name = name.arg(channel + 1).toStdString();
-    return true;
-}
-
-float ZenSoftClipper::GetMeter(std::uint32_t index) const {
-    if (index >= GetMeterCount()) return 0.0f;
-    if (index == kClipMeter) return zen::GainToMeterDb(m_clipLevel.load(std::memory_order_relaxed));
-    const std::uint32_t channel = (index - 1) / 2;
-    const auto& peaks = (index - 1) % 2 == 0 ? m_inputPeak : m_outputPeak;
-    return zen::GainToMeterDb(peaks[channel].load(std::memory_order_relaxed));
+    PublishMeter(kClipping, clipLevel);
 }
 
 template class ZenAudioPlugin<ZenSoftClipper>;

@@ -4,10 +4,6 @@
 // parameter carried by a smoothed value per channel.
 #pragma once
 
-#include <array>
-#include <atomic>
-
-#include "Common/SmoothedValueGroup.h"
 #include "Common/ZenAudioPluginImpl.h"
 
 class ZenSoftClipper : public ZenAudioPluginImpl {
@@ -17,35 +13,18 @@ public:
     static const zen::PluginDescriptor kDescriptor;
 
     enum Parameter : std::uint32_t { kThreshold, kShape, kOutputGain };
-
-    // Meters: 0 the clipping level, then input and output peak per channel.
-    static constexpr std::uint32_t kClipMeter = 0;
-    static constexpr std::uint32_t InputPeakMeter(std::uint32_t channel) { return 1 + 2 * channel; }
-    static constexpr std::uint32_t OutputPeakMeter(std::uint32_t channel) { return 2 + 2 * channel; }
+    // Rows of the meter table: the block's largest driven magnitude that
+    // reached the knee, and each channel's input and output peak.
+    enum Meter : std::uint32_t { kClipping, kInputPeak, kOutputPeak };
 
     ZenSoftClipper();
 
     static const zen::ParameterTableDefinition& Definitions();
+    static const zen::MeterTableDefinition& Meters();
 
     // The curve for one driven sample with knee k and shape s; k > 0.
     static float Clip(float x, float k, float s) noexcept;
 
-    std::uint32_t GetMeterCount() const override;
-    bool GetMeterInfo(std::uint32_t index, zen::MeterInfo& info) const override;
-    float GetMeter(std::uint32_t index) const override;
-
 protected:
-    bool OnParameterChanged(std::uint32_t index, float value) override;
     void ProcessBlock(float* const* channels, std::uint32_t channelCount, std::uint32_t frames) noexcept override;
-    void ResetProcessing() override;
-
-private:
-    zen::SmoothedValueGroup m_threshold{kMaxChannels, 1.0f};   // linear knee/drive t
-    zen::SmoothedValueGroup m_shape{kMaxChannels, 1.0f};       // s
-    zen::SmoothedValueGroup m_outputGain{kMaxChannels, 1.0f};  // linear g
-
-    // Linear peaks of the last block.
-    std::array<std::atomic<float>, kMaxChannels> m_inputPeak{};
-    std::array<std::atomic<float>, kMaxChannels> m_outputPeak{};
-    std::atomic<float> m_clipLevel{0.0f};  // largest driven magnitude that reached the knee
 };
