@@ -13,12 +13,12 @@ MeterRing::MeterRing(std::uint32_t recordWidth, std::uint32_t capacity)
 
 void MeterRing::Push(const float* record) noexcept {
     const std::uint64_t index = m_written.load(std::memory_order_relaxed);
-    // Readers that copied the slot's previous record while it is rewritten
-    // see this claim after their copy and drop it.
+    // A reader that copied any value of this record (stored with release,
+    // loaded with acquire) sees this claim after its copy, and drops what
+    // the slot held before.
     m_claimed.store(index + 1, std::memory_order_relaxed);
-    std::atomic_thread_fence(std::memory_order_release);
     std::atomic<float>* slot = m_values.get() + (index % m_capacity) * m_width;
-    for (std::uint32_t k = 0; k < m_width; ++k) slot[k].store(record[k], std::memory_order_relaxed);
+    for (std::uint32_t k = 0; k < m_width; ++k) slot[k].store(record[k], std::memory_order_release);
     m_written.store(index + 1, std::memory_order_release);
 }
 
@@ -33,9 +33,8 @@ MeterRingRead MeterRing::Read(std::uint64_t& cursor, float* records, std::uint32
     for (std::uint32_t r = 0; r < count; ++r) {
         const std::atomic<float>* slot = m_values.get() + ((first + r) % m_capacity) * m_width;
         for (std::uint32_t k = 0; k < m_width; ++k)
-            records[std::size_t{r} * m_width + k] = slot[k].load(std::memory_order_relaxed);
+            records[std::size_t{r} * m_width + k] = slot[k].load(std::memory_order_acquire);
     }
-    std::atomic_thread_fence(std::memory_order_acquire);
     // Records older than the writer's claim minus the capacity may have been
     // rewritten while they were copied.
     const std::uint64_t claimed = m_claimed.load(std::memory_order_relaxed);

@@ -37,6 +37,13 @@ std::vector<float> Tone(double f, std::size_t frames, double phase) {
     return x;
 }
 
+// y[i] - x[i - delay] from `delay` on (0 before).
+std::vector<float> Difference(const std::vector<float>& y, const std::vector<float>& x, std::size_t delay) {
+    std::vector<float> d(y.size(), 0.0f);
+    for (std::size_t i = delay; i < y.size(); ++i) d[i] = y[i] - x[i - delay];
+    return d;
+}
+
 }  // namespace
 
 TEST(ZenAudioPitchShift, NoShiftIsNearlyTransparentAfterTheLatency) {
@@ -112,6 +119,11 @@ TEST(ZenAudioPitchShift, LifeCycleAndResetKeepTheHostsSettings) {
     plugin.Process(io, 256);
     // Still all dry after the reset: the host's settings are applied again.
     for (std::size_t i = kLatency; i < x.size(); ++i) ASSERT_EQ(io[0][i], x[i - kLatency]) << i;
+    // A change while running reaches the engine: the shifted signal comes in.
+    plugin.Set("Dry/Wet", 100.0f);
+    io = {x};
+    plugin.Process(io, 256);
+    EXPECT_GT(zentest::Peak(Difference(io[0], x, kLatency), x.size() - 2000), 0.05f);
 
     instance->ShutdownPlugin();
     EXPECT_FALSE(instance->HasEngine());

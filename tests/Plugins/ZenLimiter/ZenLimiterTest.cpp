@@ -377,6 +377,17 @@ TEST(ZenLimiter, SoftShapesOnlyBlocksOverTheCeilingWithItsKnee) {
     EXPECT_GT(thd(run(-6.0f, true, 2.0), 4800, 480.0), 1e-3);
     // On, but under the ceiling: untouched.
     EXPECT_LT(thd(run(-6.0f, true, 0.3), 4800, 480.0), 1e-9);
+    // Switched on while running: from the next block on.
+    {
+        Settings settings;
+        settings.ceilingDb = -6.0f;
+        PluginHarness plugin = Limiter(settings, 1, 48000.0f, 512);
+        const std::vector<float> sine = zentest::Sine(480.0, 48000.0, 48000, 2.0);
+        std::vector<float> before(sine.begin(), sine.begin() + 24000), after(sine.begin() + 24000, sine.end());
+        plugin.Run(before, 1, 512);
+        plugin.Set("Soft", 1.0f);
+        EXPECT_GT(thd(plugin.Run(after, 1, 512)[0], 4800, 480.0), 1e-3);
+    }
     // Ceiling -24 dBTP (C = 0.062): the knee stays at 0.25, so a sine over
     // the ceiling but under the knee is only scaled, one over it is shaped.
     EXPECT_LT(thd(run(-24.0f, true, 0.2), 4800, 480.0), 1e-6);
