@@ -90,23 +90,9 @@ float ZenReverb::ToRecord(std::uint32_t parameter, float value) {
     }
 }
 
-std::pair<float, float> ZenReverb::EffectiveFloor(float length, float width, float size, float ratio) {
-    const double l = std::sqrt(double(length) * std::sqrt(double(size) / ratio));
-    const double w = std::sqrt(double(width) * std::sqrt(double(size) * ratio));
-    return {std::clamp(static_cast<float>(l), kMinRoomDimension, kMaxRoomLength),
-            std::clamp(static_cast<float>(w), kMinRoomDimension, kMaxRoomLength)};
-}
-
 void ZenReverb::UpdateProcessingParameter(std::uint32_t index, float value) {
     if (!m_engine) return;
     m_engine->Set(RecordEntry(index), ToRecord(index, value));
-    if (index == kRoomLength || index == kRoomWidth || index == kRoomSize || index == kRoomRatio) {
-        const zen::ParameterTable& p = Parameters();
-        const auto [length, width] = EffectiveFloor(p[kRoomLength].GetValue(), p[kRoomWidth].GetValue(),
-                                                    p[kRoomSize].GetValue(), p[kRoomRatio].GetValue());
-        m_engine->Set(zn_reverb::kRoomLength, length);
-        m_engine->Set(zn_reverb::kRoomWidth, width);
-    }
 }
 
 void ZenReverb::PrepareProcessing(float sampleRate, std::uint32_t maxBlockSize) {
