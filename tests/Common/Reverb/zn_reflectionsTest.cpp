@@ -14,15 +14,13 @@ using namespace zen::reverb;
 
 namespace {
 
-// Lane `tap` of the response to `input` (interleaved frames of `inputs`).
+// Lane `tap` of the response to `input` (`inputs` channels one after the other).
 template <class Taps>
 std::vector<float> Lane(Taps& taps, const std::vector<float>& input, std::uint32_t inputs, std::uint32_t tap) {
     const std::size_t frames = input.size() / inputs;
     std::vector<float> lanes(frames * 16);
-    taps.Process(input.data(), lanes.data(), frames);
-    std::vector<float> lane(frames);
-    for (std::size_t f = 0; f < frames; ++f) lane[f] = lanes[f * 16 + tap];
-    return lane;
+    taps.Process(input.data(), frames, lanes.data(), frames, frames);
+    return std::vector<float>(lanes.begin() + tap * frames, lanes.begin() + (tap + 1) * frames);
 }
 
 zn_reflections_mod_param Taps(std::uint32_t inputs, std::uint32_t first, float depth) {
@@ -49,8 +47,8 @@ TEST(zn_reflections, EachTapIsItsDelayedWeightedInputs) {
     taps.Configure(p);
     EXPECT_GE(taps.Capacity(), 3001u);
     std::vector<float> input(2 * 3100, 0.0f);
-    input[0] = 1.0f;  // left impulse at 0
-    input[2 * 10 + 1] = 1.0f;  // right impulse at 10
+    input[0] = 1.0f;          // left impulse at 0
+    input[3100 + 10] = 1.0f;  // right impulse at 10
     for (std::uint32_t k : {0u, 7u, 15u}) {
         taps.Reset();
         const auto lane = Lane(taps, input, 2, k);

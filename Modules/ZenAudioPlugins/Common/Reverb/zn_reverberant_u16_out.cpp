@@ -4,9 +4,14 @@
 
 namespace zen::reverb {
 
-void zn_reverberant_u16_out::Dimension(std::uint32_t channels) {
+void zn_reverberant_u16_out::Dimension(std::uint32_t channels, std::uint32_t maxFrames) {
     m_matrix.Dimension(kLanes, std::min(channels, kLanes));
     m_tone.Reset();
+    m_maxFrames = std::max(maxFrames, 1u);
+    m_rows.Resize(kLanes * m_maxFrames);
+    m_frames.Resize(kLanes * m_maxFrames);
+    m_unused.Resize(m_maxFrames);
+    for (std::uint32_t k = 0; k < kLanes; ++k) m_rowPointers[k] = m_rows.data() + k * m_maxFrames;
 }
 
 void zn_reverberant_u16_out::Configure(const zn_reverberant_u16_out_param& param) noexcept {
@@ -22,11 +27,14 @@ void zn_reverberant_u16_out::Reset() noexcept {
     m_tone.Reset();
 }
 
-void zn_reverberant_u16_out::Process(const float* d, float* out, std::size_t frames) noexcept {
-    if (Channels() < kLanes)
-        for (std::size_t f = 0; f < frames; ++f) std::fill(out + f * kLanes + Channels(), out + (f + 1) * kLanes, 0.0f);
-    m_matrix.Process(d, kLanes, 1, out, kLanes, 1, frames);
-    m_tone.Process(out, out, frames);
+void zn_reverberant_u16_out::Process(const float* d, std::size_t stride, float* const* out,
+                                     std::size_t frames) noexcept {
+    m_matrix.Process(d, 1, stride, m_rows.data(), 1, m_maxFrames, frames);
+    m_transpose.ToFrames(m_rowPointers, m_frames.data(), frames);
+    m_tone.Process(m_frames.data(), m_frames.data(), frames);
+    float* rows[kLanes];
+    for (std::uint32_t k = 0; k < kLanes; ++k) rows[k] = k < Channels() ? out[k] : m_unused.data();
+    m_transpose.FromFrames(m_frames.data(), rows, frames);
 }
 
 }  // namespace zen::reverb
