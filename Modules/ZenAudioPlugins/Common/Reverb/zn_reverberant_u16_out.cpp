@@ -10,8 +10,6 @@ void zn_reverberant_u16_out::Dimension(std::uint32_t channels, std::uint32_t max
     m_maxFrames = std::max(maxFrames, 1u);
     m_rows.Resize(kLanes * m_maxFrames);
     m_frames.Resize(kLanes * m_maxFrames);
-    m_unused.Resize(m_maxFrames);
-    for (std::uint32_t k = 0; k < kLanes; ++k) m_rowPointers[k] = m_rows.data() + k * m_maxFrames;
 }
 
 void zn_reverberant_u16_out::Configure(const zn_reverberant_u16_out_param& param) noexcept {
@@ -30,11 +28,15 @@ void zn_reverberant_u16_out::Reset() noexcept {
 void zn_reverberant_u16_out::Process(const float* d, std::size_t stride, float* const* out,
                                      std::size_t frames) noexcept {
     m_matrix.Process(d, 1, stride, m_rows.data(), 1, m_maxFrames, frames);
-    m_transpose.ToFrames(m_rowPointers, m_frames.data(), frames);
-    m_tone.Process(m_frames.data(), m_frames.data(), frames);
-    float* rows[kLanes];
-    for (std::uint32_t k = 0; k < kLanes; ++k) rows[k] = k < Channels() ? out[k] : m_unused.data();
-    m_transpose.FromFrames(m_frames.data(), rows, frames);
+    // Only the channels' lanes move; the others hold 0 throughout.
+    float* lanes = m_frames.data();
+    for (std::uint32_t ch = 0; ch < Channels(); ++ch) {
+        const float* row = m_rows.data() + ch * m_maxFrames;
+        for (std::size_t f = 0; f < frames; ++f) lanes[f * kLanes + ch] = row[f];
+    }
+    m_tone.Process(lanes, lanes, frames);
+    for (std::uint32_t ch = 0; ch < Channels(); ++ch)
+        for (std::size_t f = 0; f < frames; ++f) out[ch][f] = lanes[f * kLanes + ch];
 }
 
 }  // namespace zen::reverb

@@ -10,7 +10,6 @@
 #include <cstddef>
 #include <cstdint>
 
-#include "Algorithms/LaneTranspose.h"
 #include "Algorithms/Lpfm16.h"
 #include "System/AlignedBuffer.h"
 #include "zn_matrixing.h"
@@ -39,11 +38,8 @@ public:
 private:
     zn_matrixing m_matrix;
     ora::numeric::Lpfm16 m_tone;
-    ora::numeric::LaneTranspose m_transpose;
-    ora::AlignedBuffer<float> m_rows;    // per lane; lanes past the channels stay 0
-    ora::AlignedBuffer<float> m_frames;  // 16-lane frames
-    ora::AlignedBuffer<float> m_unused;  // where lanes past the channels go
-    const float* m_rowPointers[kLanes] = {};
+    ora::AlignedBuffer<float> m_rows;    // per channel
+    ora::AlignedBuffer<float> m_frames;  // 16-lane frames; lanes past the channels stay 0
     std::size_t m_maxFrames = 0;
 };
 

@@ -6,25 +6,24 @@
 namespace ora::numeric::kernels {
 
 void Rotor16_m256(Rotor16State& st, float* sines, std::size_t frames) {
-    __m256 c[2], s[2], rc[2], rs[2];
-    for (int v = 0; v < 2; ++v) {
-        c[v] = _mm256_load_ps(st.c + 8 * v);
-        s[v] = _mm256_load_ps(st.s + 8 * v);
-        rc[v] = _mm256_load_ps(st.rc + 8 * v);
-        rs[v] = _mm256_load_ps(st.rs + 8 * v);
-    }
+    __m256 c0 = _mm256_load_ps(st.c), c1 = _mm256_load_ps(st.c + 8);
+    __m256 s0 = _mm256_load_ps(st.s), s1 = _mm256_load_ps(st.s + 8);
+    const __m256 rc0 = _mm256_load_ps(st.rc), rc1 = _mm256_load_ps(st.rc + 8);
+    const __m256 rs0 = _mm256_load_ps(st.rs), rs1 = _mm256_load_ps(st.rs + 8);
     for (std::size_t f = 0; f < frames; ++f, sines += 16) {
-        for (int v = 0; v < 2; ++v) {
-            const __m256 next = _mm256_sub_ps(_mm256_mul_ps(c[v], rc[v]), _mm256_mul_ps(s[v], rs[v]));
-            s[v] = _mm256_add_ps(_mm256_mul_ps(s[v], rc[v]), _mm256_mul_ps(c[v], rs[v]));
-            c[v] = next;
-            _mm256_storeu_ps(sines + 8 * v, s[v]);
-        }
+        const __m256 n0 = _mm256_sub_ps(_mm256_mul_ps(c0, rc0), _mm256_mul_ps(s0, rs0));
+        const __m256 n1 = _mm256_sub_ps(_mm256_mul_ps(c1, rc1), _mm256_mul_ps(s1, rs1));
+        s0 = _mm256_add_ps(_mm256_mul_ps(s0, rc0), _mm256_mul_ps(c0, rs0));
+        s1 = _mm256_add_ps(_mm256_mul_ps(s1, rc1), _mm256_mul_ps(c1, rs1));
+        c0 = n0;
+        c1 = n1;
+        _mm256_storeu_ps(sines, s0);
+        _mm256_storeu_ps(sines + 8, s1);
     }
-    for (int v = 0; v < 2; ++v) {
-        _mm256_store_ps(st.c + 8 * v, c[v]);
-        _mm256_store_ps(st.s + 8 * v, s[v]);
-    }
+    _mm256_store_ps(st.c, c0);
+    _mm256_store_ps(st.c + 8, c1);
+    _mm256_store_ps(st.s, s0);
+    _mm256_store_ps(st.s + 8, s1);
 }
 
 }  // namespace ora::numeric::kernels
