@@ -128,3 +128,26 @@ TEST(zn_reflections_mod, LinesLongerThanTheLimitAreReported) {
     EXPECT_EQ(recorder.Assertions()[0].message, "max_length <= zn_reflections_mod_param::DelayLines::MaxLength");
     EXPECT_EQ(taps.Delay(0), zn_reflections_mod_param::DelayLines::MaxLength);  // clamped
 }
+
+TEST(zn_reflections_mod, FadesGlidesAndSettledRunsGiveTheSameOutputInAnySplit) {
+    const auto input = zentest::Noise(6000, 0.8, 11);
+    auto run = [&](std::size_t block) {
+        zn_reflections_mod taps;
+        taps.Dimension(2, 48000.0f, 512);
+        taps.Configure(Taps(2, 100, 0.8f));
+        std::vector<float> lanes(16 * 6000);
+        std::vector<float> in(2 * block);
+        for (std::size_t done = 0, n = 0; done < 6000; done += n) {
+            if (done == 2400) taps.Configure(Taps(2, 300, 1.5f));  // a fade, then a depth glide that settles
+            n = std::min(block, (done < 2400 ? 2400 : 6000) - done);
+            std::copy_n(input.begin() + done, n, in.begin());
+            std::copy_n(input.rbegin() + done, n, in.begin() + block);
+            std::vector<float> out(16 * n);
+            taps.Process(in.data(), block, out.data(), n, n);
+            for (std::size_t k = 0; k < 16; ++k) std::copy_n(out.begin() + k * n, n, lanes.begin() + k * 6000 + done);
+        }
+        return lanes;
+    };
+    const auto whole = run(480);
+    for (std::size_t block : {1u, 7u, 333u}) EXPECT_EQ(run(block), whole) << "blocks of " << block;
+}
