@@ -3,9 +3,13 @@
 #include <memory>
 #include <vector>
 
+#include "Algorithms/BiquadPair.h"
 #include "Algorithms/Downsampler.h"
+#include "Algorithms/LaneTranspose.h"
 #include "Algorithms/Lpf16.h"
 #include "Algorithms/Lpfm16.h"
+#include "Algorithms/ModulatedTap.h"
+#include "Algorithms/Rotor16.h"
 #include "Algorithms/U15p.h"
 #include "Algorithms/Upsampler.h"
 #include "Support/Realtime.h"
@@ -131,3 +135,73 @@ static void BM_Downsampler(benchmark::State& state) {
     zenbench::ReportRealtime(state, 1024);
 }
 BENCHMARK(BM_Downsampler)->ArgsProduct({{0, 1, 2, 3, 4}, {2, 4}});
+
+// The reflections' kernels: 16 phasors, one modulated tap, and the lane transposition.
+static void BM_Rotor16(benchmark::State& state) {
+    std::unique_ptr<ora::system::ScopedDispatch> scope;
+    if (!Force(state, scope)) return;
+    Rotor16 kernel;
+    state.SetLabel(kernel.FormName());
+    Rotor16State st;
+    for (int k = 0; k < 16; ++k) {
+        st.c[k] = 1.0f;
+        st.rc[k] = 0.9999f;
+        st.rs[k] = 0.0141f;
+    }
+    auto out = Frames(512 * 16);
+    for (auto _ : state) {
+        kernel.Process(st, out.data(), 512);
+        benchmark::ClobberMemory();
+    }
+    zenbench::ReportRealtime(state, 512);
+}
+BENCHMARK(BM_Rotor16)->DenseRange(0, 4);
+
+static void BM_ModulatedTap(benchmark::State& state) {
+    std::unique_ptr<ora::system::ScopedDispatch> scope;
+    if (!Force(state, scope)) return;
+    ModulatedTap kernel;
+    state.SetLabel(kernel.FormName());
+    auto line = Frames(4096), s = Frames(512), out = Frames(512);
+    for (auto _ : state) {
+        kernel.Read(line.data() + 2048, s.data(), 900.0f, 0.5f, 0.8f, out.data(), 512, false);
+        benchmark::ClobberMemory();
+    }
+    zenbench::ReportRealtime(state, 512);
+}
+BENCHMARK(BM_ModulatedTap)->DenseRange(0, 4);
+
+static void BM_LaneTranspose(benchmark::State& state) {
+    std::unique_ptr<ora::system::ScopedDispatch> scope;
+    if (!Force(state, scope)) return;
+    LaneTranspose kernel;
+    state.SetLabel(kernel.FormName());
+    auto rows = Frames(512 * 16), frames = Frames(512 * 16);
+    float* r[16];
+    for (int k = 0; k < 16; ++k) r[k] = rows.data() + 512 * k;
+    for (auto _ : state) {
+        kernel.ToFrames(r, frames.data(), 512);
+        kernel.FromFrames(frames.data(), r, 512);
+        benchmark::ClobberMemory();
+    }
+    zenbench::ReportRealtime(state, 512);
+}
+BENCHMARK(BM_LaneTranspose)->DenseRange(0, 4);
+
+// Both bands of a stereo tone control.
+static void BM_BiquadPair(benchmark::State& state) {
+    std::unique_ptr<ora::system::ScopedDispatch> scope;
+    if (!Force(state, scope)) return;
+    BiquadPair kernel;
+    state.SetLabel(kernel.FormName());
+    BiquadPairState st;
+    const BiquadSection sections[2] = {{-0.6, 1.5, 0.5, -0.3, 0.2}, {-0.3, 0.2, 1.0, 2.0, 0.7}};
+    auto left = Frames(512), right = Frames(512);
+    float* lanes[] = {left.data(), right.data()};
+    for (auto _ : state) {
+        kernel.Process(sections, st, lanes, 2, 512);
+        benchmark::ClobberMemory();
+    }
+    zenbench::ReportRealtime(state, 512);
+}
+BENCHMARK(BM_BiquadPair)->DenseRange(0, 4);

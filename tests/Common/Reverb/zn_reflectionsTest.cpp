@@ -14,15 +14,13 @@ using namespace zen::reverb;
 
 namespace {
 
-// Lane `tap` of the response to `input` (interleaved frames of `inputs`).
+// Lane `tap` of the response to `input` (`inputs` channels one after the other).
 template <class Taps>
 std::vector<float> Lane(Taps& taps, const std::vector<float>& input, std::uint32_t inputs, std::uint32_t tap) {
     const std::size_t frames = input.size() / inputs;
     std::vector<float> lanes(frames * 16);
-    taps.Process(input.data(), lanes.data(), frames);
-    std::vector<float> lane(frames);
-    for (std::size_t f = 0; f < frames; ++f) lane[f] = lanes[f * 16 + tap];
-    return lane;
+    taps.Process(input.data(), frames, lanes.data(), frames, frames);
+    return std::vector<float>(lanes.begin() + tap * frames, lanes.begin() + (tap + 1) * frames);
 }
 
 zn_reflections_mod_param Taps(std::uint32_t inputs, std::uint32_t first, float depth) {
@@ -49,8 +47,8 @@ TEST(zn_reflections, EachTapIsItsDelayedWeightedInputs) {
     taps.Configure(p);
     EXPECT_GE(taps.Capacity(), 3001u);
     std::vector<float> input(2 * 3100, 0.0f);
-    input[0] = 1.0f;  // left impulse at 0
-    input[2 * 10 + 1] = 1.0f;  // right impulse at 10
+    input[0] = 1.0f;          // left impulse at 0
+    input[3100 + 10] = 1.0f;  // right impulse at 10
     for (std::uint32_t k : {0u, 7u, 15u}) {
         taps.Reset();
         const auto lane = Lane(taps, input, 2, k);
@@ -129,4 +127,27 @@ TEST(zn_reflections_mod, LinesLongerThanTheLimitAreReported) {
     ASSERT_EQ(recorder.Assertions().size(), 1u);
     EXPECT_EQ(recorder.Assertions()[0].message, "max_length <= zn_reflections_mod_param::DelayLines::MaxLength");
     EXPECT_EQ(taps.Delay(0), zn_reflections_mod_param::DelayLines::MaxLength);  // clamped
+}
+
+TEST(zn_reflections_mod, FadesGlidesAndSettledRunsGiveTheSameOutputInAnySplit) {
+    const auto input = zentest::Noise(6000, 0.8, 11);
+    auto run = [&](std::size_t block) {
+        zn_reflections_mod taps;
+        taps.Dimension(2, 48000.0f, 512);
+        taps.Configure(Taps(2, 100, 0.8f));
+        std::vector<float> lanes(16 * 6000);
+        std::vector<float> in(2 * block);
+        for (std::size_t done = 0, n = 0; done < 6000; done += n) {
+            if (done == 2400) taps.Configure(Taps(2, 300, 1.5f));  // a fade, then a depth glide that settles
+            n = std::min(block, (done < 2400 ? 2400 : 6000) - done);
+            std::copy_n(input.begin() + done, n, in.begin());
+            std::copy_n(input.rbegin() + done, n, in.begin() + block);
+            std::vector<float> out(16 * n);
+            taps.Process(in.data(), block, out.data(), n, n);
+            for (std::size_t k = 0; k < 16; ++k) std::copy_n(out.begin() + k * n, n, lanes.begin() + k * 6000 + done);
+        }
+        return lanes;
+    };
+    const auto whole = run(480);
+    for (std::size_t block : {1u, 7u, 333u}) EXPECT_EQ(run(block), whole) << "blocks of " << block;
 }

@@ -1,8 +1,10 @@
 // "Reverb" through the host interface: parameters and their way into the
-// engine, the room's linked shape, the mix law at every rate,
+// engine, the room against a model of its laws, the mix law at every rate,
 // layouts, click-free changes while playing, and re-preparation.
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <array>
 #include <cmath>
 
 #include "Plugins/ZenReverb/ZenReverb.h"
@@ -22,6 +24,45 @@ float LargestCurvature(const std::vector<float>& x, std::size_t from, std::size_
     for (std::size_t i = from + 2; i < to; ++i) largest = std::max(largest, std::fabs(x[i] - 2.0f * x[i - 1] + x[i - 2]));
     return largest;
 }
+
+// The room as the reverb's laws describe it, computed independently in
+// double precision: the lanes from the room's 15 longest mode periods, the
+// taps from the listed image sources seen from the centre.
+struct RoomModel {
+    RoomModel(double length, double width, double height, double rate) {
+        constexpr double kC = 340.0;
+        const double L[3] = {length, width, height};
+        std::vector<double> periods;
+        for (int i = 0; i <= 2; ++i)
+            for (int j = 0; j <= 2; ++j)
+                for (int k = 0; k <= 2; ++k)
+                    if (i + j + k > 0)
+                        periods.push_back(2.0 / (kC * std::hypot(i / L[0], j / L[1], k / L[2])));
+        std::sort(periods.rbegin(), periods.rend());
+        for (std::size_t i = 0; i < lanes.size(); ++i) lanes[i] = 2.0 * std::floor(periods[i] * 0.5 * rate) + 1.0;
+
+        // Source 4 m away at azimuth 0.2 pi, elevation 0.1 pi, kept 5 % inside the walls.
+        const double a = 0.2 * zentest::kPi, e = 0.1 * zentest::kPi;
+        double s[3] = {4.0 * std::cos(a) * std::cos(e), 4.0 * std::sin(a) * std::cos(e), 4.0 * std::sin(e)};
+        for (int axis = 0; axis < 3; ++axis) s[axis] = std::clamp(s[axis], -0.475 * L[axis], 0.475 * L[axis]);
+        const double direct = std::hypot(s[0], s[1], s[2]);
+        const int images[16][3] = {{1, 0, 0},  {0, 1, 0},  {0, -1, 0}, {0, 0, 1},  {0, 0, -1}, {1, -1, 0},
+                                   {-1, -1, 0}, {-1, 1, 0}, {0, 1, 1},  {0, 1, -1}, {0, -1, 1}, {0, -1, -1},
+                                   {1, 0, 1},  {1, 0, -1}, {-1, 0, 1}, {-1, 0, -1}};
+        for (std::size_t t = 0; t < 16; ++t) {
+            double p[3];
+            for (int axis = 0; axis < 3; ++axis) {
+                const int n = images[t][axis];  // mirrored once per wall crossed
+                p[axis] = n * L[axis] + (n % 2 == 0 ? s[axis] : -s[axis]);
+            }
+            reflections[t] = rate / kC * std::max(std::hypot(p[0], p[1], p[2]) - direct, 0.1);
+        }
+        std::sort(reflections.begin(), reflections.end());
+    }
+
+    std::array<double, 15> lanes;        // samples
+    std::array<double, 16> reflections;  // samples after the direct sound
+};
 
 }  // namespace
 
@@ -58,34 +99,52 @@ TEST(ZenReverb, ParametersReachTheEngineInItsUnits) {
     EXPECT_EQ(engine.Dirty(), 0);
 }
 
-TEST(ZenReverb, LengthWidthAreaAndRatioMakeOneRoomInAnyOrder) {
-    auto floor = [](const std::vector<std::pair<const char*, float>>& settings) {
-        PluginHarness plugin = zentest::Prepared("Reverb", {}, 1);
-        for (const auto& [name, value] : settings) plugin.Set(name, value);
-        plugin.Run(std::vector<float>(16, 0.0f));
+TEST(ZenReverb, TheRoomIsLengthWidthAndHeightAsAModelOfItBuildsIt) {
+    struct Room {
+        float length, width, height;
+    } rooms[] = {{12.430144f, 20.112396f, 4.0f}, {5.0f, 3.0f, 2.5f}, {40.0f, 10.0f, 8.0f}, {100.0f, 100.0f, 30.0f},
+                 {1.0f, 1.0f, 1.0f}};
+    for (const Room& room : rooms) {
+        // Size and ratio far from this room's floor: stored, never read.
+        PluginHarness plugin = zentest::Prepared("Reverb",
+                                                 {{"Room Length", room.length}, {"Room Width", room.width},
+                                                  {"Room Height", room.height}, {"Room Size", 9000.0f},
+                                                  {"Room Ratio", 0.02f}, {"Dry/Wet", 100.0f}},
+                                                 1);
+        const auto response = plugin.Run(zentest::Impulse(4096), 1, 512)[0];
         const zn_reverb& engine = *Impl(plugin).Engine();
-        return std::make_pair(engine.Get(zn_reverb::kRoomLength), engine.Get(zn_reverb::kRoomWidth));
+        EXPECT_EQ(engine.Get(zn_reverb::kRoomLength), room.length);
+        EXPECT_EQ(engine.Get(zn_reverb::kRoomWidth), room.width);
+        const RoomModel model(room.length, room.width, room.height, 48000.0);
+        const auto& lengths = engine.Param().tail.core.lengths;
+        for (std::size_t i = 0; i < model.lanes.size(); ++i) {
+            // The fast reciprocal square root is within 0.18 %.
+            EXPECT_NEAR(double(lengths(i)), model.lanes[i], 0.002 * model.lanes[i] + 2.0)
+                << room.length << " x " << room.width << " x " << room.height << " m, lane " << i;
+        }
+        for (std::size_t t = 0; t < model.reflections.size(); ++t)
+            EXPECT_NEAR(double(engine.Param().reflections.delays(t)), model.reflections[t], 1.0)
+                << room.length << " x " << room.width << " x " << room.height << " m, tap " << t;
+        // Heard: nothing before the first reflection, which arrives on time.
+        const auto first = static_cast<std::size_t>(std::lround(model.reflections[0]));
+        EXPECT_EQ(zentest::Peak(response, 0, first - 1), 0.0f) << room.length;
+        EXPECT_GT(zentest::Peak(response, first - 1, first + 2), 0.01f) << room.length;
+    }
+}
+
+TEST(ZenReverb, RoomSizeAndRatioChangeNothingYouHear) {
+    const auto input = zentest::Noise(6000, 0.5, 4);
+    auto render = [&](const std::vector<std::pair<std::string, float>>& settings) {
+        PluginHarness plugin = zentest::Prepared("Reverb", settings, 1);
+        return plugin.Run(input, 1, 512)[0];
     };
-    // Agreeing descriptions: exactly that room, whatever the order.
-    const auto agreed = floor({{"Room Length", 10.0f}, {"Room Width", 40.0f}, {"Room Size", 400.0f}, {"Room Ratio", 4.0f}});
-    EXPECT_NEAR(agreed.first, 10.0f, 1e-4f);
-    EXPECT_NEAR(agreed.second, 40.0f, 1e-4f);
-    EXPECT_EQ(floor({{"Room Ratio", 4.0f}, {"Room Size", 400.0f}, {"Room Width", 40.0f}, {"Room Length", 10.0f}}), agreed);
-    const auto defaults = floor({});
-    EXPECT_NEAR(defaults.first, 12.430144f, 1e-4f);
-    EXPECT_NEAR(defaults.second, 20.112396f, 1e-4f);
-    // A larger area alone: a larger room of the same shape.
-    const auto larger = floor({{"Room Size", 1000.0f}});
-    EXPECT_NEAR(larger.first * larger.second, std::sqrt(250.0f * 1000.0f), 0.5f);
-    EXPECT_NEAR(larger.second / larger.first, 1.618034f, 1e-4f);
+    const auto reference = render({{"Room Length", 9.0f}});
+    EXPECT_EQ(render({{"Room Length", 9.0f}, {"Room Size", 40.0f}, {"Room Ratio", 7.0f}}), reference);
+    EXPECT_NE(render({{"Room Length", 9.5f}}), reference);
     // A parameter never writes another.
     PluginHarness plugin("Reverb");
     plugin.Set("Room Size", 1000.0f);
     EXPECT_NEAR(plugin.Get("Room Length"), 12.430144f, 1e-5f);
-    // The extremes stay inside the room the lines were sized for.
-    const auto extreme = floor({{"Room Width", 100.0f}, {"Room Size", 10000.0f}, {"Room Ratio", 100.0f}});
-    EXPECT_LE(extreme.second, ZenReverb::kMaxRoomLength);
-    EXPECT_GE(extreme.first, ZenReverb::kMinRoomDimension);
 }
 
 TEST(ZenReverb, DryWetZeroPassesTheDrySignalUnchangedAtEveryRate) {
@@ -144,7 +203,7 @@ TEST(ZenReverb, ChangesWhilePlayingDoNotClick) {
         const char* parameter;
         float value;
     } changes[] = {
-        {"Room Width", 30.0f},   {"Room Size", 120.0f},         {"Pre-Delay", 60.0f},
+        {"Room Width", 30.0f},   {"Room Height", 6.0f},         {"Pre-Delay", 60.0f},
         {"Distance", 1.0f},      {"T@-60dB", 6.0f},             {"Brightness", 100.0f},
         {"Modulation", 10.0f},   {"Early Refl. Low Gain", 12.0f}, {"Late Rev. Low Gain", -18.0f},
         {"Late Rev. Low Freq", 80.0f}, {"Dry/Wet", 30.0f},      {"Direct Gain", -20.0f},

@@ -32,28 +32,26 @@ void zn_delaylines::Clear() noexcept {
     std::fill(m_positions.begin(), m_positions.end(), 0u);
 }
 
-void zn_delaylines::Read(float* frames, std::size_t stride, std::size_t count) const noexcept {
+void zn_delaylines::Read(float* rows, std::size_t stride, std::size_t count) const noexcept {
     for (std::uint32_t i = 0; i < Count(); ++i) {
         const float* line = m_memory.data() + static_cast<std::size_t>(i) * m_capacity;
-        const std::uint32_t length = m_lengths[i];
-        std::uint32_t p = m_positions[i];
-        for (std::size_t f = 0; f < count; ++f) {
-            frames[f * stride + i] = line[p];
-            if (++p == length) p = 0;
-        }
+        const std::uint32_t p = m_positions[i];
+        const std::size_t first = std::min<std::size_t>(count, m_lengths[i] - p);
+        float* row = rows + i * stride;
+        std::copy_n(line + p, first, row);
+        std::copy_n(line, count - first, row + first);
     }
 }
 
-void zn_delaylines::Write(const float* frames, std::size_t stride, std::size_t count) noexcept {
+void zn_delaylines::Write(const float* rows, std::size_t stride, std::size_t count) noexcept {
     for (std::uint32_t i = 0; i < Count(); ++i) {
         float* line = m_memory.data() + static_cast<std::size_t>(i) * m_capacity;
-        const std::uint32_t length = m_lengths[i];
-        std::uint32_t p = m_positions[i];
-        for (std::size_t f = 0; f < count; ++f) {
-            line[p] = frames[f * stride + i];
-            if (++p == length) p = 0;
-        }
-        m_positions[i] = p;
+        const std::uint32_t p = m_positions[i];
+        const std::size_t first = std::min<std::size_t>(count, m_lengths[i] - p);
+        const float* row = rows + i * stride;
+        std::copy_n(row, first, line + p);
+        std::copy_n(row + first, count - first, line);
+        m_positions[i] = static_cast<std::uint32_t>((p + count) % m_lengths[i]);
     }
 }
 

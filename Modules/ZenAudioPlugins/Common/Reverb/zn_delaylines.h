@@ -24,11 +24,11 @@ public:
     std::uint32_t Length(std::uint32_t line) const { return m_lengths[line]; }
     std::uint32_t Shortest() const { return m_shortest; }
 
-    // Lane i of frame f (frames `stride` floats apart) gets the sample that
-    // entered line i Length(i) samples before. frames <= Shortest().
-    void Read(float* frames, std::size_t stride, std::size_t count) const noexcept;
-    // Lane i of each frame enters line i; the lines advance by `count`.
-    void Write(const float* frames, std::size_t stride, std::size_t count) noexcept;
+    // Row i (at rows + i * stride) gets the `count` samples that entered
+    // line i Length(i) samples before. count <= Shortest().
+    void Read(float* rows, std::size_t stride, std::size_t count) const noexcept;
+    // Row i enters line i; the lines advance by `count`.
+    void Write(const float* rows, std::size_t stride, std::size_t count) noexcept;
 
 private:
     std::vector<float> m_memory;  // line i at i * m_capacity

@@ -11,6 +11,11 @@ constexpr float kOn = 1.0f;
 
 float GainDb(float gain) { return 20.0f * std::log10(std::max(gain, zn_eq::kMinimumGain)); }
 
+ora::numeric::BiquadSection Section(const BiQuad& band) {
+    const BiQuad::Coefficients& c = band.GetCoefficients();
+    return {c.c0, c.c1, c.c2, c.c3, c.g};
+}
+
 }  // namespace
 
 zn_eq::zn_eq() {
@@ -80,8 +85,13 @@ bool zn_eq::Process(float* const* channels, std::uint64_t count) {
         }
         float* part[kMaxChannels];
         for (std::uint64_t c = 0; c < channelCount; ++c) part[c] = channels[c] + done;
-        m_low.Process(part, n);
-        m_high.Process(part, n);
+        const ora::numeric::BiquadSection sections[2] = {Section(m_low), Section(m_high)};
+        m_pair.Process(sections, m_state, part, channelCount, n);
+        // A non-finite input would otherwise ring in a band for ever.
+        for (std::size_t b = 0; b < 2; ++b)
+            for (std::uint64_t c = 0; c < channelCount; ++c)
+                if (!std::isfinite(m_state.w1[b][c]) || !std::isfinite(m_state.w2[b][c]))
+                    m_state.w1[b][c] = m_state.w2[b][c] = 0.0;
         done += n;
     }
     return true;
@@ -90,6 +100,7 @@ bool zn_eq::Process(float* const* channels, std::uint64_t count) {
 void zn_eq::Reset() {
     m_low.Reset();
     m_high.Reset();
+    m_state = {};
     m_current = m_target;
     Design(m_low, m_current.low);
     Design(m_high, m_current.high);

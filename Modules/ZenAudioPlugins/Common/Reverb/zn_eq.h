@@ -2,11 +2,13 @@
 // BiQuad on every channel. A band is redesigned only when its values change;
 // a change glides (gain in dB, frequency in octaves, at a bounded rate, the
 // band redesigned every kGlideChunk samples) so that a jump in the settings
-// does not click.
+// does not click. BiQuad designs each band; both bands run on every channel
+// at once on the BiquadPair kernel.
 #pragma once
 
 #include <cstdint>
 
+#include "Algorithms/BiquadPair.h"
 #include "Common/Algorithms/BiQuad.h"
 #include "Common/ZenAudioAlgorithm.h"
 #include "zn_eq_param.h"
@@ -20,7 +22,7 @@ public:
     static constexpr double kGlideDbPerSecond = 120.0;
     static constexpr double kGlideOctavesPerSecond = 12.0;
     static constexpr std::uint64_t kGlideChunk = 16;
-    static constexpr std::uint64_t kMaxChannels = 16;
+    static constexpr std::uint64_t kMaxChannels = ora::numeric::BiquadPairState::kMaxLanes;
     static constexpr float kMinimumGain = 1e-6f;  // -120 dB
 
     zn_eq();
@@ -46,6 +48,8 @@ private:
 
     BiQuad m_low;
     BiQuad m_high;
+    ora::numeric::BiquadPair m_pair;
+    ora::numeric::BiquadPairState m_state;
     zn_eq_param m_current;
     zn_eq_param m_target;
     bool m_settled = true;  // the next Configure applies at once

@@ -55,7 +55,8 @@ void zn_matrixing::Reset() noexcept {
 
 void zn_matrixing::Process(const float* in, std::size_t inFrameStride, std::size_t inChannelStride, float* out,
                            std::size_t outFrameStride, std::size_t outChannelStride, std::size_t frames) noexcept {
-    for (std::size_t f = 0; f < frames; ++f) {
+    std::size_t f = 0;
+    for (; f < frames && (m_remaining > 0 || inFrameStride != 1 || outFrameStride != 1); ++f) {
         if (m_remaining > 0) {
             if (--m_remaining == 0) {
                 std::copy(m_target.begin(), m_target.end(), m_current.begin());
@@ -72,6 +73,10 @@ void zn_matrixing::Process(const float* in, std::size_t inFrameStride, std::size
             y[o * outChannelStride] = acc;
         }
     }
+    if (f == frames) return;
+    for (std::uint32_t o = 0; o < m_outputs; ++o)
+        m_blas.Gemv(in + f, frames - f, m_inputs, inChannelStride, m_current.data() + o * m_inputs,
+                    out + o * outChannelStride + f);
 }
 
 }  // namespace zen::reverb

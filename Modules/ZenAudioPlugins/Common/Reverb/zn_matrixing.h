@@ -1,13 +1,16 @@
 // A gain matrix between two sets of channels or lanes, y[o] = sum_i G[o][i] x[i]
 // per frame. A new matrix glides in linearly over kRampFrames frames (from
 // wherever a glide in progress had got to), so gain changes never click; the
-// first matrix after Dimension or Reset applies at once.
+// first matrix after Dimension or Reset applies at once. Planar blocks (frames
+// next to each other) with a settled matrix run on the Blas2 kernel, which
+// sums each output over the inputs in the same order.
 #pragma once
 
 #include <cstddef>
 #include <cstdint>
 #include <vector>
 
+#include "Algorithms/Blas2.h"
 #include "zn_matrixing_param.h"
 
 namespace zen::reverb {
@@ -42,6 +45,7 @@ private:
     std::uint32_t m_outputs = 0;
     std::uint32_t m_remaining = 0;
     bool m_configured = false;
+    ora::numeric::Blas2 m_blas;
 };
 
 }  // namespace zen::reverb

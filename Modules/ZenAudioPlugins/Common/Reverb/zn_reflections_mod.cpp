@@ -17,9 +17,14 @@ constexpr std::uint32_t kRenormaliseFrames = 1024;
 
 }  // namespace
 
-void zn_reflections_mod::Dimension(std::uint32_t inputs, float sampleRate) {
-    zn_reflections::Dimension(inputs, DelayLines::MaxLength + static_cast<std::uint32_t>(DelayLines::MaxDepth) +
-                                          kInterpolationFrames);
+void zn_reflections_mod::Dimension(std::uint32_t inputs, float sampleRate, std::uint32_t maxFrames) {
+    zn_reflections::Dimension(inputs,
+                              DelayLines::MaxLength + static_cast<std::uint32_t>(DelayLines::MaxDepth) +
+                                  kInterpolationFrames,
+                              maxFrames);
+    m_sineFrames.Resize(static_cast<std::size_t>(kTaps) * m_maxFrames);
+    m_sines.Resize(static_cast<std::size_t>(kTaps) * m_maxFrames);
+    for (std::uint32_t k = 0; k < kTaps; ++k) m_sineRows[k] = m_sines.data() + static_cast<std::size_t>(k) * m_maxFrames;
     m_sampleRate = sampleRate;
     m_configured = false;
     m_hasWaiting = false;
@@ -44,8 +49,8 @@ void zn_reflections_mod::Configure(const zn_reflections_mod_param& param) noexce
         const double slowest = 1000.0 / static_cast<double>(m_periodMs);
         for (std::uint32_t k = 0; k < kTaps; ++k) {
             const double w = kTwoPi * slowest * (1.0 + kRateSpread * k) / m_sampleRate;
-            m_rotCos[k] = static_cast<float>(std::cos(w));
-            m_rotSin[k] = static_cast<float>(std::sin(w));
+            m_rotor.rc[k] = static_cast<float>(std::cos(w));
+            m_rotor.rs[k] = static_cast<float>(std::sin(w));
         }
     }
 
@@ -80,8 +85,8 @@ void zn_reflections_mod::Reset() noexcept {
     zn_reflections::Reset();
     for (std::uint32_t k = 0; k < kTaps; ++k) {
         const double phase = kGoldenAngle * k;
-        m_cos[k] = static_cast<float>(std::cos(phase));
-        m_sin[k] = static_cast<float>(std::sin(phase));
+        m_rotor.c[k] = static_cast<float>(std::cos(phase));
+        m_rotor.s[k] = static_cast<float>(std::sin(phase));
     }
     m_sinceRenormalised = 0;
     if (m_hasWaiting) StartFade();
@@ -89,50 +94,103 @@ void zn_reflections_mod::Reset() noexcept {
     std::copy(m_next, m_next + kTaps, m_previous);
 }
 
-float zn_reflections_mod::Tap(std::uint32_t k, float delay) const noexcept {
+float zn_reflections_mod::Tap(std::uint32_t k, float delay, std::uint32_t position) const noexcept {
     const auto whole = static_cast<std::uint32_t>(delay);
     const float fraction = delay - static_cast<float>(whole);
-    const float* a = FrameAt(whole);
-    const float* b = FrameAt(whole + 1);
     const float* w = m_weights.data() + k * m_inputs;
     float acc = 0.0f;
-    for (std::uint32_t ch = 0; ch < m_inputs; ++ch) acc += w[ch] * (a[ch] + fraction * (b[ch] - a[ch]));
+    for (std::uint32_t ch = 0; ch < m_inputs; ++ch) {
+        const float a = Sample(ch, position, whole), b = Sample(ch, position, whole + 1);
+        acc += w[ch] * (a + fraction * (b - a));
+    }
     return acc;
 }
 
-void zn_reflections_mod::Process(const float* in, float* lanes, std::size_t frames) noexcept {
-    for (std::size_t f = 0; f < frames; ++f, in += m_inputs, lanes += kTaps) {
-        Push(in);
+bool zn_reflections_mod::Settled() const noexcept {
+    if (m_fade < 1.0f) return false;
+    for (std::uint32_t k = 0; k < kTaps; ++k)
+        if (m_depth[k] != m_depthTarget[k]) return false;
+    return true;
+}
+
+void zn_reflections_mod::Process(const float* in, std::size_t inStride, float* lanes, std::size_t laneStride,
+                                 std::size_t frames) noexcept {
+    for (std::size_t done = 0; done < frames;) {
+        const std::size_t n = std::min<std::size_t>(frames - done, m_maxFrames);
+        std::uint32_t position = m_write;  // the newest frame before the block
+        Push(in + done, inStride, n);
+        for (std::size_t f = 0; f < n;) {
+            position = Next(position);
+            float* out = lanes + done + f;
+            if (Settled()) {
+                const std::size_t run = std::min({n - f, static_cast<std::size_t>(kRenormaliseFrames - m_sinceRenormalised),
+                                                  static_cast<std::size_t>(m_capacity - position)});
+                ProcessSettled(position, out, laneStride, run);
+                AfterFrames(run);
+                position += static_cast<std::uint32_t>(run - 1);
+                f += run;
+            } else {
+                ProcessFrame(position, out, laneStride);
+                AfterFrames(1);
+                ++f;
+            }
+        }
+        done += n;
+    }
+}
+
+void zn_reflections_mod::ProcessFrame(std::uint32_t position, float* lanes, std::size_t laneStride) noexcept {
+    if (m_fade < 1.0f) {
+        m_fade += m_fadeStep;
+        if (m_fade >= 1.0f) {
+            m_fade = 1.0f;
+            if (m_hasWaiting) StartFade();
+        }
+    }
+    for (std::uint32_t k = 0; k < kTaps; ++k) {
+        const float c = m_rotor.c[k] * m_rotor.rc[k] - m_rotor.s[k] * m_rotor.rs[k];
+        m_rotor.s[k] = m_rotor.s[k] * m_rotor.rc[k] + m_rotor.c[k] * m_rotor.rs[k];
+        m_rotor.c[k] = c;
+        m_depth[k] += std::clamp(m_depthTarget[k] - m_depth[k], -kDepthGlide, kDepthGlide);
+        const float swing = m_depth[k] * m_rotor.s[k];
+        float lane = Tap(k, std::max(1.0f, static_cast<float>(m_next[k]) + swing), position);
         if (m_fade < 1.0f) {
-            m_fade += m_fadeStep;
-            if (m_fade >= 1.0f) {
-                m_fade = 1.0f;
-                if (m_hasWaiting) StartFade();
-            }
+            const float old = Tap(k, std::max(1.0f, static_cast<float>(m_previous[k]) + swing), position);
+            lane = old + m_fade * (lane - old);
         }
-        for (std::uint32_t k = 0; k < kTaps; ++k) {
-            const float c = m_cos[k] * m_rotCos[k] - m_sin[k] * m_rotSin[k];
-            m_sin[k] = m_sin[k] * m_rotCos[k] + m_cos[k] * m_rotSin[k];
-            m_cos[k] = c;
-            m_depth[k] += std::clamp(m_depthTarget[k] - m_depth[k], -kDepthGlide, kDepthGlide);
-            const float swing = m_depth[k] * m_sin[k];
-            float lane = Tap(k, std::max(1.0f, static_cast<float>(m_next[k]) + swing));
-            if (m_fade < 1.0f) {
-                const float old = Tap(k, std::max(1.0f, static_cast<float>(m_previous[k]) + swing));
-                lane = old + m_fade * (lane - old);
-            }
-            lanes[k] = lane;
+        lanes[k * laneStride] = lane;
+    }
+}
+
+void zn_reflections_mod::ProcessSettled(std::uint32_t position, float* lanes, std::size_t laneStride,
+                                        std::size_t count) noexcept {
+    m_rotorKernel.Process(m_rotor, m_sineFrames.data(), count);
+    m_transpose.FromFrames(m_sineFrames.data(), m_sineRows, count);
+    for (std::uint32_t k = 0; k < kTaps; ++k) {
+        float* out = lanes + k * laneStride;
+        const float* w = m_weights.data() + k * m_inputs;
+        bool any = false;
+        // A zero weight adds nothing: only the inputs a tap hears are read.
+        for (std::uint32_t ch = 0; ch < m_inputs; ++ch) {
+            if (w[ch] == 0.0f) continue;
+            m_tap.Read(Line(ch) + position, m_sineRows[k], static_cast<float>(m_next[k]), m_depth[k], w[ch], out, count,
+                       any);
+            any = true;
         }
-        // Keep the phasors on the unit circle, on a schedule of its own so
-        // that any split into blocks gives the same output.
-        if (++m_sinceRenormalised == kRenormaliseFrames) {
-            m_sinceRenormalised = 0;
-            for (std::uint32_t k = 0; k < kTaps; ++k) {
-                const float norm = 1.5f - 0.5f * (m_cos[k] * m_cos[k] + m_sin[k] * m_sin[k]);
-                m_cos[k] *= norm;
-                m_sin[k] *= norm;
-            }
-        }
+        if (!any) std::fill(out, out + count, 0.0f);
+    }
+}
+
+// Keep the phasors on the unit circle, on a schedule of its own so that any
+// split into blocks gives the same output.
+void zn_reflections_mod::AfterFrames(std::size_t count) noexcept {
+    m_sinceRenormalised += static_cast<std::uint32_t>(count);
+    if (m_sinceRenormalised < kRenormaliseFrames) return;
+    m_sinceRenormalised = 0;
+    for (std::uint32_t k = 0; k < kTaps; ++k) {
+        const float norm = 1.5f - 0.5f * (m_rotor.c[k] * m_rotor.c[k] + m_rotor.s[k] * m_rotor.s[k]);
+        m_rotor.c[k] *= norm;
+        m_rotor.s[k] *= norm;
     }
 }
 

@@ -7,11 +7,19 @@
 // vibrato. Depth changes glide; a new set of tap
 // delays replaces the old one by a linear cross-fade (a set arriving during a
 // fade waits for it to end; only the newest waiting set is kept).
+//
+// Settled (no fade, depths at their targets), a block runs tap by tap on
+// the kernels: the phasors for the whole run, then each tap's interpolated
+// reads along time. Frames of a fade or a depth glide run one by one.
 #pragma once
 
 #include <cstddef>
 #include <cstdint>
 
+#include "Algorithms/LaneTranspose.h"
+#include "Algorithms/ModulatedTap.h"
+#include "Algorithms/Rotor16.h"
+#include "System/AlignedBuffer.h"
 #include "zn_reflections.h"
 #include "zn_reflections_mod_param.h"
 
@@ -23,22 +31,30 @@ public:
     // Depth glide, samples per sample.
     static constexpr float kDepthGlide = 1.0f / 4096.0f;
 
-    // Memory for the longest tap and the deepest modulation; the
-    // modulation's rates follow `sampleRate`. Allocates.
-    void Dimension(std::uint32_t inputs, float sampleRate);
+    // Memory for the longest tap and the deepest modulation, in blocks of
+    // up to `maxFrames`; the modulation's rates follow `sampleRate`. Allocates.
+    void Dimension(std::uint32_t inputs, float sampleRate, std::uint32_t maxFrames = 1024);
     // Delays outside [1, MaxLength] and depths outside [0, MaxDepth] are
     // clamped; a longer length is a programming error (assertion).
     void Configure(const zn_reflections_mod_param& param) noexcept;
     void Reset() noexcept;
-    void Process(const float* in, float* lanes, std::size_t frames) noexcept;
+    // As zn_reflections::Process.
+    void Process(const float* in, std::size_t inStride, float* lanes, std::size_t laneStride,
+                 std::size_t frames) noexcept;
 
     std::uint32_t Delay(std::uint32_t tap) const { return m_next[tap]; }
     float Depth(std::uint32_t tap) const { return m_depth[tap]; }
     bool Fading() const { return m_fade < 1.0f; }
 
 private:
-    float Tap(std::uint32_t k, float delay) const noexcept;
+    float Tap(std::uint32_t k, float delay, std::uint32_t position) const noexcept;
     void StartFade() noexcept;
+    bool Settled() const noexcept;
+    // One frame at `position`, any state.
+    void ProcessFrame(std::uint32_t position, float* lanes, std::size_t laneStride) noexcept;
+    // `count` settled frames from `position`, which must not wrap.
+    void ProcessSettled(std::uint32_t position, float* lanes, std::size_t laneStride, std::size_t count) noexcept;
+    void AfterFrames(std::size_t count) noexcept;
 
     float m_sampleRate = 48000.0f;
     float m_periodMs = 1000.0f;
@@ -51,10 +67,16 @@ private:
     float m_depth[kTaps] = {};
     float m_depthTarget[kTaps] = {};
     // Each tap's sine as a rotating phasor.
-    float m_cos[kTaps] = {}, m_sin[kTaps] = {};
-    float m_rotCos[kTaps] = {}, m_rotSin[kTaps] = {};
+    ora::numeric::Rotor16State m_rotor;
     std::uint32_t m_sinceRenormalised = 0;
     bool m_configured = false;
+
+    ora::numeric::Rotor16 m_rotorKernel;
+    ora::numeric::LaneTranspose m_transpose;
+    ora::numeric::ModulatedTap m_tap;
+    ora::AlignedBuffer<float> m_sineFrames;  // 16-lane frames
+    ora::AlignedBuffer<float> m_sines;       // per tap, along time
+    float* m_sineRows[kTaps] = {};
 };
 
 }  // namespace zen::reverb

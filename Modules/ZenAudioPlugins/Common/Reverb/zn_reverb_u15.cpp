@@ -38,7 +38,7 @@ void zn_reverb_u15::Dimension(std::uint32_t inputs, std::uint32_t outputs, float
     ZenAudioAlgorithm::Prepare(hostRate, m_hostFrames);
 
     m_direct.Dimension(m_inputs, m_outputs);
-    m_reflections.Dimension(m_inputs, m_engineRate);
+    m_reflections.Dimension(m_inputs, m_engineRate, m_engineFrames);
     m_early.Dimension(kTaps, m_outputs);
     m_tail.Dimension(m_outputs, maxLaneLength, m_engineFrames, m_engineRate);
     m_pendingTail = zn_reverberant_u15_param(m_outputs);
@@ -52,10 +52,11 @@ void zn_reverb_u15::Dimension(std::uint32_t inputs, std::uint32_t outputs, float
     const std::size_t host = m_hostFrames, engine = m_engineFrames;
     m_in.Resize(m_inputs * host);
     m_directOut.Resize(m_outputs * host);
-    m_inFrames.Resize(m_inputs * engine);
     m_taps.Resize(kTaps * engine);
+    m_silence.Resize(engine);
     m_u.Resize(kLanes * engine);
-    m_lateFrames.Resize(kLanes * engine);
+    for (std::uint32_t k = 0; k < kLanes; ++k)
+        m_tapRows[k] = k < zn_reverberant_u15::kLines ? m_taps.data() + k * engine : m_silence.data();
     m_wet.Resize(2 * m_outputs * engine);
     m_fade.Resize(engine);
     m_earlyPointers.resize(m_outputs);
@@ -147,34 +148,24 @@ void zn_reverb_u15::CopyIn(float* const* channels, std::size_t count) noexcept {
     m_direct.Process(m_in.data(), 1, m_hostFrames, m_directOut.data(), 1, m_hostFrames, count);
 }
 
-void zn_reverb_u15::Interleave(const float* planar, std::size_t stride, std::size_t count) noexcept {
-    for (std::size_t f = 0; f < count; ++f)
-        for (std::uint32_t ch = 0; ch < m_inputs; ++ch) m_inFrames[f * m_inputs + ch] = planar[ch * stride + f];
-}
-
-void zn_reverb_u15::ProcessWet(const float* inFrames, std::size_t count) noexcept {
+void zn_reverb_u15::ProcessWet(const float* in, std::size_t inStride, std::size_t count) noexcept {
     m_running = true;
     const std::size_t stride = m_engineFrames;
-    m_reflections.Process(inFrames, m_taps.data(), count);
-    m_early.Process(m_taps.data(), kTaps, 1, m_wet.data(), 1, stride, count);
+    m_reflections.Process(in, inStride, m_taps.data(), stride, count);
+    m_early.Process(m_taps.data(), 1, stride, m_wet.data(), 1, stride, count);
     m_earlyEq.Process(m_earlyPointers.data(), count);
 
-    for (std::size_t f = 0; f < count; ++f) {
-        const float* taps = m_taps.data() + f * kTaps;
-        float* u = m_u.data() + f * kLanes;
-        for (std::uint32_t i = 0; i < zn_reverberant_u15::kLines; ++i) u[i] = kLateInputGain * taps[i];
-    }
+    m_transpose.ToFrames(m_tapRows, m_u.data(), count);
+    m_vec.Scale(m_u.data(), kLateInputGain, m_u.data(), kLanes * count);
     if (m_control.ActionDue()) ApplyPendingLengths();
-    m_tail.Process(m_u.data(), m_lateFrames.data(), count);
+    m_tail.Process(m_u.data(), m_latePointers.data(), count);
     // Last resort: state that has gone non-finite anyway starts afresh.
     float check = 0.0f;
-    for (std::size_t f = 0; f < count; ++f) check += m_lateFrames[f * kLanes];
+    for (std::size_t f = 0; f < count; ++f) check += m_latePointers[0][f];
     if (!std::isfinite(check)) {
         m_tail.Reset();
-        m_lateFrames.Clear();
+        for (float* late : m_latePointers) std::fill(late, late + count, 0.0f);
     }
-    for (std::uint32_t ch = 0; ch < m_outputs; ++ch)
-        for (std::size_t f = 0; f < count; ++f) m_latePointers[ch][f] = m_lateFrames[f * kLanes + ch];
     m_lateEq.Process(m_latePointers.data(), count);
 
     const bool fading = m_control.Gains(m_fade.data(), count);
@@ -184,7 +175,7 @@ void zn_reverb_u15::ProcessWet(const float* inFrames, std::size_t count) noexcep
         if (fading) {
             for (std::size_t f = 0; f < count; ++f) early[f] += m_fade[f] * late[f];
         } else {
-            for (std::size_t f = 0; f < count; ++f) early[f] += late[f];
+            m_vec.Add(early, late, early, count);
         }
     }
 }
@@ -196,13 +187,9 @@ bool zn_reverb_u15::Process(float* const* channels, std::uint64_t count) {
         float* chunk[kMaxChannels];
         for (std::uint32_t ch = 0; ch < std::max(m_inputs, m_outputs); ++ch) chunk[ch] = channels[ch] + done;
         CopyIn(chunk, n);
-        Interleave(m_in.data(), m_hostFrames, n);
-        ProcessWet(m_inFrames.data(), n);
-        for (std::uint32_t ch = 0; ch < m_outputs; ++ch) {
-            const float* direct = m_directOut.data() + ch * m_hostFrames;
-            const float* wet = m_earlyPointers[ch];
-            for (std::size_t f = 0; f < n; ++f) chunk[ch][f] = direct[f] + wet[f];
-        }
+        ProcessWet(m_in.data(), m_hostFrames, n);
+        for (std::uint32_t ch = 0; ch < m_outputs; ++ch)
+            m_vec.Add(m_directOut.data() + ch * m_hostFrames, m_earlyPointers[ch], chunk[ch], n);
         done += n;
     }
     return true;
@@ -217,8 +204,7 @@ void zn_reverb_u15::ResampledWet(const float* in, std::size_t inStride, float* o
         const std::size_t engine = in_frame_size / factor;
         for (std::uint32_t ch = 0; ch < m_inputs; ++ch)
             m_down[ch]->Process(in + ch * inStride + offset, m_engineIn.data() + ch * m_engineFrames, in_frame_size);
-        Interleave(m_engineIn.data(), m_engineFrames, engine);
-        ProcessWet(m_inFrames.data(), engine);
+        ProcessWet(m_engineIn.data(), m_engineFrames, engine);
         for (std::uint32_t ch = 0; ch < m_outputs; ++ch)
             m_up[ch]->Process(m_earlyPointers[ch], out + ch * outStride + offset, engine);
     }
@@ -232,9 +218,7 @@ bool zn_reverb_u15::ProcessResampled(float* const* channels, std::size_t count) 
         CopyIn(chunk, n);
         ResampledWet(m_in.data(), m_hostFrames, m_wetHost.data(), m_hostFrames, n);
         for (std::uint32_t ch = 0; ch < m_outputs; ++ch) {
-            const float* direct = m_directOut.data() + ch * m_hostFrames;
-            const float* wet = m_wetHost.data() + ch * m_hostFrames;
-            for (std::size_t f = 0; f < n; ++f) chunk[ch][f] = direct[f] + wet[f];
+            m_vec.Add(m_directOut.data() + ch * m_hostFrames, m_wetHost.data() + ch * m_hostFrames, chunk[ch], n);
         }
         done += n;
     }

@@ -17,7 +17,9 @@
 #include <vector>
 
 #include "Algorithms/Downsampler.h"
+#include "Algorithms/LaneTranspose.h"
 #include "Algorithms/Upsampler.h"
+#include "Algorithms/Vec.h"
 #include "Common/ZenAudioAlgorithm.h"
 #include "System/AlignedBuffer.h"
 #include "zn_eq.h"
@@ -87,8 +89,8 @@ public:
 
 protected:
     // The early and late paths over `count` (at most m_engineFrames)
-    // interleaved engine-rate input frames, into planar m_wet.
-    void ProcessWet(const float* inFrames, std::size_t count) noexcept;
+    // engine-rate input frames (channel ch at in + ch * stride), into planar m_wet.
+    void ProcessWet(const float* in, std::size_t stride, std::size_t count) noexcept;
     // Host-rate blocks whose length is a multiple of Factor().
     bool ProcessResampled(float* const* channels, std::size_t count) noexcept;
 
@@ -97,7 +99,6 @@ private:
     void ResampledWet(const float* in, std::size_t inStride, float* out, std::size_t outStride,
                       std::size_t count) noexcept;
     void CopyIn(float* const* channels, std::size_t count) noexcept;
-    void Interleave(const float* planar, std::size_t stride, std::size_t count) noexcept;
     void ApplyPendingLengths() noexcept;
 
     std::uint32_t m_inputs = 0;
@@ -124,10 +125,9 @@ private:
     ora::AlignedBuffer<float> m_directOut;   // planar outputs, host rate
     ora::AlignedBuffer<float> m_wetHost;     // planar outputs, host rate (resampled objects)
     ora::AlignedBuffer<float> m_engineIn;    // planar inputs, engine rate
-    ora::AlignedBuffer<float> m_inFrames;    // interleaved inputs, engine rate
-    ora::AlignedBuffer<float> m_taps;        // 16-lane tap frames
+    ora::AlignedBuffer<float> m_taps;        // planar, per tap
+    ora::AlignedBuffer<float> m_silence;     // the tail's lane 15 input
     ora::AlignedBuffer<float> m_u;           // 16-lane tail input
-    ora::AlignedBuffer<float> m_lateFrames;  // 16-lane tail output
     ora::AlignedBuffer<float> m_wet;         // planar: early, then late, per output; then their sum
     ora::AlignedBuffer<float> m_fade;
     // Any-length blocks of the resampled objects.
@@ -136,6 +136,9 @@ private:
     std::size_t m_stageStride = 0, m_queueStride = 0;
     std::size_t m_held = 0, m_queued = 0;
     std::vector<float*> m_earlyPointers, m_latePointers;
+    const float* m_tapRows[kLanes] = {};  // the tail's input lanes: taps 0..14, then silence
+    ora::numeric::LaneTranspose m_transpose;
+    ora::numeric::Vec m_vec;
 };
 
 }  // namespace zen::reverb

@@ -9,10 +9,17 @@ void zn_reverberant_u15::Dimension(std::uint32_t channels, std::uint32_t maxLeng
                                    float sampleRate) {
     m_glideFrames = std::max(1.0, kGlideSeconds * sampleRate);
     m_lines.Dimension(kLines, maxLength);
-    m_out.Dimension(channels);
     m_maxFrames = std::max(maxFrames, 1u);
-    m_d.Resize(static_cast<std::size_t>(m_maxFrames) * kLanes);
-    m_m.Resize(static_cast<std::size_t>(m_maxFrames) * kLanes);
+    m_out.Dimension(channels, m_maxFrames);
+    const std::size_t size = static_cast<std::size_t>(m_maxFrames) * kLanes;
+    m_dRows.Resize(size);
+    m_wRows.Resize(size);
+    m_d.Resize(size);
+    m_m.Resize(size);
+    for (std::uint32_t k = 0; k < kLanes; ++k) {
+        m_dRowPointers[k] = m_dRows.data() + k * m_maxFrames;
+        m_wRowPointers[k] = m_wRows.data() + k * m_maxFrames;
+    }
     Reset();
 }
 
@@ -72,26 +79,30 @@ void zn_reverberant_u15::Reset() noexcept {
     m_lines.Clear();
     m_damping.Reset();
     m_out.Reset();
+    m_dRows.Clear();
     m_d.Clear();
     m_m.Clear();
 }
 
-void zn_reverberant_u15::Process(const float* u, float* out, std::size_t frames) noexcept {
+void zn_reverberant_u15::Process(const float* u, float* const* out, std::size_t frames) noexcept {
     const std::size_t chunkLimit = std::min<std::size_t>(m_lines.Shortest(), m_maxFrames);
-    while (frames > 0) {
-        std::size_t n = std::min(frames, chunkLimit);
+    float* outs[kLanes];
+    const std::uint32_t channels = m_out.Channels();
+    for (std::size_t done = 0; done < frames;) {
+        std::size_t n = std::min(frames - done, chunkLimit);
         if (m_gliding) {
             n = std::min<std::size_t>(n, kGlideChunk);
             Glide(n);
         }
-        m_lines.Read(m_d.data(), kLanes, n);
-        m_out.Process(m_d.data(), out, n);
-        m_mix.Process(m_d.data(), u, m_m.data(), n);
+        for (std::uint32_t ch = 0; ch < channels; ++ch) outs[ch] = out[ch] + done;
+        m_lines.Read(m_dRows.data(), m_maxFrames, n);
+        m_out.Process(m_dRows.data(), m_maxFrames, outs, n);
+        m_transpose.ToFrames(m_dRowPointers, m_d.data(), n);
+        m_mix.Process(m_d.data(), u + done * kLanes, m_m.data(), n);
         m_damping.Process(m_m.data(), m_m.data(), n);
-        m_lines.Write(m_m.data(), kLanes, n);
-        u += n * kLanes;
-        out += n * kLanes;
-        frames -= n;
+        m_transpose.FromFrames(m_m.data(), m_wRowPointers, n);
+        m_lines.Write(m_wRows.data(), m_maxFrames, n);
+        done += n;
     }
 }
 

@@ -3,11 +3,15 @@
 // through the output stage. Runs in chunks no longer than the shortest line,
 // so that every read of a chunk precedes the writes that replace it:
 //   d = lines' outputs;  out = stage(d);  m = U (d + u);  w = damp(m);  lines <- w.
+// Lines and the output stage work along time (one row per lane), the mixing
+// and damping kernels across lanes (16-lane frames); the chunk is transposed
+// between the two.
 #pragma once
 
 #include <cstddef>
 #include <cstdint>
 
+#include "Algorithms/LaneTranspose.h"
 #include "Algorithms/Lpf16.h"
 #include "Algorithms/U15p.h"
 #include "System/AlignedBuffer.h"
@@ -38,9 +42,8 @@ public:
     bool LengthsDiffer(const zn_reverberant_u15_core_param& core) const;
     void Reset() noexcept;
 
-    // `frames` 16-lane input frames u (at most maxFrames) to 16-lane output
-    // frames, channel ch in lane ch.
-    void Process(const float* u, float* out, std::size_t frames) noexcept;
+    // `frames` 16-lane input frames u to one output buffer per channel.
+    void Process(const float* u, float* const* out, std::size_t frames) noexcept;
 
     const zn_delaylines& Lines() const { return m_lines; }
     const ora::numeric::Lpf16& Damping() const { return m_damping; }
@@ -50,8 +53,13 @@ private:
     ora::numeric::U15p m_mix;
     ora::numeric::Lpf16 m_damping;
     zn_reverberant_u16_out m_out;
-    ora::AlignedBuffer<float> m_d;  // delay outputs, lane 15 = 0
-    ora::AlignedBuffer<float> m_m;  // mixed, then damped
+    ora::numeric::LaneTranspose m_transpose;
+    ora::AlignedBuffer<float> m_dRows;  // delay outputs per lane, lane 15 = 0
+    ora::AlignedBuffer<float> m_wRows;  // damped, per lane (lane 15 unused)
+    ora::AlignedBuffer<float> m_d;      // delay outputs as frames
+    ora::AlignedBuffer<float> m_m;      // mixed, then damped
+    const float* m_dRowPointers[kLanes] = {};
+    float* m_wRowPointers[kLanes] = {};
     void Glide(std::size_t frames) noexcept;
 
     std::uint32_t m_maxFrames = 0;

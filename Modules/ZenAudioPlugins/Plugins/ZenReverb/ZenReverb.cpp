@@ -24,10 +24,7 @@ constexpr double kLaneLengthMargin = 1.01;
 
 }  // namespace
 
-ZenReverb::ZenReverb() {
-    InitParameters(Definitions());
-    for (std::size_t i = 0; i < m_floor.size(); ++i) m_floor[i] = Definitions()[kRoomLength + i].defaultValue;
-}
+ZenReverb::ZenReverb() { InitParameters(Definitions()); }
 
 ZenReverb::~ZenReverb() = default;
 
@@ -93,22 +90,9 @@ float ZenReverb::ToRecord(std::uint32_t parameter, float value) {
     }
 }
 
-std::pair<float, float> ZenReverb::EffectiveFloor(float length, float width, float size, float ratio) {
-    const double l = std::sqrt(double(length) * std::sqrt(double(size) / ratio));
-    const double w = std::sqrt(double(width) * std::sqrt(double(size) * ratio));
-    return {std::clamp(static_cast<float>(l), kMinRoomDimension, kMaxRoomLength),
-            std::clamp(static_cast<float>(w), kMinRoomDimension, kMaxRoomLength)};
-}
-
 void ZenReverb::UpdateProcessingParameter(std::uint32_t index, float value) {
     if (!m_engine) return;
     m_engine->Set(RecordEntry(index), ToRecord(index, value));
-    if (index == kRoomLength || index == kRoomWidth || index == kRoomSize || index == kRoomRatio) {
-        m_floor[index - kRoomLength] = value;
-        const auto [length, width] = EffectiveFloor(m_floor[0], m_floor[1], m_floor[2], m_floor[3]);
-        m_engine->Set(zn_reverb::kRoomLength, length);
-        m_engine->Set(zn_reverb::kRoomWidth, width);
-    }
 }
 
 void ZenReverb::PrepareProcessing(float sampleRate, std::uint32_t maxBlockSize) {

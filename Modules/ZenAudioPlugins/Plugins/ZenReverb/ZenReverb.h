@@ -8,17 +8,12 @@
 // Parameters reach the engine's record on the audio thread; the engine's
 // update steps then recompute only what the change touches, before the block.
 //
-// "Room Size" and "Room Ratio" describe the floor as "Room Length" and "Room
-// Width" do. No parameter ever writes another (hosts own every value, and
-// the same values must give the same room in any order), so the room takes
-// the geometric mean of the two descriptions: exactly the room when they
-// agree (as an editor that links them keeps them), and a room that grows
-// with any of them when a host moves one alone.
+// "Room Length", "Room Width" and "Room Height" are the room. "Room Size"
+// and "Room Ratio" are stored for the host and for an editor that edits the
+// floor linked (setting length and width); the engine never reads them.
 #pragma once
 
-#include <array>
 #include <memory>
-#include <utility>
 
 #include "Common/Reverb/zn_reverb.h"
 #include "Common/Reverb/zn_reverb_u15.h"
@@ -52,9 +47,6 @@ public:
     static std::uint32_t RecordEntry(std::uint32_t parameter);
     static float ToRecord(std::uint32_t parameter, float value);
 
-    // The room's floor from the four values: {length, width}, each within the host's limits.
-    static std::pair<float, float> EffectiveFloor(float length, float width, float size, float ratio);
-
     // The decay to -100 dBFS, with headroom for full-scale input and the late boosts.
     std::uint32_t GetTailLength() const override;
     // Fully dry: the input passes unchanged.
@@ -73,7 +65,4 @@ protected:
 private:
     std::unique_ptr<zen::reverb::zn_reverb> m_engine;
     std::unique_ptr<zen::reverb::zn_reverb_u15> m_processor;
-    // "Room Length", "Room Width", "Room Size", "Room Ratio" as last handed
-    // over (audio thread).
-    std::array<float, 4> m_floor;
 };

@@ -8,6 +8,7 @@
 #include <functional>
 #include <memory>
 
+#include "Algorithms/BiquadPair.h"
 #include "Algorithms/Blas1.h"
 #include "Algorithms/Deinterleave.h"
 #include "Algorithms/Downsampler.h"
@@ -15,10 +16,13 @@
 #include "Algorithms/FIRS.h"
 #include "Algorithms/Interleave.h"
 #include "Algorithms/LR2MS.h"
+#include "Algorithms/LaneTranspose.h"
 #include "Algorithms/Lpf16.h"
 #include "Algorithms/Lpfm16.h"
 #include "Algorithms/MS2LR.h"
 #include "Algorithms/Mix.h"
+#include "Algorithms/ModulatedTap.h"
+#include "Algorithms/Rotor16.h"
 #include "Algorithms/U15p.h"
 #include "Algorithms/Upsampler.h"
 #include "Algorithms/UpsamplerTruePeak_x4.h"
@@ -71,6 +75,37 @@ Bound FusedFir(const std::vector<float>& h) {
         return static_cast<double>(h.size()) * std::ldexp(scale, -22);
     };
 }
+
+// Stateful kernels whose owner keeps the state, carried across the chunks.
+struct Rotor {
+    Rotor16 kernel;
+    Rotor16State state;
+    Rotor() {
+        for (std::size_t k = 0; k < 16; ++k) {
+            state.c[k] = std::cos(0.4f * static_cast<float>(k));
+            state.s[k] = std::sin(0.4f * static_cast<float>(k));
+            state.rc[k] = std::cos(0.01f + 0.02f * static_cast<float>(k));
+            state.rs[k] = std::sin(0.01f + 0.02f * static_cast<float>(k));
+        }
+    }
+    const char* FormName() const { return kernel.FormName(); }
+};
+
+struct Biquads {
+    BiquadPair kernel;
+    BiquadPairState state;
+    const char* FormName() const { return kernel.FormName(); }
+};
+
+// A tap over a line that moves on with every chunk: the line holds the
+// history the tap reads back into, well before the chunk's first frame.
+struct Tap {
+    static constexpr std::size_t kHistory = 64;
+    ModulatedTap kernel;
+    std::vector<float> line = RandomFloats(kHistory + AwkwardTotal(), 77);
+    std::size_t position = 0;
+    const char* FormName() const { return kernel.FormName(); }
+};
 
 struct MidSide {
     LR2MS to;
@@ -180,6 +215,34 @@ std::vector<Kernel> Kernels() {
                        std::copy_n(in[0], 16 * n, out[1]);
                        k.Process(out[1], in[1], out[1], n);
                    }), {}, false, 3.0f});
+    all.push_back({"LaneTransposeToFrames", 16, 1, 1, 16, false,
+                   Use<LaneTranspose>([] { return new LaneTranspose; }, [](LaneTranspose& k, In in, Out out, std::size_t n) {
+                       k.ToFrames(in, out[0], n);
+                   })});
+    all.push_back({"LaneTransposeFromFrames", 1, 16, 16, 1, false,
+                   Use<LaneTranspose>([] { return new LaneTranspose; }, [](LaneTranspose& k, In in, Out out, std::size_t n) {
+                       k.FromFrames(in[0], out, n);
+                   })});
+    all.push_back({"Rotor16", 0, 1, 1, 16, false, Use<Rotor>([] { return new Rotor; }, [](Rotor& k, In, Out out, std::size_t n) {
+                       k.kernel.Process(k.state, out[0], n);
+                   })});
+    // A small swing keeps the whole delay put for whole vectors; a wide one moves it every frame.
+    for (const auto& [name, depth] : {std::pair{"Settled", 0.3f}, std::pair{"Sweeping", 7.5f}})
+        all.push_back({std::string("ModulatedTap") + name + "AndAccumulating", 2, 1, 2, 1, false,
+                       Use<Tap>([] { return new Tap; }, [depth = depth](Tap& k, In in, Out out, std::size_t n) {
+                           const float* x = k.line.data() + Tap::kHistory + k.position;
+                           k.kernel.Read(x, in[0], 20.5f, depth, -0.7f, out[0], n, false);
+                           std::copy_n(in[1], n, out[1]);
+                           k.kernel.Read(x, in[0], 3.0f, depth, 1.3f, out[1], n, true);
+                           k.position += n;
+                       })});
+    for (std::size_t lanes : {1u, 2u, 3u, 4u, 7u})
+        all.push_back({"BiquadPair" + std::to_string(lanes) + "Lanes", lanes, 1, lanes, 1, false,
+                       Use<Biquads>([] { return new Biquads; }, [lanes](Biquads& k, In in, Out out, std::size_t n) {
+                           const BiquadSection sections[2] = {{-0.6, 1.5, 0.5, -0.3, 0.2}, {-0.3, 0.2, 1.0, 2.0, 0.7}};
+                           for (std::size_t l = 0; l < lanes; ++l) std::copy_n(in[l], n, out[l]);
+                           k.kernel.Process(sections, k.state, out, lanes, n);
+                       })});
     return all;
 }
 
