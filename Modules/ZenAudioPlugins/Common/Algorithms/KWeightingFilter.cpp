@@ -43,22 +43,33 @@ void KWeightingFilter::Prepare(double sampleRate, std::size_t channels) {
 void KWeightingFilter::Reset() noexcept { std::fill(m_states.begin(), m_states.end(), State{}); }
 
 void KWeightingFilter::AccumulatePower(std::size_t channel, const float* x, std::size_t n, double& sum) noexcept {
-    const Section sh = m_design[0];
-    const Section hp = m_design[1];
+    const Design d = m_design;
     State s = m_states[channel];
     double total = sum;
     for (std::size_t i = 0; i < n; ++i) {
-        const double in = x[i];
-        const double u = sh.b0 * in + s.s1;
-        s.s1 = sh.b1 * in - sh.a1 * u + s.s2;
-        s.s2 = sh.b2 * in - sh.a2 * u;
-        const double y = hp.b0 * u + s.h1;
-        s.h1 = hp.b1 * u - hp.a1 * y + s.h2;
-        s.h2 = hp.b2 * u - hp.a2 * y;
+        const double y = Step(d, s, x[i]);
         total += y * y;
     }
     m_states[channel] = s;
     sum = total;
+}
+
+void KWeightingFilter::AccumulatePower(std::size_t first, const float* x0, const float* x1, std::size_t n,
+                                       double& sum0, double& sum1) noexcept {
+    const Design d = m_design;
+    State s0 = m_states[first];
+    State s1 = m_states[first + 1];
+    double total0 = sum0, total1 = sum1;
+    for (std::size_t i = 0; i < n; ++i) {
+        const double y0 = Step(d, s0, x0[i]);
+        const double y1 = Step(d, s1, x1[i]);
+        total0 += y0 * y0;
+        total1 += y1 * y1;
+    }
+    m_states[first] = s0;
+    m_states[first + 1] = s1;
+    sum0 = total0;
+    sum1 = total1;
 }
 
 }  // namespace zen

@@ -43,6 +43,10 @@ public:
     // weighted samples to `sum`, one by one in time order, so any split of
     // a stream accumulates the same value.
     void AccumulatePower(std::size_t channel, const float* x, std::size_t n, double& sum) noexcept;
+    // The same for channels `first` and `first + 1` at once: two recursions
+    // side by side run in about the time of one.
+    void AccumulatePower(std::size_t first, const float* x0, const float* x1, std::size_t n, double& sum0,
+                         double& sum1) noexcept;
 
     const Design& GetDesign() const { return m_design; }
     std::size_t GetChannelCount() const { return m_states.size(); }
@@ -52,6 +56,16 @@ private:
         double s1 = 0.0, s2 = 0.0;  // shelf (transposed direct form II)
         double h1 = 0.0, h2 = 0.0;  // high-pass
     };
+    // One sample through both stages; the weighted sample.
+    static double Step(const Design& d, State& s, double x) noexcept {
+        const double u = d[0].b0 * x + s.s1;
+        s.s1 = d[0].b1 * x - d[0].a1 * u + s.s2;
+        s.s2 = d[0].b2 * x - d[0].a2 * u;
+        const double y = d[1].b0 * u + s.h1;
+        s.h1 = d[1].b1 * u - d[1].a1 * y + s.h2;
+        s.h2 = d[1].b2 * u - d[1].a2 * y;
+        return y;
+    }
     Design m_design = DesignFor(48000.0);
     std::vector<State> m_states;
 };

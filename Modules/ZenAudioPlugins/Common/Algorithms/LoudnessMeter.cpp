@@ -101,7 +101,12 @@ bool LoudnessMeter::Process(float* const* channels, std::uint64_t count) {
     const auto frames = static_cast<std::size_t>(count);
     for (std::size_t done = 0; done < frames;) {
         const std::size_t n = std::min(frames - done, m_subEnds[m_subBlock] - m_hopPosition);
-        for (std::size_t c = 0; c < channelCount; ++c) Measure(c, channels[c] + done, n);
+        for (std::size_t c = 0; c < channelCount; c += 2) {
+            if (c + 1 < channelCount)
+                MeasurePair(c, channels[c] + done, channels[c + 1] + done, n);
+            else
+                Measure(c, channels[c] + done, n);
+        }
         m_hopPosition += n;
         done += n;
         if (m_hopPosition == m_subEnds[m_subBlock]) CloseSubBlock();
@@ -111,7 +116,7 @@ bool LoudnessMeter::Process(float* const* channels, std::uint64_t count) {
     return true;
 }
 
-void LoudnessMeter::Measure(std::size_t channel, const float* x, std::size_t n) noexcept {
+std::size_t LoudnessMeter::MeasureLevels(std::size_t channel, const float* x, std::size_t n) noexcept {
     Channel& ch = m_channels[channel];
     double plain = ch.plainPower;
     float peak = ch.samplePeak;
@@ -127,12 +132,33 @@ void LoudnessMeter::Measure(std::size_t channel, const float* x, std::size_t n) 
     }
     ch.plainPower = plain;
     ch.samplePeak = peak;
-    if (invalid == 0) {
+    ch.blockInvalid += invalid;
+    m_invalid += invalid;
+    return invalid;
+}
+
+void LoudnessMeter::MeasurePair(std::size_t first, const float* x0, const float* x1, std::size_t n) noexcept {
+    if (MeasureLevels(first, x0, n) + MeasureLevels(first + 1, x1, n) > 0) {
+        MeasureLoudness(first, x0, n);
+        MeasureLoudness(first + 1, x1, n);
+        return;
+    }
+    m_kWeighting.AccumulatePower(first, x0, x1, n, m_channels[first].kPower, m_channels[first + 1].kPower);
+}
+
+void LoudnessMeter::Measure(std::size_t channel, const float* x, std::size_t n) noexcept {
+    MeasureLevels(channel, x, n);
+    MeasureLoudness(channel, x, n);
+}
+
+void LoudnessMeter::MeasureLoudness(std::size_t channel, const float* x, std::size_t n) noexcept {
+    Channel& ch = m_channels[channel];
+    bool clean = true;
+    for (std::size_t i = 0; i < n && clean; ++i) clean = IsFinite(x[i]);
+    if (clean) {
         m_kWeighting.AccumulatePower(channel, x, n, ch.kPower);
         return;
     }
-    ch.blockInvalid += invalid;
-    m_invalid += invalid;
     for (std::size_t done = 0; done < n; done += kCleanLength) {
         const std::size_t m = std::min(kCleanLength, n - done);
         CopyClean(x + done, m_clean.data(), m);
@@ -170,14 +196,15 @@ void LoudnessMeter::MeasureTruePeaks(const float* const* channels, std::size_t c
 }
 
 double LoudnessMeter::SumLast(const double* ring, std::size_t size, std::size_t end, std::size_t count) noexcept {
-    // Oldest first, so the sum never depends on where the ring starts.
-    double sum = 0.0;
+    // Always in the same order from the oldest, so the sum depends on time
+    // alone; four partial sums keep the adds from waiting on each other.
+    double lanes[4] = {0.0, 0.0, 0.0, 0.0};
     std::size_t i = (end + size - count) % size;
     for (std::size_t k = 0; k < count; ++k) {
-        sum += ring[i];
+        lanes[k % 4] += ring[i];
         if (++i == size) i = 0;
     }
-    return sum;
+    return (lanes[0] + lanes[1]) + (lanes[2] + lanes[3]);
 }
 
 void LoudnessMeter::CloseSubBlock() noexcept {

@@ -102,6 +102,10 @@ private:
 
     void Allocate();
     void Measure(std::size_t channel, const float* x, std::size_t n) noexcept;
+    void MeasurePair(std::size_t first, const float* x0, const float* x1, std::size_t n) noexcept;
+    // Sample peak and plain power; the NaN and infinities met.
+    std::size_t MeasureLevels(std::size_t channel, const float* x, std::size_t n) noexcept;
+    void MeasureLoudness(std::size_t channel, const float* x, std::size_t n) noexcept;
     void MeasureTruePeaks(const float* const* channels, std::size_t count) noexcept;
     void CloseSubBlock() noexcept;
     void CloseHop() noexcept;
