@@ -14,6 +14,7 @@ PACKAGES="
   libcli11-dev nlohmann-json3-dev
   lv2-dev liblilv-dev lilv-utils sordi
   googletest libgtest-dev libgmock-dev libbenchmark-dev
+  libebur128-dev alsa-utils
 "
 
 missing=""

@@ -14,6 +14,13 @@ public:
     // Periodic Hann: smooth spectra, narrow main lobe, and a close fit to the
     // Gaussian the phase-gradient relations assume.
     static void Hann(float* win, std::size_t len);
+    // More analysis windows, periodic, for spectrum analysers:
+    // rectangular (finest resolution, -13 dB side lobes), 4-term
+    // Blackman-Harris (-92 dB side lobes) and flat top (amplitude of a tone
+    // between bins within 0.01 dB).
+    static void Rectangular(float* win, std::size_t len);
+    static void BlackmanHarris(float* win, std::size_t len);
+    static void FlatTop(float* win, std::size_t len);
 
     // Fills `win` (Hann) and `win_dual` for frames of `len` at `stride`.
     // False, with a reported check, for null pointers or zero sizes.

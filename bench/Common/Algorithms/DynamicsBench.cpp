@@ -5,35 +5,10 @@
 
 #include "Common/Algorithms/BiQuad.h"
 #include "Common/Algorithms/RmsCompressor.h"
+#include "Support/NoiseSource.h"
 #include "Support/Realtime.h"
 
-namespace {
-
-// A second of full-scale noise per channel, walked block by block so the input keeps changing.
-struct NoiseSource {
-    explicit NoiseSource(std::uint32_t channels)
-        : source(channels, std::vector<float>(static_cast<std::size_t>(zenbench::kSampleRate))),
-          work(channels, std::vector<float>(zenbench::kBlock)) {
-        std::uint32_t seed = 12345;
-        for (auto& channel : source)
-            for (float& v : channel) {
-                seed = seed * 1664525u + 1013904223u;
-                v = static_cast<float>(seed) / 2147483648.0f - 1.0f;
-            }
-        for (auto& channel : work) pointers.push_back(channel.data());
-    }
-    float* const* Next() {
-        for (std::size_t c = 0; c < work.size(); ++c)
-            std::copy_n(source[c].begin() + static_cast<std::ptrdiff_t>(position), zenbench::kBlock, work[c].begin());
-        position = (position + zenbench::kBlock) % (source[0].size() - zenbench::kBlock);
-        return pointers.data();
-    }
-    std::vector<std::vector<float>> source, work;
-    std::vector<float*> pointers;
-    std::size_t position = 0;
-};
-
-}  // namespace
+using zenbench::NoiseSource;
 
 // One channel of a bell; a section's cost per channel.
 static void BM_BiQuad_PerChannel48k(benchmark::State& state) {
