@@ -32,6 +32,10 @@ bool zn_denoise_frame::Configure(ora::fft::Frame& frame, const ora::fft::Context
     }
     m_channels = channels;
     m_bins = bins;
+    const double binHz = m_sampleRate / static_cast<double>(context.fftLength);
+    m_bandBegin = std::min(bins, static_cast<std::size_t>(kVoiceBandHz[0] / binHz));
+    m_bandEnd = std::min(bins, static_cast<std::size_t>(kVoiceBandHz[1] / binHz) + 1);
+    m_evidenceFall = static_cast<float>(hopSeconds / kEvidenceHoldSeconds);
     m_smoother.SetAmount(m_settings.smoothing);
     if (m_settings.learning) m_profile.Begin();
     Reset();
@@ -46,6 +50,7 @@ void zn_denoise_frame::Reset() noexcept {
     m_noiseSpectrum.Clear();
     std::fill(m_gainSpectrum.begin(), m_gainSpectrum.end(), 1.0f);
     m_voice = 1.0f;
+    m_evidence = 0.0f;
 }
 
 void zn_denoise_frame::Apply(const zn_denoise_settings& settings) noexcept {
@@ -53,6 +58,18 @@ void zn_denoise_frame::Apply(const zn_denoise_settings& settings) noexcept {
     if (!settings.learning && m_settings.learning) m_profile.End();
     m_settings = settings;
     m_smoother.SetAmount(settings.smoothing);
+}
+
+float zn_denoise_frame::SpeechEvidence() noexcept {
+    if (m_bandEnd <= m_bandBegin) return 1.0f;
+    float sum = 0.0f;
+    for (std::size_t c = 0; c < m_channels; ++c) {
+        const float* p = m_tracker.Presence(c);
+        for (std::size_t k = m_bandBegin; k < m_bandEnd; ++k) sum += p[k];
+    }
+    const float mean = sum / static_cast<float>(m_channels * (m_bandEnd - m_bandBegin));
+    m_evidence = std::max(std::min(1.0f, mean / kVoicedPresence), m_evidence - m_evidenceFall);
+    return m_evidence;
 }
 
 float zn_denoise_frame::ReductionDb(std::size_t channel) const {
@@ -63,8 +80,10 @@ void zn_denoise_frame::Process(ora::fft::Frame& frame, ora::fft::Context& contex
     Complex* fsig = frame.Cplx(ora::fft::variable::FSIG, ora::fft::type::FREQ_CPLX_VECTOR);
     if (fsig == nullptr || m_channels == 0) return;
     const zn_denoise_settings& s = m_settings;
+    // The detector steers the tracker; the floor follows only what both agree on.
     const float voice = s.voiceGuided ? std::clamp(m_voice, 0.0f, 1.0f) : 1.0f;
-    const float floor = s.voiceGuided ? std::pow(s.speechFloor, voice) * std::pow(s.floor, 1.0f - voice) : s.floor;
+    const float confirmed = s.voiceGuided ? voice * SpeechEvidence() : 1.0f;
+    const float floor = s.voiceGuided ? std::pow(s.speechFloor, confirmed) * std::pow(s.floor, 1.0f - confirmed) : s.floor;
     const float amount = std::clamp(s.amount, 0.0f, 1.0f);
     const bool learned = s.estimate == zn_denoise_settings::Estimate::Learned && m_profile.HasProfile();
     const float share = 1.0f / static_cast<float>(m_channels);
@@ -77,10 +96,14 @@ void zn_denoise_frame::Process(ora::fft::Frame& frame, ora::fft::Context& contex
             power[k] = x[k].real() * x[k].real() + x[k].imag() * x[k].imag();
             total += power[k];
         }
-        if (s.learning) m_profile.Learn(c, power);
-        m_tracker.Update(c, power, voice);
+        // Frames that begin before the stream does hold leading silence,
+        // which is no measure of the noise.
+        if (context.analysisStart >= 0) {
+            if (s.learning) m_profile.Learn(c, power);
+            m_tracker.Update(c, power, voice);
+        }
         const float* noise = learned ? m_profile.Power(c) : m_tracker.Noise(c);
-        m_gain.Compute(c, power, noise, s.overSubtraction, floor, nullptr, gain);
+        m_gain.Compute(c, power, noise, s.overSubtraction, floor, m_tracker.Presence(c), gain);
         m_smoother.Process(c, gain, floor);
         double kept = 0.0;
         for (std::size_t k = 0; k < m_bins; ++k) {

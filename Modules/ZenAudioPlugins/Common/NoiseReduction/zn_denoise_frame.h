@@ -4,6 +4,11 @@
 // estimate sets the suppression gains, which are smoothed against musical
 // noise and applied to the spectrum (or their complement, to listen to what
 // is removed). It keeps the last frame's figures for meters.
+//
+// Voice guided, the owner's voice probability is confirmed by the tracker's
+// own speech presence in the voice band, held over the pauses between words
+// (the detector can take noise for voice for a while after a loud passage;
+// the tracker cannot): a frame counts as voice only as far as both agree.
 #pragma once
 
 #include <cstddef>
@@ -21,6 +26,9 @@ namespace zen::noise_reduction {
 class zn_denoise_frame final : public ora::fft::Plugin {
 public:
     static constexpr float kSilentPower = 1e-18f;  // a frame below this per bin reports no reduction
+    static constexpr double kVoiceBandHz[2] = {200.0, 4000.0};
+    static constexpr float kVoicedPresence = 0.1f;  // mean presence in the voice band that confirms voice fully
+    static constexpr double kEvidenceHoldSeconds = 0.5;  // the confirmation falls to nothing over this
 
     zn_denoise_frame() : Plugin(ora::fft::plugin::PROCESS) {}
     const char* Name() const override { return "zn_denoise_frame"; }
@@ -46,7 +54,13 @@ public:
     std::size_t Bins() const { return m_bins; }
 
 private:
+    float SpeechEvidence() noexcept;
+
     zn_denoise_settings m_settings;
+    std::size_t m_bandBegin = 0;
+    std::size_t m_bandEnd = 0;
+    float m_evidence = 0.0f;
+    float m_evidenceFall = 0.0f;
     double m_sampleRate = 48000.0;
     float m_voice = 1.0f;
     std::size_t m_channels = 0;

@@ -67,7 +67,7 @@ void zn_lsa_gain::Compute(std::size_t channel, const float* power, const float* 
     const float logFloor = std::log(std::clamp(floor, 1e-6f, 1.0f));
     const float a = started ? kDecisionDirected : 0.0f;
     for (std::size_t k = 0; k < m_bins; ++k) {
-        const float gamma = std::min(power[k] / (overSubtraction * noise[k]), kMaxPosterioriSnr);
+        const float gamma = std::min(power[k] / std::max(overSubtraction * noise[k], kMinNoise), kMaxPosterioriSnr);
         const float xi = std::max(a * previous[k] + (1.0f - a) * std::max(gamma - 1.0f, 0.0f), kMinPrioriSnr);
         const float v = std::max(xi * gamma / (1.0f + xi), kMinV);
         const HalfE1 e = HalfExpIntegral(v);

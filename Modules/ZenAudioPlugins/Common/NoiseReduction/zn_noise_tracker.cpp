@@ -23,6 +23,8 @@ bool zn_noise_tracker::Configure(std::size_t channels, std::size_t bins, double 
         m_smoothed.Resize(n);
         m_minimum.Resize(n);
         m_running.Resize(n);
+        m_parts.Resize(n * kSubWindows);
+        m_part.Resize(channels);
         m_noise.Resize(n);
         m_presence.Resize(n);
         m_frequencySmoothed.Resize(bins);
@@ -35,7 +37,8 @@ bool zn_noise_tracker::Configure(std::size_t channels, std::size_t bins, double 
     m_alphaS = Coefficient(kPowerSmoothingSeconds, hopSeconds);
     m_alphaD = Coefficient(kNoiseSmoothingSeconds, hopSeconds);
     m_alphaP = Coefficient(kPresenceSmoothingSeconds, hopSeconds);
-    m_window = static_cast<std::uint32_t>(std::max(1.0, std::round(kMinimumWindowSeconds / hopSeconds)));
+    m_subWindow = static_cast<std::uint32_t>(
+        std::max(1.0, std::round(kMinimumWindowSeconds / kSubWindows / hopSeconds)));
     Reset();
     return true;
 }
@@ -44,6 +47,8 @@ void zn_noise_tracker::Reset() noexcept {
     m_smoothed.Clear();
     m_minimum.Clear();
     m_running.Clear();
+    m_parts.Clear();
+    m_part.Clear();
     m_noise.Clear();
     m_presence.Clear();
     m_frames.Clear();
@@ -67,27 +72,36 @@ void zn_noise_tracker::Update(std::size_t channel, const float* power, float voi
     sf[bins - 1] = 0.5f * (power[bins - 2] + power[bins - 1]);
 
     std::uint32_t& frames = m_frames[channel];
+    float* parts = m_parts.data() + offset * kSubWindows;
     if (frames == 0) {
         for (std::size_t k = 0; k < bins; ++k) {
-            s[k] = smin[k] = stmp[k] = sf[k];
+            s[k] = smin[k] = stmp[k] = std::max(sf[k], kPowerFloor);
+            for (std::uint32_t u = 0; u < kSubWindows; ++u) parts[u * bins + k] = s[k];
             noise[k] = std::max(power[k], kPowerFloor);
             p[k] = 0.0f;
         }
     } else {
         const float as = m_alphaS, ad = m_alphaD, ap = m_alphaP;
         for (std::size_t k = 0; k < bins; ++k) {
-            s[k] = as * s[k] + (1.0f - as) * sf[k];
+            s[k] = std::max(as * s[k] + (1.0f - as) * sf[k], kPowerFloor);
             smin[k] = std::min(smin[k], s[k]);
             stmp[k] = std::min(stmp[k], s[k]);
             const float indicator = s[k] > kPresenceRatio * smin[k] ? voice : 0.0f;
             p[k] = ap * p[k] + (1.0f - ap) * indicator;
             const float a = ad + (1.0f - ad) * p[k];
-            noise[k] = std::max(a * noise[k] + (1.0f - a) * power[k], kPowerFloor);
+            noise[k] = std::max(std::min(a * noise[k] + (1.0f - a) * power[k], kFollowDown * s[k]), kPowerFloor);
         }
     }
-    if (++frames > m_window) {
+    if (++frames > m_subWindow) {
+        // The part ends: the window's minimum drops the oldest part.
+        std::uint32_t& part = m_part[channel];
+        float* newest = parts + part * bins;
+        for (std::size_t k = 0; k < bins; ++k) newest[k] = stmp[k];
+        part = (part + 1) % kSubWindows;
         for (std::size_t k = 0; k < bins; ++k) {
-            smin[k] = std::min(stmp[k], s[k]);
+            float m = s[k];
+            for (std::uint32_t u = 0; u < kSubWindows; ++u) m = std::min(m, parts[u * bins + k]);
+            smin[k] = m;
             stmp[k] = s[k];
         }
         frames = 1;
