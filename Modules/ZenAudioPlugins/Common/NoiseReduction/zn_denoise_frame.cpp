@@ -84,6 +84,9 @@ void zn_denoise_frame::Process(ora::fft::Frame& frame, ora::fft::Context& contex
     const float voice = s.voiceGuided ? std::clamp(m_voice, 0.0f, 1.0f) : 1.0f;
     const float confirmed = s.voiceGuided ? voice * SpeechEvidence() : 1.0f;
     const float floor = s.voiceGuided ? std::pow(s.speechFloor, confirmed) * std::pow(s.floor, 1.0f - confirmed) : s.floor;
+    const float overSubtraction =
+        s.voiceGuided ? std::pow(s.overSubtraction, confirmed) * std::pow(kPauseOverSubtraction, 1.0f - confirmed)
+                      : s.overSubtraction;
     const float amount = std::clamp(s.amount, 0.0f, 1.0f);
     const bool learned = s.estimate == zn_denoise_settings::Estimate::Learned && m_profile.HasProfile();
     const float share = 1.0f / static_cast<float>(m_channels);
@@ -103,7 +106,7 @@ void zn_denoise_frame::Process(ora::fft::Frame& frame, ora::fft::Context& contex
             m_tracker.Update(c, power, voice);
         }
         const float* noise = learned ? m_profile.Power(c) : m_tracker.Noise(c);
-        m_gain.Compute(c, power, noise, s.overSubtraction, floor, m_tracker.Presence(c), gain);
+        m_gain.Compute(c, power, noise, overSubtraction, floor, m_tracker.Presence(c), gain);
         m_smoother.Process(c, gain, floor);
         double kept = 0.0;
         for (std::size_t k = 0; k < m_bins; ++k) {

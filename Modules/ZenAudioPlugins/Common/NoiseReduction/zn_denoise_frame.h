@@ -9,6 +9,7 @@
 // own speech presence in the voice band, held over the pauses between words
 // (the detector can take noise for voice for a while after a loud passage;
 // the tracker cannot): a frame counts as voice only as far as both agree.
+// Outside voice the floor and the sensitivity move to their pause values.
 #pragma once
 
 #include <cstddef>
@@ -29,6 +30,7 @@ public:
     static constexpr double kVoiceBandHz[2] = {200.0, 4000.0};
     static constexpr float kVoicedPresence = 0.1f;  // mean presence in the voice band that confirms voice fully
     static constexpr double kEvidenceHoldSeconds = 0.5;  // the confirmation falls to nothing over this
+    static constexpr float kPauseOverSubtraction = 2.0f; // noise estimate x2 (+3 dB) where there is no voice
 
     zn_denoise_frame() : Plugin(ora::fft::plugin::PROCESS) {}
     const char* Name() const override { return "zn_denoise_frame"; }

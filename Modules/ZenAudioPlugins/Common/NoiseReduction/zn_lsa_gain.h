@@ -19,7 +19,7 @@ namespace zen::noise_reduction {
 
 class zn_lsa_gain {
 public:
-    static constexpr float kDecisionDirected = 0.95f;  // weight of the previous frame's clean estimate
+    static constexpr float kDecisionDirected = 0.9f;   // weight of the previous frame's clean estimate (frames a quarter apart)
     static constexpr float kMinPrioriSnr = 0.0031623f; // -25 dB: the a-priori SNR of a bin never falls below
     static constexpr float kMaxPosterioriSnr = 1e4f;   // 40 dB
     static constexpr float kMinNoise = 1e-30f;         // no noise yet: every bin is signal
