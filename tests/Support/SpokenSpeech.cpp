@@ -4,6 +4,7 @@
 #include <cmath>
 #include <cstdio>
 #include <cstring>
+#include <numeric>
 #include <random>
 
 #include "Support/Signals.h"
@@ -40,27 +41,42 @@ std::vector<float> ReadWav(FILE* in, double& rate) {
 }
 
 // Windowed-sinc resampling (Blackman, 32 zero crossings, cut-off below the
-// lower Nyquist rate).
+// lower Nyquist rate). The rates are whole numbers of Hz, so output sample n
+// falls on one of `up` phases between input samples: the taps of each phase
+// are computed once.
 std::vector<float> Resample(const std::vector<float>& x, double from, double to) {
     if (from == to || x.empty()) return x;
-    const double ratio = to / from;
-    const double cutoff = 0.95 * std::min(1.0, ratio);
+    const auto gcd = std::gcd(static_cast<long>(from), static_cast<long>(to));
+    const long up = static_cast<long>(to) / gcd, down = static_cast<long>(from) / gcd;
+    const double cutoff = 0.95 * std::min(1.0, to / from);
     const int half = 32;
-    const auto frames = static_cast<std::size_t>(std::floor(static_cast<double>(x.size()) * ratio));
+    const long reach = static_cast<long>(std::ceil(half / cutoff));
+    const std::size_t taps = static_cast<std::size_t>(2 * reach + 1);
+    std::vector<float> table(static_cast<std::size_t>(up) * taps);
+    for (long phase = 0; phase < up; ++phase)
+        for (long j = -reach; j <= reach; ++j) {
+            // Output at input position centre + phase/up; tap on input centre + j.
+            const double d = (static_cast<double>(phase) / static_cast<double>(up) - static_cast<double>(j)) * cutoff;
+            double value = 0.0;
+            if (std::fabs(d) < half) {
+                const double sinc = d == 0.0 ? 1.0 : std::sin(kPi * d) / (kPi * d);
+                const double w = 0.42 + 0.5 * std::cos(kPi * d / half) + 0.08 * std::cos(2 * kPi * d / half);
+                value = sinc * w * cutoff;
+            }
+            table[static_cast<std::size_t>(phase) * taps + static_cast<std::size_t>(j + reach)] = static_cast<float>(value);
+        }
+    const auto frames = static_cast<std::size_t>(x.size() * static_cast<std::size_t>(up) / static_cast<std::size_t>(down));
     std::vector<float> y(frames);
     for (std::size_t n = 0; n < frames; ++n) {
-        const double t = static_cast<double>(n) / ratio;
-        const auto centre = static_cast<long>(std::floor(t));
+        const long position = static_cast<long>(n) * down;
+        const long centre = position / up, phase = position % up;
+        const float* t = table.data() + static_cast<std::size_t>(phase) * taps;
         double sum = 0.0;
-        for (long k = centre - half / cutoff; k <= centre + half / cutoff; ++k) {
-            if (k < 0 || k >= static_cast<long>(x.size())) continue;
-            const double d = (t - static_cast<double>(k)) * cutoff;
-            if (std::fabs(d) >= half) continue;
-            const double sinc = d == 0.0 ? 1.0 : std::sin(kPi * d) / (kPi * d);
-            const double w = 0.42 + 0.5 * std::cos(kPi * d / half) + 0.08 * std::cos(2 * kPi * d / half);
-            sum += x[static_cast<std::size_t>(k)] * sinc * w;
+        for (long j = -reach; j <= reach; ++j) {
+            const long k = centre + j;
+            if (k >= 0 && k < static_cast<long>(x.size())) sum += x[static_cast<std::size_t>(k)] * t[j + reach];
         }
-        y[n] = static_cast<float>(sum * cutoff);
+        y[n] = static_cast<float>(sum);
     }
     return y;
 }
