@@ -11,6 +11,7 @@ PACKAGES="
   libkissfft-dev libfftw3-dev
   libwebrtc-audio-processing-dev
   libsndfile1-dev
+  espeak-ng
   libcli11-dev nlohmann-json3-dev
   lv2-dev liblilv-dev lilv-utils sordi
   googletest libgtest-dev libgmock-dev libbenchmark-dev

@@ -1,0 +1,33 @@
+// Settings of the spectral denoiser, handed whole to zn_denoiser (and from
+// it to its frame processor). Plain values in working units.
+#pragma once
+
+namespace zen::noise_reduction {
+
+struct zn_denoise_settings {
+    enum class Estimate { Adaptive, Learned };
+
+    Estimate estimate = Estimate::Adaptive;
+    // Least gain outside speech (the reduction amount), linear.
+    float floor = 0.25f;
+    // Least gain while the voice-activity detector hears speech; used only
+    // when voice guided (the floor moves between the two with the voice
+    // probability).
+    float speechFloor = 0.25f;
+    // Factor on the noise estimate (the sensitivity), linear power. Half the
+    // estimate by default: the tracker runs a little high under speech, and
+    // speech suffers more from a high estimate than noise from a low one.
+    float overSubtraction = 0.5f;
+    // Musical-noise control, 0..1.
+    float smoothing = 0.5f;
+    // Share of the suppression applied, 0..1 (0 passes the input through).
+    float amount = 1.0f;
+    // Output the removed part instead of the cleaned signal.
+    bool listenToRemoved = false;
+    // Frames heard while on are learnt as the noise profile.
+    bool learning = false;
+    // A voice-activity detector steers the noise estimate and the floor.
+    bool voiceGuided = false;
+};
+
+}  // namespace zen::noise_reduction

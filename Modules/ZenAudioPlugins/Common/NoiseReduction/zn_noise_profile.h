@@ -1,0 +1,73 @@
+// A learned noise profile: the mean periodogram of the frames heard while
+// learning, per channel and bin. It is kept per unit of window energy, so a
+// profile learned with one frame length applies to another (a change of
+// sample rate); across frame lengths it is interpolated in frequency.
+//
+// Learning restarts the mean at Begin and keeps it at End; a learn that saw
+// no frame leaves the previous profile in place. The profile survives Reset
+// (it is a setting, not signal state) and travels as text (ToText/FromText).
+//
+// Configure, ToText and FromText allocate; Begin, Learn, End, Apply and
+// Reset are real-time safe.
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <string>
+#include <vector>
+
+#include "System/AlignedBuffer.h"
+
+namespace zen::noise_reduction {
+
+class zn_noise_profile {
+public:
+    static constexpr std::size_t kMaxChannels = 64;
+    static constexpr const char* kTextTag = "noise-profile";
+
+    // `windowEnergy` is the sum of the squared analysis window.
+    bool Configure(std::size_t channels, std::size_t bins, double sampleRate, double windowEnergy);
+
+    void Begin() noexcept;
+    void Learn(std::size_t channel, const float* power) noexcept;
+    // Frames learnt since Begin, then the profile replaces the previous one.
+    std::uint64_t End() noexcept;
+    bool IsLearning() const { return m_learning; }
+    std::uint64_t FramesLearnt() const { return m_learnt; }
+
+    bool HasProfile() const { return m_hasProfile; }
+    void Forget() noexcept { m_hasProfile = false; }
+    // The profile as expected periodogram power of this channel's frames
+    // (channels beyond those learnt use the last learnt one).
+    const float* Power(std::size_t channel) const;
+
+    // "noise-profile <rate> <bins> <channels>" then per channel the bins'
+    // power per unit window energy in dB; "" without a profile.
+    std::string ToText() const;
+    // False for text that is not a profile; the profile then stays as it was.
+    bool FromText(const std::string& text);
+
+private:
+    void Rebuild() noexcept;  // the stored profile in this configuration's bins
+
+    std::size_t m_channels = 0;
+    std::size_t m_bins = 0;
+    double m_sampleRate = 48000.0;
+    double m_windowEnergy = 1.0;
+    bool m_learning = false;
+    bool m_hasProfile = false;
+    std::uint64_t m_learnt = 0;
+    ora::AlignedBuffer<double> m_sum;
+    ora::AlignedBuffer<std::uint64_t> m_counts;
+    ora::AlignedBuffer<float> m_power;  // expected periodogram power, channels x bins
+
+    // The profile as learnt or loaded: its own rate and bins, power per unit
+    // window energy. Sized at Configure for this configuration, resized only
+    // by FromText.
+    double m_storedRate = 48000.0;
+    std::size_t m_storedBins = 0;
+    std::size_t m_storedChannels = 0;
+    std::vector<float> m_stored;
+};
+
+}  // namespace zen::noise_reduction
