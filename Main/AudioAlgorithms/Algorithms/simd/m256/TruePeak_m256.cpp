@@ -24,7 +24,10 @@ float TruePeakScan_m256(const float* points, std::size_t middles, float peak) {
         const __m256 isPeak =
             _mm256_and_ps(_mm256_and_ps(_mm256_cmp_ps(b, a, _CMP_GE_OQ), _mm256_cmp_ps(b, c, _CMP_GE_OQ)),
                           _mm256_cmp_ps(d, zero, _CMP_GT_OQ));
-        best = _mm256_max_ps(_mm256_blendv_ps(b, vertex, isPeak), best);
+        // A select by masks, not blendv: GCC lowers that blend of combined
+        // compares to one branch per lane when compiling for AVX without AVX2.
+        const __m256 v = _mm256_or_ps(_mm256_and_ps(isPeak, vertex), _mm256_andnot_ps(isPeak, b));
+        best = _mm256_max_ps(v, best);
     }
     __m128 half = _mm_max_ps(_mm256_castps256_ps128(best), _mm256_extractf128_ps(best, 1));
     half = _mm_max_ps(half, _mm_movehl_ps(half, half));
