@@ -1,6 +1,7 @@
 #include "Delay.h"
 
 #include <algorithm>
+#include <cstring>
 
 namespace zen {
 
@@ -31,11 +32,16 @@ bool Delay::ProcessChannel(std::uint64_t channel, float* samples, std::uint64_t 
     if (m_delay == 0) return true;
     float* line = m_lines.data() + channel * m_delay;
     std::uint32_t position = m_positions[channel];
-    // Swap runs up to the end of the ring instead of a branch per sample.
+    // Swap runs up to the end of the ring instead of a branch per sample,
+    // through a small scratch so that each copy is a vectorised memcpy.
     std::uint64_t done = 0;
     while (done < count) {
-        const std::uint64_t run = std::min<std::uint64_t>(count - done, m_delay - position);
-        std::swap_ranges(samples + done, samples + done + run, line + position);
+        const std::uint64_t run = std::min<std::uint64_t>({count - done, m_delay - position, kScratch});
+        float* x = samples + done;
+        float* slot = line + position;
+        std::memcpy(m_scratch.data(), slot, run * sizeof(float));
+        std::memcpy(slot, x, run * sizeof(float));
+        std::memcpy(x, m_scratch.data(), run * sizeof(float));
         done += run;
         position = static_cast<std::uint32_t>((position + run) % m_delay);
     }
