@@ -166,14 +166,17 @@ TEST(Limiter, QuietMaterialPassesExactlyDelayedAndSilenceStaysSilent) {
 TEST(Limiter, MetersReadTheGainAndEachChannelsInputTruePeak) {
     auto limiter = Make({48000.0f, -6.0f, 1.0f, false}, 2);
     Limit(*limiter, {zentest::Sine(440.0, 48000.0, 24000, 2.0), zentest::Sine(440.0, 48000.0, 24000, 0.5)}, 512);
-    EXPECT_NEAR(limiter->GetMeter(Limiter::kFirstInputTruePeakMeter), 6.02, 0.02);
-    EXPECT_NEAR(limiter->GetMeter(Limiter::kFirstInputTruePeakMeter + 1), -6.02, 0.02);
-    // The loud channel is brought to the ceiling less its margin.
+    EXPECT_NEAR(limiter->GetMeter(Limiter::InputTruePeakMeter(0)), 6.02, 0.02);
+    EXPECT_NEAR(limiter->GetMeter(Limiter::InputTruePeakMeter(1)), -6.02, 0.02);
+    // The loud channel is brought to the ceiling less its margin, the other follows.
     EXPECT_NEAR(limiter->GetMeter(Limiter::kGainMeter), -6.2 - 6.02, 0.03);
-    EXPECT_EQ(limiter->GetMeter(Limiter::kFirstInputTruePeakMeter + 2), 0.0f);
+    EXPECT_NEAR(limiter->GetMeter(Limiter::OutputPeakMeter(0)), -6.2, 0.03);
+    EXPECT_NEAR(limiter->GetMeter(Limiter::OutputPeakMeter(1)), -6.2 - 12.04, 0.03);
+    EXPECT_EQ(limiter->GetMeter(Limiter::InputTruePeakMeter(2)), 0.0f);
     limiter->Reset();
     EXPECT_EQ(limiter->GetGain(), 1.0f);
     EXPECT_EQ(limiter->GetInputTruePeak(0), 0.0f);
+    EXPECT_EQ(limiter->GetOutputPeak(1), 0.0f);
 }
 
 TEST(Limiter, ResetReproducesAndNonFiniteInputDoesNotStick) {

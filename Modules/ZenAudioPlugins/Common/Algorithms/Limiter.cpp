@@ -74,9 +74,11 @@ void Limiter::Dimension() {
     m_lookAhead.Dimension(channels, GetMaxBlockSize(), m_lookAheadLength);
     m_truePeaks.resize(channels);
     m_samplePeaks.resize(channels);
+    m_outputPeaks.resize(channels);
     for (std::uint64_t c = 0; c < channels; ++c) {
         if (!m_truePeaks[c]) m_truePeaks[c] = std::make_unique<ora::numeric::TruePeak>(kTruePeakConfig);
         if (!m_samplePeaks[c]) m_samplePeaks[c] = std::make_unique<ora::numeric::FindMinMax>();
+        if (!m_outputPeaks[c]) m_outputPeaks[c] = std::make_unique<ora::numeric::FindMinMax>();
     }
     m_blocks.assign(channels, ChannelBlock{});
     m_callInputPeak.assign(channels, 0.0f);
@@ -118,6 +120,7 @@ void Limiter::Reset() {
     // on a block's reading is complete as its first sample leaves the buffer.
     m_position = m_blockLength - m_truePeakLatency;
     for (auto& peak : m_inputTruePeak) peak.store(0.0f, std::memory_order_relaxed);
+    for (auto& peak : m_outputPeak) peak.store(0.0f, std::memory_order_relaxed);
     m_gainMeter.store(1.0f, std::memory_order_relaxed);
 }
 
@@ -155,10 +158,8 @@ void Limiter::ApplyGain(float* const* channels, std::uint64_t channelCount, std:
         m_gains[i] = g;
     }
     m_gain = g;
-    for (std::uint64_t c = 0; c < channelCount; ++c) {
-        float* x = channels[c] + offset;
-        for (std::uint64_t i = 0; i < frames; ++i) x[i] *= m_gains[i];
-    }
+    for (std::uint64_t c = 0; c < channelCount; ++c)
+        m_vec.Multiply(channels[c] + offset, m_gains.data(), channels[c] + offset, frames);
 }
 
 bool Limiter::Process(float* const* channels, std::uint64_t count) { return Process(channels, count, nullptr); }
@@ -198,9 +199,12 @@ bool Limiter::Process(float* const* channels, std::uint64_t count, const float* 
             m_position = 0;
         }
     }
-    if (m_callFinishedBlock)
-        for (std::uint64_t c = 0; c < channelCount; ++c)
-            m_inputTruePeak[c].store(m_callInputPeak[c], std::memory_order_relaxed);
+    for (std::uint64_t c = 0; c < channelCount; ++c) {
+        if (m_callFinishedBlock) m_inputTruePeak[c].store(m_callInputPeak[c], std::memory_order_relaxed);
+        m_outputPeaks[c]->Reset();
+        m_outputPeaks[c]->Process(channels[c], count);
+        m_outputPeak[c].store(m_outputPeaks[c]->GetPeak(0), std::memory_order_relaxed);
+    }
     m_gainMeter.store(m_gain, std::memory_order_relaxed);
     return true;
 }
@@ -209,9 +213,13 @@ float Limiter::GetInputTruePeak(std::uint64_t channel) const {
     return channel < kMaxChannels ? m_inputTruePeak[channel].load(std::memory_order_relaxed) : 0.0f;
 }
 
+float Limiter::GetOutputPeak(std::uint64_t channel) const {
+    return channel < kMaxChannels ? m_outputPeak[channel].load(std::memory_order_relaxed) : 0.0f;
+}
+
 float Limiter::GetMeter(std::uint64_t index) const {
     if (index == kGainMeter) return zen::GainToMeterDb(GetGain());
-    if (index >= kFirstInputTruePeakMeter && index - kFirstInputTruePeakMeter < GetChannelCount())
-        return zen::GainToMeterDb(GetInputTruePeak(index - kFirstInputTruePeakMeter));
-    return 0.0f;
+    const std::uint64_t channel = (index - 1) / 2;
+    if (channel >= std::min(GetChannelCount(), kMaxChannels)) return 0.0f;
+    return zen::GainToMeterDb(index == InputTruePeakMeter(channel) ? GetInputTruePeak(channel) : GetOutputPeak(channel));
 }

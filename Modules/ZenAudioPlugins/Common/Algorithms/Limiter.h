@@ -31,6 +31,7 @@
 #include "../ZenAudioAlgorithm.h"
 #include "Algorithms/FindMinMax.h"
 #include "Algorithms/TruePeak.h"
+#include "Algorithms/Vec.h"
 #include "Delay.h"
 
 class Limiter : public ZenAudioAlgorithm {
@@ -38,9 +39,13 @@ class Limiter : public ZenAudioAlgorithm {
 
 public:
     enum Parameter : std::uint64_t { kCeiling, kRelease, kSoft };
-    // Meter 0: the gain in dB (negative while limiting); then, per channel,
-    // the true peak in dBTP of the input blocks completed by the last call.
-    enum Meter : std::uint64_t { kGainMeter, kFirstInputTruePeakMeter };
+    // Meter 0: the gain in dB (negative while limiting); then per channel c,
+    // InputTruePeakMeter(c): the true peak in dBTP of the input blocks
+    // completed by the last call, and OutputPeakMeter(c): the largest
+    // output sample of the last call in dBFS.
+    static constexpr std::uint64_t kGainMeter = 0;
+    static constexpr std::uint64_t InputTruePeakMeter(std::uint64_t channel) { return 1 + 2 * channel; }
+    static constexpr std::uint64_t OutputPeakMeter(std::uint64_t channel) { return 2 + 2 * channel; }
     static constexpr std::uint64_t kMaxChannels = 32;
 
     // The ceiling is held this far below its setting, a margin for the
@@ -79,10 +84,12 @@ public:
     std::uint32_t GetLookAheadLength() const { return m_lookAheadLength; }
     std::uint32_t GetTruePeakLatency() const { return m_truePeakLatency; }
 
-    // Linear read-outs for owners: the present gain g, and a channel's input
-    // true peak over the blocks completed by the last call (kept when none was).
+    // Linear read-outs for owners: the present gain g, a channel's input true
+    // peak over the blocks completed by the last call (kept when none was),
+    // and its output peak over the last call.
     float GetGain() const { return m_gainMeter.load(std::memory_order_relaxed); }
     float GetInputTruePeak(std::uint64_t channel) const;
+    float GetOutputPeak(std::uint64_t channel) const;
 
 private:
     void Dimension();
@@ -115,6 +122,8 @@ private:
     zen::Delay m_lookAhead;
     std::vector<std::unique_ptr<ora::numeric::TruePeak>> m_truePeaks;  // one per channel
     std::vector<std::unique_ptr<ora::numeric::FindMinMax>> m_samplePeaks;
+    std::vector<std::unique_ptr<ora::numeric::FindMinMax>> m_outputPeaks;
+    ora::numeric::Vec m_vec;
     std::vector<float> m_gains;  // per sample of a segment
 
     struct ChannelBlock {
@@ -127,5 +136,6 @@ private:
     bool m_callFinishedBlock = false;
 
     std::array<std::atomic<float>, kMaxChannels> m_inputTruePeak{};
+    std::array<std::atomic<float>, kMaxChannels> m_outputPeak{};
     std::atomic<float> m_gainMeter{1.0f};
 };
