@@ -3,7 +3,6 @@
 // plug-in. Dimension allocates; everything else is real-time safe.
 #pragma once
 
-#include <array>
 #include <cstdint>
 #include <vector>
 
@@ -42,10 +41,8 @@ public:
     void Reset() override;
 
 private:
-    static constexpr std::uint64_t kScratch = 256;
-
-    std::array<float, kScratch> m_scratch{};
     std::vector<float> m_lines;  // channel-major, m_delay samples each
+    std::vector<float> m_scratch;  // m_delay samples
     std::vector<std::uint32_t> m_positions;
     std::uint32_t m_delay = 0;
 };
