@@ -16,10 +16,11 @@
 // 48-tap one misses much of what content near Nyquist (noise, squares,
 // clipped material) adds between samples.
 //
-// The law bounds sample peaks by the ceiling. Between samples the output
-// can pass it where the gain steps down, and with "Soft" on, where the soft
-// curve's harmonics peak: the 0.2 dB margin under the set ceiling is there
-// for those.
+// The law bounds sample peaks by the ceiling, and true peaks as far as the
+// 4x reading sees them. Between samples the output can pass it where the
+// gain steps down and, with "Soft" on, by several dB on dense material: a
+// softened block is held by its largest softened sample, not by the peaks
+// that the curve's harmonics put between samples.
 #pragma once
 
 #include <array>
