@@ -4,6 +4,7 @@
 #include <vector>
 
 #include "Common/Algorithms/BiQuad.h"
+#include "Common/Algorithms/Limiter.h"
 #include "Common/Algorithms/RmsCompressor.h"
 #include "Support/NoiseSource.h"
 #include "Support/Realtime.h"
@@ -42,3 +43,18 @@ static void BM_RmsCompressor_Stereo48k(benchmark::State& state) {
     zenbench::ReportRealtime(state, zenbench::kBlock);
 }
 BENCHMARK(BM_RmsCompressor_Stereo48k);
+
+// Stereo full-scale noise against a -1 dBTP ceiling: a new target every block.
+static void BM_LimiterAlgorithm_Stereo48k(benchmark::State& state) {
+    Limiter limiter;
+    limiter.SetChannelCount(2);
+    limiter.Prepare(static_cast<float>(zenbench::kSampleRate), zenbench::kBlock);
+    limiter.SetParameter(Limiter::kCeiling, -1.0f);
+    NoiseSource input(2);
+    for (auto _ : state) {
+        limiter.Process(input.Next(), zenbench::kBlock);
+        benchmark::ClobberMemory();
+    }
+    zenbench::ReportRealtime(state, zenbench::kBlock);
+}
+BENCHMARK(BM_LimiterAlgorithm_Stereo48k);

@@ -33,6 +33,18 @@ TEST(Delay, AnyBlockSplitOrSampleBySampleGivesTheSameOutput) {
             delay.ProcessChannel(0, split.data() + done, std::min(block, split.size() - done));
         EXPECT_EQ(split, whole) << "block " << block;
     }
+    // Blocks longer and shorter than the line in turn, and single samples.
+    zen::Delay mixed;
+    mixed.Dimension(1, 100, 37);
+    std::vector<float> split = input;
+    const std::size_t lengths[] = {5, 80, 1, 37, 36, 38, 100, 2};
+    for (std::size_t done = 0, k = 0; done < split.size(); ++k) {
+        const std::size_t n = std::min(lengths[k % 8], split.size() - done);
+        if (n == 1) split[done] = mixed.ReadWrite(0, split[done]);
+        else mixed.ProcessChannel(0, split.data() + done, n);
+        done += n;
+    }
+    EXPECT_EQ(split, whole);
 }
 
 TEST(Delay, ZeroLengthPassesThroughAndResetClearsEveryLine) {

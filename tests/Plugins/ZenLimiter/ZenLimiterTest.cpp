@@ -7,7 +7,7 @@
 #include <cmath>
 #include <functional>
 
-#include "OversampledPeak.h"
+#include "Support/OversampledPeak.h"
 #include "Plugins/ZenLimiter/ZenLimiter.h"
 #include "Support/PluginHarness.h"
 #include "Support/Signals.h"

@@ -236,8 +236,36 @@ bool BiQuad::ProcessChannel(std::uint64_t channel, float* samples, std::uint64_t
 
 bool BiQuad::Process(float* const* channels, std::uint64_t count) { return Process(channels, channels, count); }
 
+void BiQuad::ProcessPair(State& left, State& right, const float* const* in, float* const* out,
+                         std::uint64_t count) const noexcept {
+    // Two recursions side by side: each waits on its own last value, so the
+    // processor runs them in parallel.
+    const Coefficients c = m_coefficients;
+    double l1 = left.w1, l2 = left.w2, r1 = right.w1, r2 = right.w2;
+    for (std::uint64_t i = 0; i < count; ++i) {
+        const double wl = c.g * static_cast<double>(in[0][i]) + c.c0 * l2 + c.c1 * l1;
+        const double wr = c.g * static_cast<double>(in[1][i]) + c.c0 * r2 + c.c1 * r1;
+        const double yl = wl + c.c2 * l2 + c.c3 * l1;
+        const double yr = wr + c.c2 * r2 + c.c3 * r1;
+        l2 = l1;
+        r2 = r1;
+        l1 = (wl + kDenormalGuard) - kDenormalGuard;
+        r1 = (wr + kDenormalGuard) - kDenormalGuard;
+        out[0][i] = static_cast<float>(yl);
+        out[1][i] = static_cast<float>(yr);
+    }
+    if (!std::isfinite(l1) || !std::isfinite(l2)) l1 = l2 = 0.0;
+    if (!std::isfinite(r1) || !std::isfinite(r2)) r1 = r2 = 0.0;
+    left = {l1, l2};
+    right = {r1, r2};
+}
+
 bool BiQuad::Process(float* const* in, float* const* out, std::uint64_t count) {
     if (out == nullptr) out = in;
+    if (GetChannelCount() == 2 && m_states.size() == 2) {
+        ProcessPair(m_states[0], m_states[1], in, out, count);
+        return true;
+    }
     for (std::uint64_t c = 0; c < GetChannelCount(); ++c) {
         if (c >= m_states.size()) std::fill(out[c], out[c] + count, 0.0f);
         else ProcessRun(m_states[c], in[c], out[c], count);

@@ -70,6 +70,8 @@ private:
     };
     void Design();
     void ProcessRun(State& state, const float* in, float* out, std::uint64_t count) const noexcept;
+    void ProcessPair(State& left, State& right, const float* const* in, float* const* out,
+                     std::uint64_t count) const noexcept;
 
     std::vector<State> m_states;
     Coefficients m_coefficients;

@@ -42,6 +42,7 @@ public:
 
 private:
     std::vector<float> m_lines;  // channel-major, m_delay samples each
+    std::vector<float> m_scratch;  // m_delay samples
     std::vector<std::uint32_t> m_positions;
     std::uint32_t m_delay = 0;
 };

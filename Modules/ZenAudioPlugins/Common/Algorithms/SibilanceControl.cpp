@@ -3,6 +3,7 @@
 #include <QCoreApplication>
 #include <algorithm>
 #include <cmath>
+#include <limits>
 
 #include "../Decibels.h"
 
@@ -13,6 +14,8 @@ constexpr float kPreparedFloorDb = -50.0f;
 // Per-sample smoothing of the gain, the same at every rate.
 constexpr float kGainSmoothing = 0.08f;
 constexpr float kDenormalGuard = 1e-18f;
+// From here up, adding and taking away the guard leaves a value as it was.
+constexpr float kGuardVanishes = 1e-10f;
 constexpr std::uint32_t kDefaultBlock = 1024;
 
 }  // namespace
@@ -23,6 +26,7 @@ SibilanceControl::SibilanceControl() : ZenAudioAlgorithm(Definitions()) {
     for (std::uint64_t i = 0; i < GetParameterCount(); ++i) SetParameter(i, GetParameter(i));
     m_scratchFrames = kDefaultBlock;
     m_scratch.assign(kMaxChannels * m_scratchFrames, 0.0f);
+    m_gains.assign(m_scratchFrames, 0.0f);
 }
 
 const zen::ParameterTableDefinition& SibilanceControl::Definitions() {
@@ -69,6 +73,7 @@ bool SibilanceControl::Prepare(float sampleRate, std::uint32_t maxBlock) {
     }
     m_scratchFrames = std::max<std::uint64_t>(maxBlock, 1);
     m_scratch.assign(kMaxChannels * m_scratchFrames, 0.0f);
+    m_gains.assign(m_scratchFrames, 0.0f);
     ZenAudioAlgorithm::Prepare(sampleRate, maxBlock);
     Reset();
     return true;
@@ -148,21 +153,39 @@ void SibilanceControl::ProcessPiece(float* const* channels, std::uint64_t channe
             if (!std::isfinite(filtered[c][n])) filtered[c][n] = channels[c][n];
     }
     const float listen = m_listen / m_bandGain;
+    float* gains = m_gains.data();
+    float smoothed = m_gain;
+    // The gain of the last value of S, kept while S stands still.
+    float lastSmoothed = std::numeric_limits<float>::quiet_NaN(), gain = 0.0f;
     for (std::uint64_t n = 0; n < count; ++n) {
+        // The linked peaks gathered in registers, without a branch per
+        // channel; NaN never wins, as in Feed.
+        float inputPeak = zen::kDetectorFloor, bandPeak = zen::kDetectorFloor;
         for (std::uint64_t c = 0; c < channelCount; ++c) {
-            m_inputLevel.Feed(channels[c][n]);
-            m_bandLevel.Feed(filtered[c][n]);
+            const float x = std::fabs(channels[c][n]), f = std::fabs(filtered[c][n]);
+            inputPeak = x > inputPeak ? x : inputPeak;
+            bandPeak = f > bandPeak ? f : bandPeak;
         }
+        m_inputLevel.Feed(inputPeak);
+        m_bandLevel.Feed(bandPeak);
         const float input = m_inputLevel.Update();
         const float band = m_bandLevel.Update();
-        m_gain = (kGainSmoothing * (input - band) + (1.0f - kGainSmoothing) * m_gain + kDenormalGuard) - kDenormalGuard;
-        const float gain = zen::LogUnitsToGain(m_gain) * m_dry;
-        if (m_listen == 0.0f) {
-            for (std::uint64_t c = 0; c < channelCount; ++c) channels[c][n] *= gain;
-        } else {
-            for (std::uint64_t c = 0; c < channelCount; ++c)
-                channels[c][n] = channels[c][n] * gain + filtered[c][n] * listen;
+        const float next = kGainSmoothing * (input - band) + (1.0f - kGainSmoothing) * smoothed;
+        // The guard changes only values too small for it to vanish in.
+        smoothed = std::fabs(next) >= kGuardVanishes ? next : (next + kDenormalGuard) - kDenormalGuard;
+        if (smoothed != lastSmoothed) {
+            lastSmoothed = smoothed;
+            gain = zen::LogUnitsToGain(smoothed) * m_dry;
         }
+        gains[n] = gain;
+    }
+    m_gain = smoothed;
+    if (m_listen == 0.0f) {
+        for (std::uint64_t c = 0; c < channelCount; ++c) m_vec.Multiply(channels[c], gains, channels[c], count);
+    } else {
+        for (std::uint64_t c = 0; c < channelCount; ++c)
+            for (std::uint64_t n = 0; n < count; ++n)
+                channels[c][n] = channels[c][n] * gains[n] + filtered[c][n] * listen;
     }
 }
 

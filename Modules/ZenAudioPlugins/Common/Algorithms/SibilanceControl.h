@@ -13,6 +13,7 @@
 #include <vector>
 
 #include "../ZenAudioAlgorithm.h"
+#include "Algorithms/Vec.h"
 #include "BiQuad.h"
 #include "LevelTracker.h"
 
@@ -61,6 +62,8 @@ private:
     LevelTracker m_bandLevel;
     std::vector<float> m_scratch;  // the filtered copy, kMaxChannels x m_scratchFrames
     std::uint64_t m_scratchFrames = 0;
+    std::vector<float> m_gains;  // per sample of a piece
+    ora::numeric::Vec m_vec;
     float m_gain = 0.0f;  // S, log units
     float m_dry = 1.0f;
     float m_listen = 0.0f;

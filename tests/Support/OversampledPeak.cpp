@@ -1,4 +1,4 @@
-#include "OversampledPeak.h"
+#include "Support/OversampledPeak.h"
 
 #include <algorithm>
 #include <cmath>
