@@ -60,8 +60,7 @@ std::string Fault(const FieldSchema& f, const SettingValue& v) {
             break;
         case FieldType::Number: break;
     }
-    if (!std::isfinite(v.number) || v.number < f.minimum || v.number > f.maximum)
-        return "is out of range " + DescribeRange(f);
+    if (!std::isfinite(v.number) || v.number < f.minimum || v.number > f.maximum) return "must be " + DescribeRange(f);
     return {};
 }
 
