@@ -185,6 +185,7 @@ int RunControl(PluginLibrary& library, const ControlOptions& options) {
                 throw ZenfxError("'" + assignment + "' is not KEY=VALUE", kExitUsage);
             document.Set(assignment.substr(0, equals), assignment.substr(equals + 1));
         }
+        document.Check();
         session.Store(document);
     } else if (options.action == "run") {
         if (session.Name() == "Test Tones Settings") return RunTones(session, options);

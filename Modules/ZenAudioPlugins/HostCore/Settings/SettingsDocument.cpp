@@ -269,7 +269,6 @@ void SettingsDocument::Set(const std::string& key, const std::string& value) {
                     throw HostError(key + ": give a setting (" + key + ".NAME=VALUE)" +
                                     (section.IsList() ? " or '" + std::string(kRemove) + "'" : ""));
                 changed.RemoveRecord(s, record);
-                changed.Check();
                 *this = std::move(changed);
                 return;
             }
@@ -288,7 +287,6 @@ void SettingsDocument::Set(const std::string& key, const std::string& value) {
                             (f.type == FieldType::Choice ? DescribeRange(f) : "a value in " + DescribeRange(f)));
         if (f.type == FieldType::Text) changed.SetText(s, record, static_cast<std::size_t>(field), parsed.text);
         else changed.SetNumber(s, record, static_cast<std::size_t>(field), parsed.number);
-        changed.Check();
         *this = std::move(changed);
         return;
     }

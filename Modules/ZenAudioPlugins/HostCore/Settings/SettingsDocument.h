@@ -53,8 +53,9 @@ public:
     // A field by key from text as a user types it: "-3", "-3 dB", "2.5kHz",
     // "bell". In a list, the key of the record after the last adds a record
     // ("binding4.type=osc" with three bindings) and "binding2=remove"
-    // removes one. The schema's check runs after the change. Throws
-    // HostError; the document is unchanged then.
+    // removes one. Throws HostError for a key or value the fields cannot
+    // take; the document is unchanged then. Faults across fields are left to
+    // Check, after the last change (a new binding needs several).
     void Set(const std::string& key, const std::string& value);
     // "-3 dB", "bell", the text itself.
     std::string Format(std::size_t section, std::size_t record, std::size_t field) const;
