@@ -67,10 +67,10 @@ StudioModel::Channel& StudioModel::ChannelAt(std::size_t channel) {
 
 StudioModel::Slot& StudioModel::SlotAt(std::size_t channel, std::size_t slot) {
     Channel& c = ChannelAt(channel);
-    if (slot >= c.slots.size())
+    if (slot >= c.chain.size())
         throw HostError("channel '" + c.name + "' has no slot " + std::to_string(slot) + " (it has " +
-                        std::to_string(c.slots.size()) + ")");
-    return c.slots[slot];
+                        std::to_string(c.chain.size()) + ")");
+    return c.chain[slot];
 }
 
 AudioPlugin& StudioModel::PluginAt(std::size_t channel, std::size_t slot) { return *SlotAt(channel, slot).audio; }
@@ -96,36 +96,38 @@ void StudioModel::Configure(const Channel& channel, Slot& slot) const {
 
 std::size_t StudioModel::InsertPlugin(std::size_t channel, const std::string& plugin, std::size_t slot) {
     Channel& c = ChannelAt(channel);
-    if (slot != kAppend && slot > c.slots.size())
+    if (slot != kAppend && slot > c.chain.size())
         throw HostError("channel '" + c.name + "' has no slot " + std::to_string(slot));
     Slot s;
     s.key = FindKey(plugin);
-    // The instance learns its channel from the services it is created with.
+    // The instance learns its channel from the services it is created with
+    // and keeps them; the interface's own pointer must not outlive the model.
     m_library.SetHostServices(c.services->Services());
     s.instance.reset(m_library.CreatePlugin(zen::kAudioPluginKind, s.key));
+    m_library.SetHostServices(nullptr);
     s.audio = zen::InterfaceCast<AudioPlugin>(s.instance.get());
     if (s.audio == nullptr || s.instance->GetDescriptor() == nullptr)
         throw HostError("the library could not create '" + plugin + "'");
     s.name = s.instance->GetName();
     Configure(c, s);
-    const std::size_t at = slot == kAppend ? c.slots.size() : slot;
-    c.slots.insert(c.slots.begin() + static_cast<std::ptrdiff_t>(at), std::move(s));
+    const std::size_t at = slot == kAppend ? c.chain.size() : slot;
+    c.chain.insert(c.chain.begin() + static_cast<std::ptrdiff_t>(at), std::move(s));
     return at;
 }
 
 void StudioModel::RemovePlugin(std::size_t channel, std::size_t slot) {
     SlotAt(channel, slot);
-    auto& slots = ChannelAt(channel).slots;
-    slots.erase(slots.begin() + static_cast<std::ptrdiff_t>(slot));
+    auto& chain = ChannelAt(channel).chain;
+    chain.erase(chain.begin() + static_cast<std::ptrdiff_t>(slot));
 }
 
 void StudioModel::MovePlugin(std::size_t channel, std::size_t from, std::size_t to) {
     SlotAt(channel, from);
     SlotAt(channel, to);
-    auto& slots = ChannelAt(channel).slots;
-    Slot moving = std::move(slots[from]);
-    slots.erase(slots.begin() + static_cast<std::ptrdiff_t>(from));
-    slots.insert(slots.begin() + static_cast<std::ptrdiff_t>(to), std::move(moving));
+    auto& chain = ChannelAt(channel).chain;
+    Slot moving = std::move(chain[from]);
+    chain.erase(chain.begin() + static_cast<std::ptrdiff_t>(from));
+    chain.insert(chain.begin() + static_cast<std::ptrdiff_t>(to), std::move(moving));
 }
 
 void StudioModel::SetBypass(std::size_t channel, std::size_t slot, bool bypassed) {
@@ -137,7 +139,7 @@ void StudioModel::Prepare(int sampleRate, std::uint32_t maxBlock) {
     m_sampleRate = sampleRate;
     m_maxBlock = maxBlock;
     for (auto& channel : m_channels)
-        for (Slot& slot : channel->slots)
+        for (Slot& slot : channel->chain)
             if (!slot.audio->Prepare(static_cast<float>(sampleRate), maxBlock))
                 throw HostError("'" + slot.name + "' cannot run at " + std::to_string(sampleRate) + " Hz in blocks of " +
                                 std::to_string(maxBlock));
@@ -147,13 +149,13 @@ void StudioModel::Prepare(int sampleRate, std::uint32_t maxBlock) {
 bool StudioModel::Process(std::size_t channel, float* const* buffers, std::uint64_t frames) noexcept {
     if (!m_prepared || channel >= m_channels.size()) return false;
     bool ok = true;
-    for (Slot& slot : m_channels[channel]->slots) ok = slot.audio->Process(buffers, frames) && ok;
+    for (Slot& slot : m_channels[channel]->chain) ok = slot.audio->Process(buffers, frames) && ok;
     return ok;
 }
 
 std::uint64_t StudioModel::Latency(std::size_t channel) const {
     std::uint64_t total = 0;
-    for (const Slot& slot : GetChannel(channel).slots) total += slot.audio->GetLatency();
+    for (const Slot& slot : GetChannel(channel).chain) total += slot.audio->GetLatency();
     return total;
 }
 
@@ -167,7 +169,7 @@ void StudioModel::RegisterActions() {
     m_actions.Register("LoadPlugin", 1, 2, [this, callerChannel](const ActionCall& call, std::string& result) {
         const std::size_t slot = call.arguments.size() > 1 ? ParseIndex(call.arguments[1], "slot") : kAppend;
         const std::size_t channel = callerChannel(call);
-        result = std::to_string(InsertPlugin(channel, call.arguments[0], std::min(slot, ChannelAt(channel).slots.size())));
+        result = std::to_string(InsertPlugin(channel, call.arguments[0], std::min(slot, ChannelAt(channel).chain.size())));
         return true;
     });
     // (slot, parameter, value in tenths): the decimal text of the value times ten.

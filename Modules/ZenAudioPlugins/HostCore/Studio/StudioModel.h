@@ -33,8 +33,9 @@ public:
     struct Channel {
         std::string name;
         std::uint32_t audioChannels = 2;
-        std::vector<Slot> slots;
+        // Before the chain, so it outlives the instances that hold it.
         std::unique_ptr<ActionServices> services;
+        std::vector<Slot> chain;  // not "slots": a toolkit keyword
     };
 
     explicit StudioModel(zen::PluginInterface& library, std::int64_t sessionId = 0);
