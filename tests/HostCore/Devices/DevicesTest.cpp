@@ -10,9 +10,11 @@
 #include <vector>
 
 #include "HostCore/Devices/ClockedNullDevice.h"
+#include "HostCore/Devices/DeviceBridge.h"
 #include "HostCore/Devices/FileDevice.h"
 #include "HostCore/Devices/NullDevice.h"
 #include "HostCore/HostError.h"
+#include "HostCore/Settings/Documents/IOInterfaceDocument.h"
 
 using namespace zen::host;
 
@@ -104,4 +106,28 @@ TEST(FileDevice, ReadsTheInputFileAndWritesTheOutputWholeOnlyWhenDone) {
     EXPECT_THROW(FileDevice({}, TempPath("out.mp7"), {}), HostError);
     EXPECT_THROW(FileDevice({}, "/proc/nowhere/out.wav", {}), HostError);
     EXPECT_EQ(FileDevice::OutputFormat("x.FLAC"), SF_FORMAT_FLAC | SF_FORMAT_PCM_24);
+}
+
+TEST(DeviceBridge, OpensTheDeviceOfTheIoDocumentInItsFormat) {
+    SettingsDocument d(IOInterfaceDocument::Schema());
+    d.Set("device", "null");
+    d.Set("sampleRate", "96000");
+    d.Set("blockSize", "128");
+    d.Set("inputs", "0");
+    d.Set("outputs", "6");
+    d.Set("output3.source", "0");
+    const auto io = IOInterfaceDocument::Read(d);
+    EXPECT_EQ(io.outputRouting[2], 0);
+    EXPECT_EQ(io.outputRouting[3], 4);  // one to one unless changed
+    const auto device = DeviceBridge::Open(io);
+    EXPECT_EQ(device->Name(), "null");
+    EXPECT_EQ(device->Format().sampleRate, 96000);
+    EXPECT_EQ(device->Format().blockSize, 128u);
+    EXPECT_EQ(device->Format().outputs, 6u);
+
+    d.Set("device", "file");
+    d.Set("outputFile", TempPath("bridge.wav"));
+    EXPECT_EQ(DeviceBridge::Open(IOInterfaceDocument::Read(d))->Name(), "file");
+    d.Set("inputFile", TempPath("no-such-input.wav"));
+    EXPECT_THROW(DeviceBridge::Open(IOInterfaceDocument::Read(d)), HostError);
 }

@@ -3,7 +3,9 @@
 // bus channels to device outputs.
 #pragma once
 
+#include <array>
 #include <cstddef>
+#include <string>
 
 #include "HostCore/Settings/SettingsDocument.h"
 
@@ -19,7 +21,20 @@ public:
     enum InputField : std::size_t { kInputChannel };    // studio channel, 0 = not routed
     enum OutputField : std::size_t { kOutputSource };   // bus channel, 0 = silent
 
+    struct Interface {
+        Device device = kClockedNullDevice;
+        int sampleRate = 48000;
+        int blockSize = 512;
+        int inputs = 2;
+        int outputs = 2;
+        std::string inputFile;
+        std::string outputFile;
+        std::array<int, kMaximumChannels> inputRouting{};   // device input -> studio channel, 0 = none
+        std::array<int, kMaximumChannels> outputRouting{};  // device output <- bus channel, 0 = silent
+    };
+
     static const DocumentSchema& Schema();
+    static Interface Read(const SettingsDocument& document);
 };
 
 }  // namespace zen::host
