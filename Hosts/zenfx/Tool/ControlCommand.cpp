@@ -159,19 +159,28 @@ int RunControl(PluginLibrary& library, const ControlOptions& options) {
     if (options.action == "list") {
         nlohmann::json rows = nlohmann::json::array();
         for (const auto& [name, entry] : library.Interface().GetPluginList(zen::kControlPluginKind)) {
-            ControlSession session(library, name, options.configFolder);
-            const nlohmann::json row = Describe(session, session.Document());
-            rows.push_back({{"name", row["name"]}, {"document", row["document"]}, {"file", row["file"]},
-                            {"stored", row["stored"]}, {"parameters", row["parameters"]}});
+            try {
+                ControlSession session(library, name, options.configFolder);
+                const nlohmann::json row = Describe(session, session.Document());
+                rows.push_back({{"name", row["name"]}, {"document", row["document"]}, {"file", row["file"]},
+                                {"stored", row["stored"]}, {"parameters", row["parameters"]}});
+            } catch (const std::exception& e) {  // one broken document does not hide the others
+                rows.push_back({{"name", name}, {"error", e.what()}});
+            }
         }
         if (options.json) {
             std::cout << rows.dump(2) << "\n";
             return 0;
         }
-        for (const auto& row : rows)
+        for (const auto& row : rows) {
+            if (row.contains("error")) {
+                std::printf("  %-26s %s\n", row["name"].get<std::string>().c_str(), row["error"].get<std::string>().c_str());
+                continue;
+            }
             std::printf("  %-26s %-22s %4u parameters  %s%s\n", row["name"].get<std::string>().c_str(),
                         row["document"].get<std::string>().c_str(), row["parameters"].get<unsigned>(),
                         row["file"].get<std::string>().c_str(), row["stored"].get<bool>() ? "" : " (not yet written)");
+        }
         return 0;
     }
 
