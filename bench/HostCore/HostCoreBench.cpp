@@ -16,9 +16,9 @@ BENCHMARK_CAPTURE(BM_Defaults, DeEsser, "De-Esser");
 static void BM_BChainProcessor_12Channels48k(benchmark::State& state) {
     constexpr std::size_t kChannels = 12;
     std::vector<BChainProcessor::Channel> settings(kChannels);
-    const zen::host::BChainDocument::Shape shapes[] = {zen::host::BChainDocument::kHighPass,
-                                                       zen::host::BChainDocument::kBell, zen::host::BChainDocument::kBell,
-                                                       zen::host::BChainDocument::kHighShelf};
+    const zen::host::BChainDocument::Shape shapes[] = {
+        zen::host::BChainDocument::kHighPass, zen::host::BChainDocument::kBell, zen::host::BChainDocument::kBell,
+        zen::host::BChainDocument::kHighShelf};
     for (std::size_t c = 0; c < kChannels; ++c) {
         settings[c].delayMs = 0.37 * static_cast<double>(c);
         settings[c].gainDb = -1.5;

@@ -28,8 +28,7 @@ using zen::host::SettingsDocument;
 // One control plug-in and the stored document behind it.
 class ControlSession {
 public:
-    ControlSession(PluginLibrary& library, const std::string& name, const std::string& folder)
-        : m_store(folder) {
+    ControlSession(PluginLibrary& library, const std::string& name, const std::string& folder) : m_store(folder) {
         std::vector<std::string> names;
         for (const auto& [key, entry] : library.Interface().GetPluginList(zen::kControlPluginKind)) {
             if (EqualsIgnoreCase(key, name)) m_name = key;
@@ -93,15 +92,20 @@ void ForEachSetting(const SettingsDocument& d, Visit visit) {
 
 nlohmann::json Describe(ControlSession& session, const SettingsDocument& d) {
     nlohmann::json settings = nlohmann::json::object();
-    ForEachSetting(d, [&](std::size_t s, std::size_t r, std::size_t f) { settings[d.Key(s, r, f)] = SettingJson(d, s, r, f); });
-    return {{"name", session.Name()},         {"document", d.Schema().root},
-            {"file", session.Path()},         {"stored", session.Stored()},
-            {"parameters", session.Control().GetParameterCount()}, {"settings", settings}};
+    ForEachSetting(
+        d, [&](std::size_t s, std::size_t r, std::size_t f) { settings[d.Key(s, r, f)] = SettingJson(d, s, r, f); });
+    return {{"name", session.Name()},
+            {"document", d.Schema().root},
+            {"file", session.Path()},
+            {"stored", session.Stored()},
+            {"parameters", session.Control().GetParameterCount()},
+            {"settings", settings}};
 }
 
 void PrintSettings(const SettingsDocument& d) {
     std::size_t width = 0;
-    ForEachSetting(d, [&](std::size_t s, std::size_t r, std::size_t f) { width = std::max(width, d.Key(s, r, f).size()); });
+    ForEachSetting(
+        d, [&](std::size_t s, std::size_t r, std::size_t f) { width = std::max(width, d.Key(s, r, f).size()); });
     ForEachSetting(d, [&](std::size_t s, std::size_t r, std::size_t f) {
         std::printf("  %-*s  %s\n", static_cast<int>(width), d.Key(s, r, f).c_str(), d.Format(s, r, f).c_str());
     });
@@ -130,24 +134,34 @@ int RunPerformance(PluginLibrary& library, ControlSession& session, const Contro
     const auto run = zen::host::PerformanceDocument::Read(session.Document());
     if (!options.json)
         std::printf("%d Hz, blocks of %d, %d channels, %.1f s of audio per plug-in\n  %-24s %-8s %12s %10s\n",
-                    run.sampleRate, run.blockSize, run.channels, run.duration, "PLUG-IN", "CHANNELS", "REALTIME", "CPU LOAD");
+                    run.sampleRate, run.blockSize, run.channels, run.duration, "PLUG-IN", "CHANNELS", "REALTIME",
+                    "CPU LOAD");
     const auto results = zen::host::PerformanceRun::Run(library.Interface(), run, [&](const auto& r) {
         if (options.json) return;
-        if (!r.error.empty()) std::printf("  %-24s %s\n", r.name.c_str(), r.error.c_str());
-        else std::printf("  %-24s %-8u %11.1fx %9.2f%%\n", r.name.c_str(), r.channels, r.realtimeFactor, r.cpuLoad);
+        if (!r.error.empty())
+            std::printf("  %-24s %s\n", r.name.c_str(), r.error.c_str());
+        else
+            std::printf("  %-24s %-8u %11.1fx %9.2f%%\n", r.name.c_str(), r.channels, r.realtimeFactor, r.cpuLoad);
         std::fflush(stdout);
     });
     if (!options.json) return 0;
     nlohmann::json rows = nlohmann::json::array();
     for (const auto& r : results) {
-        nlohmann::json row = {{"name", r.name},         {"key", r.key},          {"channels", r.channels},
-                              {"realtime", r.realtimeFactor}, {"cpuLoad", r.cpuLoad}, {"audioSeconds", r.audioSeconds},
+        nlohmann::json row = {{"name", r.name},
+                              {"key", r.key},
+                              {"channels", r.channels},
+                              {"realtime", r.realtimeFactor},
+                              {"cpuLoad", r.cpuLoad},
+                              {"audioSeconds", r.audioSeconds},
                               {"cpuSeconds", r.cpuSeconds}};
         if (!r.error.empty()) row["error"] = r.error;
         rows.push_back(row);
     }
-    std::cout << nlohmann::json{{"sampleRate", run.sampleRate}, {"blockSize", run.blockSize}, {"channels", run.channels},
-                                {"duration", run.duration}, {"plugins", rows}}
+    std::cout << nlohmann::json{{"sampleRate", run.sampleRate},
+                                {"blockSize", run.blockSize},
+                                {"channels", run.channels},
+                                {"duration", run.duration},
+                                {"plugins", rows}}
                      .dump(2)
               << "\n";
     return 0;
@@ -162,8 +176,11 @@ int RunControl(PluginLibrary& library, const ControlOptions& options) {
             try {
                 ControlSession session(library, name, options.configFolder);
                 const nlohmann::json row = Describe(session, session.Document());
-                rows.push_back({{"name", row["name"]}, {"document", row["document"]}, {"file", row["file"]},
-                                {"stored", row["stored"]}, {"parameters", row["parameters"]}});
+                rows.push_back({{"name", row["name"]},
+                                {"document", row["document"]},
+                                {"file", row["file"]},
+                                {"stored", row["stored"]},
+                                {"parameters", row["parameters"]}});
             } catch (const std::exception& e) {  // one broken document does not hide the others
                 rows.push_back({{"name", name}, {"error", e.what()}});
             }
@@ -174,7 +191,8 @@ int RunControl(PluginLibrary& library, const ControlOptions& options) {
         }
         for (const auto& row : rows) {
             if (row.contains("error")) {
-                std::printf("  %-26s %s\n", row["name"].get<std::string>().c_str(), row["error"].get<std::string>().c_str());
+                std::printf("  %-26s %s\n", row["name"].get<std::string>().c_str(),
+                            row["error"].get<std::string>().c_str());
                 continue;
             }
             std::printf("  %-26s %-22s %4u parameters  %s%s\n", row["name"].get<std::string>().c_str(),

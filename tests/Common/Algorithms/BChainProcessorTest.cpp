@@ -29,7 +29,8 @@ TEST(BChainProcessor, DelaysAreSampleExactAndGainAndPolarityAreExact) {
     settings[1].delayMs = 10.0 / 48.0;  // ten samples at 48 kHz
     settings[1].inverted = true;
     settings[1].gainDb = 3.0;
-    for (const auto& [rate, first, second] : {std::tuple{48000.0f, 120u, 10u}, {44100.0f, 110u, 9u}, {96000.0f, 240u, 20u}}) {
+    for (const auto& [rate, first, second] :
+         {std::tuple{48000.0f, 120u, 10u}, {44100.0f, 110u, 9u}, {96000.0f, 240u, 20u}}) {
         BChainProcessor chain;
         chain.SetChannelCount(3);
         chain.Prepare(rate, 256);

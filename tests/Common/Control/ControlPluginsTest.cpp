@@ -20,8 +20,8 @@ using zen::host::SettingsDocument;
 
 namespace {
 
-const char* const kControlPlugins[] = {"B-Chain Control",         "I/O Interface Settings", "Test Tones Settings",
-                                       "Performance Testing",     "Remote Control Settings", "TalkbackSettings"};
+const char* const kControlPlugins[] = {"B-Chain Control",     "I/O Interface Settings",  "Test Tones Settings",
+                                       "Performance Testing", "Remote Control Settings", "TalkbackSettings"};
 
 std::unique_ptr<zen::PluginInstance> Create(const std::string& name) {
     return std::unique_ptr<zen::PluginInstance>(GetZenPluginInterface()->CreatePlugin(zen::kControlPluginKind, name));
@@ -106,9 +106,9 @@ TEST(ControlPlugins, ParametersAreTheNumericSettingsAndRefusedStateChangesNothin
     EXPECT_EQ(d.Number(B::kChannelSection, 1, B::BandField(3, B::kBandFrequency)), 20000.0);
 
     const std::string before = control.SaveState();
-    for (const std::string& bad : {std::string("{\"parameters\": {}}"), before.substr(0, before.size() / 2),
-                                  std::string("<BChainSettings><Channel number=\"17\"/></BChainSettings>"),
-                                  std::string("<TalkbackSettings/>")})
+    for (const std::string& bad :
+         {std::string("{\"parameters\": {}}"), before.substr(0, before.size() / 2),
+          std::string("<BChainSettings><Channel number=\"17\"/></BChainSettings>"), std::string("<TalkbackSettings/>")})
         EXPECT_FALSE(control.LoadState(bad)) << bad;
     EXPECT_EQ(control.SaveState(), before);
 

@@ -13,7 +13,8 @@ using zen::host::FieldType;
 
 std::string RandomText(const zen::host::FieldSchema& f, std::mt19937& random) {
     static const char* const kPieces[] = {"a", "Z", "7", " ", "&", "<", ">", "\"", "'", "/", "é", "ß", "€", "-", "_"};
-    const std::size_t length = std::uniform_int_distribution<std::size_t>(0, std::min<std::size_t>(f.maximumLength / 2, 24))(random);
+    const std::size_t length =
+        std::uniform_int_distribution<std::size_t>(0, std::min<std::size_t>(f.maximumLength / 2, 24))(random);
     std::string text;
     while (text.size() < length) text += kPieces[random() % (sizeof(kPieces) / sizeof(kPieces[0]))];
     return text;
@@ -53,7 +54,9 @@ zen::host::SettingsDocument RandomDocument(const zen::host::DocumentSchema& sche
                     } else if (field.type == FieldType::Number) {
                         d.SetNumber(s, r, f, RandomNumber(field, random));
                     } else {
-                        d.SetNumber(s, r, f, std::floor(std::uniform_real_distribution<double>(field.minimum, field.maximum + 1.0)(random)));
+                        d.SetNumber(s, r, f,
+                                    std::floor(std::uniform_real_distribution<double>(field.minimum,
+                                                                                      field.maximum + 1.0)(random)));
                     }
                 }
         }

@@ -45,7 +45,8 @@ TEST(SettingsDocument, RandomValidDocumentsOfEverySchemaRoundTripUnchanged) {
             ASSERT_EQ(read, original) << schema->root << ":\n" << xml;
             ASSERT_EQ(read.ToXml(), xml);
         }
-        EXPECT_EQ(SettingsDocument::Parse(*schema, SettingsDocument(*schema).ToXml(), "doc.xml"), SettingsDocument(*schema));
+        EXPECT_EQ(SettingsDocument::Parse(*schema, SettingsDocument(*schema).ToXml(), "doc.xml"),
+                  SettingsDocument(*schema));
     }
 }
 
@@ -59,12 +60,14 @@ TEST(SettingsDocument, LeftOutAttributesTakeTheirDefaultsAndListsAreTheDocuments
     ASSERT_EQ(d.RecordCount(zen::host::TalkbackDocument::kDestinationSection), 1u);
     // Array records by number, in any order; the rest keep their defaults.
     const auto& bchain = zen::host::BChainDocument::Schema();
-    const SettingsDocument b = SettingsDocument::Parse(
-        bchain, "<BChainSettings><Channel number=\"3\" gain=\"-2.5\"/><Channel number=\"1\" polarity=\"inverted\"/></BChainSettings>",
-        "b.xml");
+    const SettingsDocument b = SettingsDocument::Parse(bchain,
+                                                       "<BChainSettings><Channel number=\"3\" gain=\"-2.5\"/><Channel "
+                                                       "number=\"1\" polarity=\"inverted\"/></BChainSettings>",
+                                                       "b.xml");
     EXPECT_EQ(b.Number(0, 2, zen::host::BChainDocument::kGain), -2.5);
     EXPECT_EQ(b.Format(0, 0, zen::host::BChainDocument::kPolarity), "inverted");
-    EXPECT_EQ(b.Number(0, 1, zen::host::BChainDocument::BandField(2, zen::host::BChainDocument::kBandFrequency)), 2000.0);
+    EXPECT_EQ(b.Number(0, 1, zen::host::BChainDocument::BandField(2, zen::host::BChainDocument::kBandFrequency)),
+              2000.0);
 }
 
 TEST(SettingsDocument, BadDocumentsAreRefusedWithOneLineNamingThePlace) {
@@ -119,7 +122,8 @@ TEST(SettingsDocument, EveryDocumentedSettingRefusesValuesOutsideItsRange) {
                 const zen::host::FieldSchema& field = schema->sections[s].fields[f];
                 const std::string key = d.Key(s, 0, f);
                 if (field.type == zen::host::FieldType::Text) {
-                    EXPECT_THROW(d.SetText(s, 0, f, std::string(field.maximumLength + 1, 'a')), zen::host::HostError) << key;
+                    EXPECT_THROW(d.SetText(s, 0, f, std::string(field.maximumLength + 1, 'a')), zen::host::HostError)
+                        << key;
                     EXPECT_THROW(d.SetText(s, 0, f, "line\nbreak"), zen::host::HostError) << key;
                     continue;
                 }

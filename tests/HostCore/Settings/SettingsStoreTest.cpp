@@ -48,12 +48,16 @@ struct ScopedEnv {
     bool had;
     ScopedEnv(const char* n, const char* value) : name(n), had(std::getenv(n) != nullptr) {
         if (had) old = std::getenv(n);
-        if (value) setenv(n, value, 1);
-        else unsetenv(n);
+        if (value)
+            setenv(n, value, 1);
+        else
+            unsetenv(n);
     }
     ~ScopedEnv() {
-        if (had) setenv(name.c_str(), old.c_str(), 1);
-        else unsetenv(name.c_str());
+        if (had)
+            setenv(name.c_str(), old.c_str(), 1);
+        else
+            unsetenv(name.c_str());
     }
 };
 
@@ -83,7 +87,7 @@ TEST(SettingsStore, WritesCreateTheFolderAndARefusedDocumentLeavesTheOldOne) {
     EXPECT_EQ(store.Load(schema), d);
     const std::string stored = ReadFile(store.PathOf(schema));
     for (const std::string& bad : {std::string("<TalkbackSettings><Talkback dim=\"5\"/></TalkbackSettings>"),
-                                  d.ToXml().substr(0, 60), std::string("<BChainSettings/>")}) {
+                                   d.ToXml().substr(0, 60), std::string("<BChainSettings/>")}) {
         EXPECT_THROW(store.Write(schema, bad), zen::host::HostError);
         EXPECT_EQ(ReadFile(store.PathOf(schema)), stored);
     }

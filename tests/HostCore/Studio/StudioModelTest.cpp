@@ -15,8 +15,9 @@ namespace {
 bool Call(StudioModel& studio, std::size_t channel, const char* action, std::vector<const char*> arguments,
           std::string* result = nullptr) {
     char buffer[256] = {};
-    const bool ok = ActionServices::CallAction(studio.GetChannel(channel).services->Services(), action, arguments.data(),
-                                               static_cast<std::uint32_t>(arguments.size()), buffer, sizeof(buffer));
+    const bool ok =
+        ActionServices::CallAction(studio.GetChannel(channel).services->Services(), action, arguments.data(),
+                                   static_cast<std::uint32_t>(arguments.size()), buffer, sizeof(buffer));
     if (result) *result = buffer;
     return ok;
 }

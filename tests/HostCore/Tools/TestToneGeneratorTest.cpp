@@ -59,7 +59,8 @@ void FitSine(const std::vector<float>& x, double frequency, double rate, double&
 }  // namespace
 
 TEST(TestToneGenerator, SineLevelIsExactAndThdPlusNoiseStaysBelowMinus120dB) {
-    for (const auto& [level, frequency, rate] : {std::tuple{-20.0, 1000.0, 48000}, {0.0, 997.0, 44100}, {-60.0, 19000.0, 96000}}) {
+    for (const auto& [level, frequency, rate] :
+         {std::tuple{-20.0, 1000.0, 48000}, {0.0, 997.0, 44100}, {-60.0, 19000.0, 96000}}) {
         OscillatorDocument::Tone tone;
         tone.levelDb = level;
         tone.frequency = frequency;

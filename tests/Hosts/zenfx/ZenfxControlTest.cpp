@@ -50,13 +50,16 @@ TEST(ZenfxControl, ListsTheSixControlPluginsAndTheirDocuments) {
 
 TEST(ZenfxControl, SetChangesTheStoredDocumentWhichShowReads) {
     TempFolder folder;
-    const auto set = RunZenfx(Control(folder, {"set", "b-chain control", "channel2.delay=1.5ms", "channel2.polarity=inverted",
-                                               "channel2.eq1=bell", "channel2.eq1Frequency=2.5kHz"}));
+    const auto set =
+        RunZenfx(Control(folder, {"set", "b-chain control", "channel2.delay=1.5ms", "channel2.polarity=inverted",
+                                  "channel2.eq1=bell", "channel2.eq1Frequency=2.5kHz"}));
     ASSERT_EQ(set.exitCode, 0) << set.err;
     EXPECT_NE(set.out.find("channel2.eq1Frequency   2500 Hz\n"), std::string::npos) << set.out;
     const std::string stored = ReadText(folder / "config/BChainSettings.xml");
-    EXPECT_NE(stored.find("<Channel number=\"2\" gain=\"0\" delay=\"1.5\" polarity=\"inverted\" eq1=\"bell\" eq1Frequency=\"2500\""),
-              std::string::npos)
+    EXPECT_NE(
+        stored.find(
+            "<Channel number=\"2\" gain=\"0\" delay=\"1.5\" polarity=\"inverted\" eq1=\"bell\" eq1Frequency=\"2500\""),
+        std::string::npos)
         << stored;
     const auto show = RunZenfx(Control(folder, {"show", "B-Chain Control", "--json"}));
     ASSERT_EQ(show.exitCode, 0) << show.err;
@@ -68,8 +71,9 @@ TEST(ZenfxControl, SetChangesTheStoredDocumentWhichShowReads) {
     EXPECT_EQ(shown["settings"]["channel1.polarity"], "normal");
 
     // Without --config-dir the documents live in the XDG config folder.
-    const auto xdg = zentest::RunProgram(ZENFX_PATH, {"control", "set", "TalkbackSettings", "dim=-30", "destination1.output=2"},
-                                         {"XDG_CONFIG_HOME=" + (folder / "xdg")});
+    const auto xdg =
+        zentest::RunProgram(ZENFX_PATH, {"control", "set", "TalkbackSettings", "dim=-30", "destination1.output=2"},
+                            {"XDG_CONFIG_HOME=" + (folder / "xdg")});
     ASSERT_EQ(xdg.exitCode, 0) << xdg.err;
     EXPECT_NE(ReadText(folder / "xdg/ZenAudioPlugins/TalkbackSettings.xml").find("dim=\"-30\""), std::string::npos);
 }
@@ -86,7 +90,8 @@ TEST(ZenfxControl, BadDocumentsAndSettingsAreRefusedInOneLineAndTheStoredFileSta
     const Case settingMistakes[] = {
         {{"set", "TalkbackSettings", "dim=-70"}, "dim: -70 must be -60 to 0 dB"},
         {{"set", "TalkbackSettings", "dimm=-7"}, "'dimm' is no setting of TalkbackSettings"},
-        {{"set", "TalkbackSettings", "destination1.output=3", "destination2.output=3"}, "Destination 2: output 3 is listed twice"},
+        {{"set", "TalkbackSettings", "destination1.output=3", "destination2.output=3"},
+         "Destination 2: output 3 is listed twice"},
         {{"set", "TalkbackSettings", "mode"}, "'mode' is not KEY=VALUE"},
         {{"show", "Talkback Settings"}, "did you mean 'TalkbackSettings'"},
         {{"run", "TalkbackSettings"}, "has nothing to run"},
@@ -100,9 +105,11 @@ TEST(ZenfxControl, BadDocumentsAndSettingsAreRefusedInOneLineAndTheStoredFileSta
     }
     const std::pair<std::string, std::string> badFiles[] = {
         {good.substr(0, good.size() - 30), path + ":"},
-        {"<TalkbackSettings version=\"1\">\n  <Talkback dim=\"-12\">\n</TalkbackSettings>\n", path + ":3:3: malformed XML"},
+        {"<TalkbackSettings version=\"1\">\n  <Talkback dim=\"-12\">\n</TalkbackSettings>\n",
+         path + ":3:3: malformed XML"},
         {"<TalkbackSettings>\n  <Speaker/>\n</TalkbackSettings>\n", path + ":2:4: unknown element <Speaker>"},
-        {"<TalkbackSettings>\n  <Talkback dim=\"+3\"/>\n</TalkbackSettings>\n", path + ":2:4: Talkback: dim=\"+3\" must be -60 to 0 dB"},
+        {"<TalkbackSettings>\n  <Talkback dim=\"+3\"/>\n</TalkbackSettings>\n",
+         path + ":2:4: Talkback: dim=\"+3\" must be -60 to 0 dB"},
     };
     for (const auto& [text, expected] : badFiles) {
         std::ofstream(path, std::ios::binary | std::ios::trunc) << text;

@@ -5,8 +5,8 @@
 namespace {
 
 // BiQuad's "Shape" for each EQ band shape of the document (off: -1).
-constexpr float kShapes[] = {-1.0f, BiQuad::kBell, BiQuad::kLowShelf, BiQuad::kHighShelf, BiQuad::kLowPass,
-                             BiQuad::kHighPass};
+constexpr float kShapes[] = {
+    -1.0f, BiQuad::kBell, BiQuad::kLowShelf, BiQuad::kHighShelf, BiQuad::kLowPass, BiQuad::kHighPass};
 
 }  // namespace
 

@@ -44,7 +44,7 @@ private:
     struct Strip {
         std::array<std::unique_ptr<BiQuad>, kBands> bands;
         std::unique_ptr<zen::Delay> delay;
-        float gain = 1.0f;  // with the polarity's sign
+        float gain = 1.0f;    // with the polarity's sign
         bool active = false;  // a channel the settings reach
     };
     void Apply(std::size_t channel);

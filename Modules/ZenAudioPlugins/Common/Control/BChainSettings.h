@@ -1,4 +1,5 @@
-// "B-Chain Control": per output channel of the monitor path: gain, sample-exact delay, polarity and a four-band EQ for room tuning.
+// "B-Chain Control": per output channel of the monitor path: gain, sample-exact delay, polarity and a four-band EQ for
+// room tuning.
 #pragma once
 
 #include "ZenSettingsControl.h"

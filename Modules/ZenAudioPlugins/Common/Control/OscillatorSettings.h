@@ -1,4 +1,5 @@
-// "Test Tones Settings": the test signal zenfx renders: sine, pink or white noise or a sweep, its level, frequency and channel.
+// "Test Tones Settings": the test signal zenfx renders: sine, pink or white noise or a sweep, its level, frequency and
+// channel.
 #pragma once
 
 #include "ZenSettingsControl.h"

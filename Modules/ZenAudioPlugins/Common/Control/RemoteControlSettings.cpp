@@ -3,6 +3,7 @@
 #include "Common/ZenControlPlugin.h"
 #include "HostCore/Settings/Documents/RemoteControlDocument.h"
 
-RemoteControlSettings::RemoteControlSettings() : ZenSettingsControl(kClassName, zen::host::RemoteControlDocument::Schema()) {}
+RemoteControlSettings::RemoteControlSettings()
+    : ZenSettingsControl(kClassName, zen::host::RemoteControlDocument::Schema()) {}
 
 template class ZenControlPlugin<RemoteControlSettings>;

@@ -17,14 +17,18 @@ std::string UpperName(const std::string& key) {
     std::string name;
     for (std::size_t i = 0; i < key.size(); ++i) {
         const char c = key[i];
-        if (c == '.') name += '_';
-        else if (std::isupper(static_cast<unsigned char>(c)) && i > 0 && key[i - 1] != '.') name += std::string("_") + c;
-        else name += static_cast<char>(std::toupper(static_cast<unsigned char>(c)));
+        if (c == '.')
+            name += '_';
+        else if (std::isupper(static_cast<unsigned char>(c)) && i > 0 && key[i - 1] != '.')
+            name += std::string("_") + c;
+        else
+            name += static_cast<char>(std::toupper(static_cast<unsigned char>(c)));
     }
     return name;
 }
 
-zen::ParameterDefinition Definition(const zen::host::FieldSchema& f, const std::string& name, const std::string& label) {
+zen::ParameterDefinition Definition(const zen::host::FieldSchema& f, const std::string& name,
+                                    const std::string& label) {
     if (f.type == FieldType::Choice) {
         zen::ParameterDefinition d =
             zen::ListParameter(name.c_str(), label.c_str(), {}, static_cast<float>(f.defaultValue));
@@ -102,7 +106,8 @@ bool ZenSettingsControl::LoadState(const std::string& state) {
         std::lock_guard<std::mutex> lock(m_mutex);
         for (std::size_t i = 0; i < m_table.bindings.size(); ++i) {
             const Binding& b = m_table.bindings[i];
-            SetParameter(static_cast<std::uint32_t>(i), static_cast<float>(document.Number(b.section, b.record, b.field)));
+            SetParameter(static_cast<std::uint32_t>(i),
+                         static_cast<float>(document.Number(b.section, b.record, b.field)));
         }
         m_document = std::move(document);
         return true;

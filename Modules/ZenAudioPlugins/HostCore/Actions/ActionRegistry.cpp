@@ -42,10 +42,10 @@ bool ActionRegistry::Call(const ActionCall& call, std::string& result) const {
         const Entry& entry = it->second;
         const std::size_t count = call.arguments.size();
         if (count < entry.minimumArguments || count > entry.maximumArguments) {
-            const std::string expected = entry.minimumArguments == entry.maximumArguments
-                                             ? std::to_string(entry.minimumArguments)
-                                             : std::to_string(entry.minimumArguments) + " to " +
-                                                   std::to_string(entry.maximumArguments);
+            const std::string expected =
+                entry.minimumArguments == entry.maximumArguments
+                    ? std::to_string(entry.minimumArguments)
+                    : std::to_string(entry.minimumArguments) + " to " + std::to_string(entry.maximumArguments);
             result = "'" + call.action + "' takes " + expected + " argument" +
                      (entry.maximumArguments == 1 ? "" : "s") + ", not " + std::to_string(count);
             return false;

@@ -31,8 +31,7 @@ public:
 
     // False, keeping the first, when the name is taken. The handler is called
     // only with minimumArguments..maximumArguments arguments.
-    bool Register(const std::string& name, std::size_t minimumArguments, std::size_t maximumArguments,
-                  Handler handler);
+    bool Register(const std::string& name, std::size_t minimumArguments, std::size_t maximumArguments, Handler handler);
     bool Unregister(const std::string& name);
 
     bool Contains(const std::string& name) const;

@@ -103,8 +103,10 @@ bool ReadUserValue(const FieldSchema& f, const std::string& text, SettingValue& 
     while (!number.empty() && number.back() == ' ') number.pop_back();
     double scale = 1.0;
     if (!unit.empty()) {
-        if (!f.unit.empty() && EqualsIgnoreCase(unit, "k" + f.unit)) scale = 1000.0;
-        else if (f.unit.empty() || !EqualsIgnoreCase(unit, f.unit)) return false;
+        if (!f.unit.empty() && EqualsIgnoreCase(unit, "k" + f.unit))
+            scale = 1000.0;
+        else if (f.unit.empty() || !EqualsIgnoreCase(unit, f.unit))
+            return false;
     }
     if (!ParseNumber(number, value.number)) return false;
     value.number *= scale;
@@ -114,7 +116,8 @@ bool ReadUserValue(const FieldSchema& f, const std::string& text, SettingValue& 
 // "line:column" of a byte offset.
 std::string Place(const std::string& source, const std::string& xml, std::ptrdiff_t offset) {
     std::size_t line = 1, column = 1;
-    const auto end = static_cast<std::size_t>(std::max<std::ptrdiff_t>(0, std::min<std::ptrdiff_t>(offset, static_cast<std::ptrdiff_t>(xml.size()))));
+    const auto end = static_cast<std::size_t>(
+        std::max<std::ptrdiff_t>(0, std::min<std::ptrdiff_t>(offset, static_cast<std::ptrdiff_t>(xml.size()))));
     for (std::size_t i = 0; i < end; ++i) {
         if (xml[i] == '\n') {
             ++line;
@@ -285,8 +288,10 @@ void SettingsDocument::Set(const std::string& key, const std::string& value) {
         if (!ReadUserValue(f, value, parsed))
             throw HostError(changed.Key(s, record, static_cast<std::size_t>(field)) + ": '" + value + "' is not " +
                             (f.type == FieldType::Choice ? DescribeRange(f) : "a value in " + DescribeRange(f)));
-        if (f.type == FieldType::Text) changed.SetText(s, record, static_cast<std::size_t>(field), parsed.text);
-        else changed.SetNumber(s, record, static_cast<std::size_t>(field), parsed.number);
+        if (f.type == FieldType::Text)
+            changed.SetText(s, record, static_cast<std::size_t>(field), parsed.text);
+        else
+            changed.SetNumber(s, record, static_cast<std::size_t>(field), parsed.number);
         *this = std::move(changed);
         return;
     }
@@ -321,10 +326,11 @@ SettingsDocument SettingsDocument::Parse(const DocumentSchema& schema, const std
         throw fail(root.offset_debug(), std::string("<") + root.name() + "> is not a " + schema.root + " document");
     for (pugi::xml_attribute a : root.attributes()) {
         if (std::string(a.name()) != kVersionAttribute)
-            throw fail(root.offset_debug(), std::string("unknown attribute '") + a.name() + "' of <" + schema.root + ">");
+            throw fail(root.offset_debug(),
+                       std::string("unknown attribute '") + a.name() + "' of <" + schema.root + ">");
         if (std::string(a.value()) != std::to_string(schema.version))
-            throw fail(root.offset_debug(), std::string("version ") + a.value() + " is not " +
-                                                std::to_string(schema.version));
+            throw fail(root.offset_debug(),
+                       std::string("version ") + a.value() + " is not " + std::to_string(schema.version));
     }
 
     SettingsDocument document(schema);
@@ -343,14 +349,16 @@ SettingsDocument SettingsDocument::Parse(const DocumentSchema& schema, const std
         const std::string name = node.name();
         std::size_t s = 0;
         while (s < schema.sections.size() && schema.sections[s].element != name) ++s;
-        if (s == schema.sections.size()) throw fail(node.offset_debug(), "unknown element <" + name + "> in <" + schema.root + ">");
+        if (s == schema.sections.size())
+            throw fail(node.offset_debug(), "unknown element <" + name + "> in <" + schema.root + ">");
         const SectionSchema& section = schema.sections[s];
         if (node.first_child()) throw fail(node.first_child().offset_debug(), "<" + name + "> takes no content");
 
         std::size_t record = 0;
         if (section.IsList()) {
             if (document.m_sections[s].size() == section.maximumCount)
-                throw fail(node.offset_debug(), "more than " + std::to_string(section.maximumCount) + " <" + name + "> elements");
+                throw fail(node.offset_debug(),
+                           "more than " + std::to_string(section.maximumCount) + " <" + name + "> elements");
             record = document.m_sections[s].size();
             document.m_sections[s].push_back(document.DefaultRecord(s));
             offsets[s].push_back(node.offset_debug());
@@ -359,13 +367,14 @@ SettingsDocument SettingsDocument::Parse(const DocumentSchema& schema, const std
             double n = 0.0;
             if (!numberAttribute || !ParseNumber(numberAttribute.value(), n) || n < 1 || std::floor(n) != n ||
                 n > static_cast<double>(section.maximumCount))
-                throw fail(node.offset_debug(), "<" + name + "> needs number=\"1\" to \"" +
-                                                    std::to_string(section.maximumCount) + "\"");
+                throw fail(node.offset_debug(),
+                           "<" + name + "> needs number=\"1\" to \"" + std::to_string(section.maximumCount) + "\"");
             record = static_cast<std::size_t>(n) - 1;
         }
         if (!seen[s].insert(record).second)
-            throw fail(node.offset_debug(), "a second <" + name + ">" +
-                                                (section.IsArray() ? " number=\"" + std::to_string(record + 1) + "\"" : ""));
+            throw fail(node.offset_debug(),
+                       "a second <" + name + ">" +
+                           (section.IsArray() ? " number=\"" + std::to_string(record + 1) + "\"" : ""));
         offsets[s][record] = node.offset_debug();
 
         std::set<std::string> attributes;
@@ -382,11 +391,12 @@ SettingsDocument SettingsDocument::Parse(const DocumentSchema& schema, const std
             SettingValue value;
             if (!ReadXmlValue(f, a.value(), value))
                 throw fail(node.offset_debug(), document.RecordName(s, record) + ": " + attribute + "=\"" + a.value() +
-                                                    "\" is not " + (f.type == FieldType::Choice ? DescribeRange(f) : "a number"));
+                                                    "\" is not " +
+                                                    (f.type == FieldType::Choice ? DescribeRange(f) : "a number"));
             const std::string fault = Fault(f, value);
             if (!fault.empty())
-                throw fail(node.offset_debug(), document.RecordName(s, record) + ": " + attribute + "=\"" + a.value() +
-                                                    "\" " + fault);
+                throw fail(node.offset_debug(),
+                           document.RecordName(s, record) + ": " + attribute + "=\"" + a.value() + "\" " + fault);
             document.Value(s, record, static_cast<std::size_t>(field)) = value;
         }
     }
@@ -397,7 +407,8 @@ SettingsDocument SettingsDocument::Parse(const DocumentSchema& schema, const std
                                                 schema.sections[s].element + "> elements");
     DocumentFault fault;
     if (schema.check && !schema.check(document, fault))
-        throw fail(offsets.at(fault.section).at(fault.record), document.RecordName(fault.section, fault.record) + ": " + fault.message);
+        throw fail(offsets.at(fault.section).at(fault.record),
+                   document.RecordName(fault.section, fault.record) + ": " + fault.message);
     return document;
 }
 
@@ -416,9 +427,10 @@ std::string SettingsDocument::ToXml() const {
             for (std::size_t f = 0; f < section.fields.size(); ++f) {
                 const FieldSchema& field = section.fields[f];
                 const SettingValue& v = m_sections[s][r][f];
-                const std::string text = field.type == FieldType::Text     ? v.text
-                                         : field.type == FieldType::Choice ? field.choices.at(static_cast<std::size_t>(v.number))
-                                                                           : FormatNumber(v.number);
+                const std::string text = field.type == FieldType::Text ? v.text
+                                         : field.type == FieldType::Choice
+                                             ? field.choices.at(static_cast<std::size_t>(v.number))
+                                             : FormatNumber(v.number);
                 node.append_attribute(field.name.c_str()) = text.c_str();
             }
         }

@@ -26,8 +26,8 @@ std::int32_t FindParameter(zen::PluginInstance& instance, AudioPlugin& audio, co
     std::int32_t index = controls != nullptr ? controls->FindParameter(name.c_str()) : -1;
     for (std::uint32_t i = 0; index < 0 && i < audio.GetParameterCount(); ++i) {
         zen::ParameterInfo info;
-        if (audio.GetParameterInfo(i, info) &&
-            (strcasecmp(info.label.c_str(), name.c_str()) == 0 || strcasecmp(info.identifier.c_str(), name.c_str()) == 0))
+        if (audio.GetParameterInfo(i, info) && (strcasecmp(info.label.c_str(), name.c_str()) == 0 ||
+                                                strcasecmp(info.identifier.c_str(), name.c_str()) == 0))
             index = static_cast<std::int32_t>(i);
     }
     if (index < 0) throw HostError(std::string("'") + instance.GetName() + "' has no parameter '" + name + "'");
@@ -51,7 +51,8 @@ std::size_t StudioModel::AddChannel(const std::string& name, std::uint32_t audio
     auto channel = std::make_unique<Channel>();
     channel->name = name;
     channel->audioChannels = audioChannels;
-    channel->services = std::make_unique<ActionServices>(m_actions, static_cast<std::int64_t>(m_channels.size()), m_sessionId);
+    channel->services =
+        std::make_unique<ActionServices>(m_actions, static_cast<std::int64_t>(m_channels.size()), m_sessionId);
     m_channels.push_back(std::move(channel));
     return m_channels.size() - 1;
 }
@@ -141,8 +142,8 @@ void StudioModel::Prepare(int sampleRate, std::uint32_t maxBlock) {
     for (auto& channel : m_channels)
         for (Slot& slot : channel->chain)
             if (!slot.audio->Prepare(static_cast<float>(sampleRate), maxBlock))
-                throw HostError("'" + slot.name + "' cannot run at " + std::to_string(sampleRate) + " Hz in blocks of " +
-                                std::to_string(maxBlock));
+                throw HostError("'" + slot.name + "' cannot run at " + std::to_string(sampleRate) +
+                                " Hz in blocks of " + std::to_string(maxBlock));
     m_prepared = true;
 }
 
@@ -169,7 +170,8 @@ void StudioModel::RegisterActions() {
     m_actions.Register("LoadPlugin", 1, 2, [this, callerChannel](const ActionCall& call, std::string& result) {
         const std::size_t slot = call.arguments.size() > 1 ? ParseIndex(call.arguments[1], "slot") : kAppend;
         const std::size_t channel = callerChannel(call);
-        result = std::to_string(InsertPlugin(channel, call.arguments[0], std::min(slot, ChannelAt(channel).chain.size())));
+        result =
+            std::to_string(InsertPlugin(channel, call.arguments[0], std::min(slot, ChannelAt(channel).chain.size())));
         return true;
     });
     // (slot, parameter, value in tenths): the decimal text of the value times ten.

@@ -50,8 +50,10 @@ void TempoMap::SetTempo(std::int64_t bar, int beat, double quartersPerMinute) {
         throw HostError("bar " + std::to_string(bar) + " has no beat " + std::to_string(beat));
     const auto at = std::find_if(m_tempos.begin(), m_tempos.end(),
                                  [&](const TempoSegment& t) { return t.bar == bar && t.beat == beat; });
-    if (at != m_tempos.end()) at->quartersPerMinute = quartersPerMinute;
-    else m_tempos.push_back({bar, beat, quartersPerMinute});
+    if (at != m_tempos.end())
+        at->quartersPerMinute = quartersPerMinute;
+    else
+        m_tempos.push_back({bar, beat, quartersPerMinute});
     Rebuild();
 }
 
@@ -64,8 +66,10 @@ void TempoMap::SetMeter(std::int64_t bar, Meter meter) {
             throw HostError("a tempo change at bar " + std::to_string(t.bar) + " beat " + std::to_string(t.beat) +
                             " would fall outside a bar of " + std::to_string(meter.numerator));
     const auto at = std::find_if(m_meters.begin(), m_meters.end(), [&](const MeterSegment& m) { return m.bar == bar; });
-    if (at != m_meters.end()) at->meter = meter;
-    else m_meters.push_back({bar, meter, 0.0});
+    if (at != m_meters.end())
+        at->meter = meter;
+    else
+        m_meters.push_back({bar, meter, 0.0});
     Rebuild();
 }
 
@@ -88,7 +92,8 @@ double TempoMap::SamplesPerQuarter(const TempoSegment& segment) const {
 }
 
 void TempoMap::Rebuild() {
-    std::sort(m_meters.begin(), m_meters.end(), [](const MeterSegment& a, const MeterSegment& b) { return a.bar < b.bar; });
+    std::sort(m_meters.begin(), m_meters.end(),
+              [](const MeterSegment& a, const MeterSegment& b) { return a.bar < b.bar; });
     for (std::size_t i = 1; i < m_meters.size(); ++i) {
         const MeterSegment& previous = m_meters[i - 1];
         m_meters[i].quarter =
@@ -138,9 +143,7 @@ double TempoMap::BarBeatToSample(const BarBeat& position) const {
     return tempo.sample + (quarter - tempo.quarter) * SamplesPerQuarter(tempo);
 }
 
-std::int64_t TempoMap::NearestSample(const BarBeat& position) const {
-    return std::llround(BarBeatToSample(position));
-}
+std::int64_t TempoMap::NearestSample(const BarBeat& position) const { return std::llround(BarBeatToSample(position)); }
 
 double TempoMap::TempoAt(double sample) const {
     auto t = std::upper_bound(m_tempos.begin(), m_tempos.end(), sample,

@@ -26,7 +26,7 @@ struct BarBeat {
 
 class TempoMap {
 public:
-    static constexpr double kMinimumTempo = 1.0;    // quarter notes per minute
+    static constexpr double kMinimumTempo = 1.0;  // quarter notes per minute
     static constexpr double kMaximumTempo = 1000.0;
     static constexpr int kMaximumNumerator = 64;
 

@@ -103,17 +103,18 @@ std::vector<PerformanceResult> PerformanceRun::Run(zen::PluginInterface& library
     const auto list = library.GetPluginList(zen::kAudioPluginKind);
     for (const std::string& name : settings.plugins) {
         const bool known = std::any_of(list.begin(), list.end(), [&](const auto& row) {
-            return strcasecmp(row.second.name.c_str(), name.c_str()) == 0 || strcasecmp(row.first.c_str(), name.c_str()) == 0;
+            return strcasecmp(row.second.name.c_str(), name.c_str()) == 0 ||
+                   strcasecmp(row.first.c_str(), name.c_str()) == 0;
         });
         if (!known) throw HostError("Performance Testing names '" + name + "', which the library does not have");
     }
     std::vector<PerformanceResult> results;
     for (const auto& [key, entry] : list) {
-        const bool chosen = settings.plugins.empty() ||
-                            std::any_of(settings.plugins.begin(), settings.plugins.end(), [&](const std::string& name) {
-                                return strcasecmp(entry.name.c_str(), name.c_str()) == 0 ||
-                                       strcasecmp(key.c_str(), name.c_str()) == 0;
-                            });
+        const bool chosen =
+            settings.plugins.empty() ||
+            std::any_of(settings.plugins.begin(), settings.plugins.end(), [&](const std::string& name) {
+                return strcasecmp(entry.name.c_str(), name.c_str()) == 0 || strcasecmp(key.c_str(), name.c_str()) == 0;
+            });
         if (!chosen) continue;
         results.push_back(RunPlugin(library, key, entry, settings));
         if (progress) progress(results.back());

@@ -16,7 +16,7 @@ public:
     static constexpr std::size_t kBands = 4;
     static constexpr double kMinimumGain = -40.0;  // dB
     static constexpr double kMaximumGain = 12.0;
-    static constexpr double kMaximumDelay = 100.0;  // ms: 34 m of air
+    static constexpr double kMaximumDelay = 100.0;    // ms: 34 m of air
     static constexpr double kMaximumBandGain = 18.0;  // dB, the BiQuad's range
     static constexpr double kMinimumFrequency = 20.0;
     static constexpr double kMaximumFrequency = 20000.0;
@@ -44,7 +44,9 @@ public:
     };
 
     static const DocumentSchema& Schema();
-    static std::size_t BandField(std::size_t band, BandField field) { return kFirstBandField + band * kBandFieldCount + field; }
+    static std::size_t BandField(std::size_t band, BandField field) {
+        return kFirstBandField + band * kBandFieldCount + field;
+    }
     static std::vector<Channel> Read(const SettingsDocument& document);
 };
 

@@ -36,10 +36,12 @@ const DocumentSchema& IOInterfaceDocument::Schema() {
                          TextField("outputFile", "Output File", "", 4096)};
         DocumentSchema s;
         s.root = "IOInterfaceSettings";
-        s.sections = {device, Routing("Input", "Input", IntegerField("channel", "Channel", 0, channels, 0), kInputSection),
+        s.sections = {device,
+                      Routing("Input", "Input", IntegerField("channel", "Channel", 0, channels, 0), kInputSection),
                       Routing("Output", "Output", IntegerField("source", "Source", 0, channels, 0), kOutputSection)};
         s.check = [](const SettingsDocument& d, DocumentFault& fault) {
-            if (d.ChoiceIndex(kDeviceSection, 0, kDevice) == kFileDevice && d.Text(kDeviceSection, 0, kOutputFile).empty()) {
+            if (d.ChoiceIndex(kDeviceSection, 0, kDevice) == kFileDevice &&
+                d.Text(kDeviceSection, 0, kOutputFile).empty()) {
                 fault = {"the file device needs an outputFile", kDeviceSection, 0};
                 return false;
             }

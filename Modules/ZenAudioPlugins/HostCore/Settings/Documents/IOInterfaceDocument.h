@@ -18,8 +18,8 @@ public:
     enum Section : std::size_t { kDeviceSection, kInputSection, kOutputSection };
     enum DeviceField : std::size_t { kDevice, kSampleRate, kBlockSize, kInputs, kOutputs, kInputFile, kOutputFile };
     enum Device : int { kNullDevice, kClockedNullDevice, kFileDevice };
-    enum InputField : std::size_t { kInputChannel };    // studio channel, 0 = not routed
-    enum OutputField : std::size_t { kOutputSource };   // bus channel, 0 = silent
+    enum InputField : std::size_t { kInputChannel };   // studio channel, 0 = not routed
+    enum OutputField : std::size_t { kOutputSource };  // bus channel, 0 = silent
 
     struct Interface {
         Device device = kClockedNullDevice;

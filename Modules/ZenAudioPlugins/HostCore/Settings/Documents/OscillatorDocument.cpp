@@ -9,14 +9,15 @@ const DocumentSchema& OscillatorDocument::Schema() {
         SectionSchema tone;
         tone.element = "Tone";
         tone.label = "Tone";
-        tone.fields = {ChoiceField("signal", "Signal", {"sine", "pink", "white", "sweep"}, kSine),
-                       NumberField("level", "Level", kMinimumLevel, 0.0, -20.0, 0.01, "dB"),
-                       NumberField("frequency", "Frequency", kMinimumFrequency, kMaximumFrequency, 1000.0, 0.01, "Hz", true),
-                       NumberField("sweepEnd", "Sweep End", kMinimumFrequency, kMaximumFrequency, 20000.0, 0.01, "Hz", true),
-                       NumberField("duration", "Duration", 0.01, kMaximumDuration, 10.0, 0.01, "s"),
-                       IntegerField("channel", "Channel", 0, static_cast<double>(kMaximumChannels), 0),
-                       IntegerField("channels", "Channels", 1, static_cast<double>(kMaximumChannels), 2),
-                       AudioFormatFields::SampleRate()};
+        tone.fields = {
+            ChoiceField("signal", "Signal", {"sine", "pink", "white", "sweep"}, kSine),
+            NumberField("level", "Level", kMinimumLevel, 0.0, -20.0, 0.01, "dB"),
+            NumberField("frequency", "Frequency", kMinimumFrequency, kMaximumFrequency, 1000.0, 0.01, "Hz", true),
+            NumberField("sweepEnd", "Sweep End", kMinimumFrequency, kMaximumFrequency, 20000.0, 0.01, "Hz", true),
+            NumberField("duration", "Duration", 0.01, kMaximumDuration, 10.0, 0.01, "s"),
+            IntegerField("channel", "Channel", 0, static_cast<double>(kMaximumChannels), 0),
+            IntegerField("channels", "Channels", 1, static_cast<double>(kMaximumChannels), 2),
+            AudioFormatFields::SampleRate()};
         DocumentSchema s;
         s.root = "OscillatorSettings";
         s.sections = {tone};
@@ -24,11 +25,14 @@ const DocumentSchema& OscillatorDocument::Schema() {
             const Tone t = Read(d);
             const double nyquist = t.sampleRate / 2.0;
             if (t.frequency >= nyquist || (t.signal == kSweep && t.sweepEnd >= nyquist))
-                fault = {"frequencies must stay below half the sample rate (" + FormatNumber(nyquist) + " Hz)", kToneSection, 0};
+                fault = {"frequencies must stay below half the sample rate (" + FormatNumber(nyquist) + " Hz)",
+                         kToneSection, 0};
             else if (t.channel > t.channels)
                 fault = {"channel " + std::to_string(t.channel) + " is beyond the " + std::to_string(t.channels) +
-                             " channels", kToneSection, 0};
-            else return true;
+                             " channels",
+                         kToneSection, 0};
+            else
+                return true;
             return false;
         };
         return s;

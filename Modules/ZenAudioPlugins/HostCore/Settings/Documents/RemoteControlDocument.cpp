@@ -12,9 +12,8 @@ std::string Message(const SettingsDocument& d, std::size_t r) {
     using D = RemoteControlDocument;
     const auto type = static_cast<D::Type>(d.ChoiceIndex(D::kBindingSection, r, D::kType));
     if (type == D::kOsc) return "OSC " + d.Text(D::kBindingSection, r, D::kAddress);
-    return std::string(type == D::kNote ? "note " : "CC ") +
-           FormatNumber(d.Number(D::kBindingSection, r, D::kNumber)) + " on MIDI channel " +
-           FormatNumber(d.Number(D::kBindingSection, r, D::kMidiChannel));
+    return std::string(type == D::kNote ? "note " : "CC ") + FormatNumber(d.Number(D::kBindingSection, r, D::kNumber)) +
+           " on MIDI channel " + FormatNumber(d.Number(D::kBindingSection, r, D::kMidiChannel));
 }
 
 bool IsOscAddress(const std::string& address) {
