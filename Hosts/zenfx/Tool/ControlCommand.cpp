@@ -126,7 +126,8 @@ int RunTones(ControlSession& session, const ControlOptions& options) {
     zen::host::TestToneGenerator::Render(tone, options.output);
     static const char* kSignals[] = {"sine", "pink noise", "white noise", "sweep"};
     std::cout << "zenfx: wrote " << tone.duration << " s of " << kSignals[tone.signal] << " at " << tone.levelDb
-              << " dBFS (" << tone.channels << " channels, " << tone.sampleRate << " Hz) to " << options.output << "\n";
+              << " dBFS (" << tone.channels << (tone.channels == 1 ? " channel, " : " channels, ") << tone.sampleRate
+              << " Hz) to " << options.output << "\n";
     return 0;
 }
 

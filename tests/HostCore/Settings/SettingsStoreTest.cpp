@@ -107,12 +107,10 @@ TEST(AtomicFile, AProcessKilledWhileWritingLeavesTheOldDocumentOrTheNewOneWhole)
     Folder folder;
     const std::string path = (folder.path / "BChainSettings.xml").string();
     // Two large documents, so a kill lands inside a write most of the time.
-    std::string first, second;
-    for (int i = 0; i < 2000; ++i) {
-        first += SettingsDocument(zen::host::BChainDocument::Schema()).ToXml();
-        second += std::string(first.size() / static_cast<std::size_t>(i + 1), 'x') + "\n";
-    }
-    second.resize(first.size() + 12345, 'y');
+    const std::string one = SettingsDocument(zen::host::BChainDocument::Schema()).ToXml();
+    std::string first;
+    for (int i = 0; i < 300; ++i) first += one;
+    const std::string second(first.size() + 12345, 'y');
     zen::host::AtomicFile::Replace(path, first);
     std::mt19937 random(3);
     for (int round = 0; round < 8; ++round) {
