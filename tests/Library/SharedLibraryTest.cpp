@@ -68,6 +68,11 @@ TEST(SharedLibrary, HostsCreateAndRunPluginsThroughTheEntry) {
         float* channels[2] = {left.data(), right.data()};
         EXPECT_TRUE(audio->Process(channels, 64)) << key;
     }
+    // The console's control plug-ins, exactly these six.
+    std::vector<std::string> controls;
+    for (const auto& [key, row] : library->GetPluginList(zen::kControlPluginKind)) controls.push_back(key);
+    EXPECT_EQ(controls, (std::vector<std::string>{"B-Chain Control", "I/O Interface Settings", "Performance Testing",
+                                                  "Remote Control Settings", "TalkbackSettings", "Test Tones Settings"}));
     // Static objects of the library may outlive this test; it stays loaded.
 }
 

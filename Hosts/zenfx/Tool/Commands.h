@@ -40,10 +40,20 @@ struct ValidateOptions {
     std::vector<std::string> checks;  // only checks whose id starts with one of these
 };
 
+struct ControlOptions {
+    std::string action;  // list, show, set, run
+    std::string plugin;  // registry name of a control plug-in, any case
+    std::vector<std::string> assignments;  // set: key=value
+    std::string configFolder;              // empty: the XDG config folder
+    std::string output;                    // run "Test Tones Settings": the file
+    bool json = false;
+};
+
 int RunList(PluginLibrary& library, bool json);
 int RunInfo(PluginLibrary& library, const InfoOptions& options);
 int RunProcess(PluginLibrary& library, const ProcessOptions& options);
 int RunValidate(PluginLibrary& library, const ValidateOptions& options);
+int RunControl(PluginLibrary& library, const ControlOptions& options);
 int RunDemo(const std::string& output, const std::string& format);
 
 }  // namespace zenfx

@@ -90,6 +90,28 @@ int main(int argc, char** argv) {
         ->allow_extra_args(false);
     validateCommand->add_flag("--json", validate.json, "Print JSON");
 
+    zenfx::ControlOptions control;
+    CLI::App* controlCommand = app.add_subcommand("control", "Show and change the console's settings documents");
+    controlCommand->require_subcommand(1);
+    controlCommand->add_option("--config-dir", control.configFolder,
+                               "Folder of the settings documents (default: $XDG_CONFIG_HOME/ZenAudioPlugins)");
+    CLI::App* controlList = controlCommand->add_subcommand("list", "Every control plug-in and its document");
+    controlList->add_flag("--json", control.json, "Print JSON");
+    CLI::App* controlShow = controlCommand->add_subcommand("show", "Every setting of a control plug-in's document");
+    controlShow->add_option("NAME", control.plugin, "Control plug-in, any case")->required();
+    controlShow->add_flag("--json", control.json, "Print JSON");
+    CLI::App* controlSet = controlCommand->add_subcommand("set", "Change settings; the document is replaced atomically");
+    controlSet->add_option("NAME", control.plugin, "Control plug-in, any case")->required();
+    controlSet->add_option("KEY=VALUE", control.assignments, "Settings by key, as show lists them")->required();
+    controlSet->add_flag("--json", control.json, "Print the document as JSON");
+    CLI::App* controlRun = controlCommand->add_subcommand(
+        "run", "Render the test tone (-o FILE) or run the performance test");
+    controlRun->add_option("NAME", control.plugin, "\"Test Tones Settings\" or \"Performance Testing\"")->required();
+    controlRun->add_option("-o,--output", control.output, "Test tones: the audio file to write");
+    controlRun->add_flag("--json", control.json, "Performance: print JSON");
+    for (CLI::App* sub : {controlList, controlShow, controlSet, controlRun})
+        sub->add_option("--config-dir", control.configFolder, "Folder of the settings documents");
+
     std::string demoOutput, demoFormat;
     CLI::App* demo = app.add_subcommand("demo", "Write the built-in demo material to a file");
     demo->add_option("-o,--output", demoOutput, "Output file")->required();
@@ -110,6 +132,10 @@ int main(int argc, char** argv) {
         if (*list) return zenfx::RunList(library, listJson);
         if (*infoCommand) return zenfx::RunInfo(library, info);
         if (*validateCommand) return zenfx::RunValidate(library, validate);
+        if (*controlCommand) {
+            for (CLI::App* sub : controlCommand->get_subcommands()) control.action = sub->get_name();
+            return zenfx::RunControl(library, control);
+        }
         process.stages = CollectStages(*processCommand, pluginOption, setOption, presetOption);
         process.compensateLatency = !noCompensation;
         return zenfx::RunProcess(library, process);
