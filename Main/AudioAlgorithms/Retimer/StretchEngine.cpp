@@ -5,7 +5,10 @@
 
 namespace ora::fft::stretch::pv {
 
-Engine::Engine(const EngineParam& param) : m_param(param) { ApplySettings(); }
+Engine::Engine(const EngineParam& param) : m_param(param) {
+    m_in2dft.SetTimeWeighted(true);
+    ApplySettings();
+}
 
 bool Engine::Configure(std::size_t channels, std::size_t inputCapacity, Backend backend) {
     m_channels = 0;

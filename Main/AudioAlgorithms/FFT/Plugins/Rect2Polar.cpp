@@ -2,6 +2,8 @@
 
 #include <cmath>
 
+#include "FFT/PhaseMath.h"
+
 namespace ora::fft {
 
 namespace {
@@ -24,13 +26,16 @@ void Rect2Polar::Process(Frame& frame, Context& context) noexcept {
     float* phase = frame.Real(variable::PHASE_IN, type::FREQ_REAL_VECTOR);
     if (fsig == nullptr || mag == nullptr || mag2 == nullptr || phase == nullptr) return;
     const std::size_t bins = context.bins;
+    // Phases at the frame's true centre: bin k turns by its frequency times
+    // the offset.
+    const double turn = kTwoPi / static_cast<double>(context.fftLength) * context.analysisOffset;
     for (std::size_t c = 0; c < context.channels; ++c) {
         const Complex* x = fsig + c * bins;
         for (std::size_t k = 0; k < bins; ++k) {
             const float power = x[k].real() * x[k].real() + x[k].imag() * x[k].imag();
             mag2[c * bins + k] = power;
             mag[c * bins + k] = std::sqrt(power);
-            phase[c * bins + k] = std::atan2(x[k].imag(), x[k].real());
+            phase[c * bins + k] = static_cast<float>(std::atan2(x[k].imag(), x[k].real()) + turn * static_cast<double>(k));
         }
     }
     if (!context.SharedRow()) return;
@@ -44,7 +49,9 @@ void Rect2Polar::Process(Frame& frame, Context& context) noexcept {
         }
         mag2[r + k] = power;
         mag[r + k] = std::sqrt(power);
-        phase[r + k] = std::abs(sum) > kCancellation * mag[r + k] ? std::arg(sum) : phase[k];
+        phase[r + k] = std::abs(sum) > kCancellation * mag[r + k]
+                           ? static_cast<float>(std::arg(sum) + turn * static_cast<double>(k))
+                           : phase[k];
     }
 }
 
