@@ -26,6 +26,8 @@ public:
 
     // Ring: appends samples at the write position.
     void Write(const float* samples, std::size_t count) noexcept;
+    // Ring: appends samples limited to +-limit, non-finite ones as zero.
+    void WriteLimited(const float* samples, std::size_t count, float limit) noexcept;
     std::int64_t Written() const { return m_written; }
     // Ring: samples [start, start + count); positions never written or
     // already overwritten read as zero.

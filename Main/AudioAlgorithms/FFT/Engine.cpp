@@ -69,6 +69,7 @@ bool Engine::Configure(const EngineConfig& config) {
     m_context.window = &m_window;
     m_context.in = &m_in;
     m_context.out = &m_out;
+    m_inputLimit = config.inputLimit;
     for (Plugin* p : m_pipeline)
         if (!p->Configure(*m_frame, m_context)) return false;
     m_configured = true;
@@ -89,7 +90,12 @@ void Engine::Reset() noexcept {
 }
 
 void Engine::Write(const float* const* in, std::size_t frames) noexcept {
-    for (std::size_t c = 0; c < m_in.size(); ++c) m_in[c].Write(in[c], frames);
+    for (std::size_t c = 0; c < m_in.size(); ++c) {
+        if (m_inputLimit > 0.0f)
+            m_in[c].WriteLimited(in[c], frames, m_inputLimit);
+        else
+            m_in[c].Write(in[c], frames);
+    }
 }
 
 std::int64_t Engine::Written() const { return m_in.empty() ? 0 : m_in[0].Written(); }

@@ -36,6 +36,9 @@ struct EngineConfig {
     std::size_t inputCapacity = 0;    // input history per channel; 0: four frames
     Backend backend = FFT::DefaultBackend();
     float gain = 1.0f;
+    // Input beyond +-inputLimit is limited to it and non-finite input taken
+    // as silence, so the transforms' sums and squares stay finite; 0: as is.
+    float inputLimit = 0.0f;
     std::vector<Plugin*> pipeline;    // not owned; must end in an OUTPUT plug-in
 };
 
@@ -92,6 +95,7 @@ private:
     Context m_context;
     double m_lastCentre = 0.0;
     std::int64_t m_pushNextStart = 0;
+    float m_inputLimit = 0.0f;
     bool m_configured = false;
 };
 

@@ -29,6 +29,10 @@ class Engine {
 public:
     // Samples over which a change of the mix gains ramps (5 ms at 48 kHz).
     static constexpr std::size_t kMixRamp = 240;
+    // Input is limited to +-this (+160 dBFS), non-finite input is silence:
+    // far beyond any real signal, far within what the transforms' sums and
+    // squares hold in single precision.
+    static constexpr float kLargestInput = 1e8f;
 
     explicit Engine(const EngineParam& param);
     Engine(const Engine&) = delete;

@@ -77,14 +77,14 @@ void PhaseGrad::StretchShift(const Frame& frame, const Context& context, std::si
         const double cross = static_cast<double>(weighted[k].real()) * x.real() +
                              static_cast<double>(weighted[k].imag()) * x.imag();
         shift[k] = power > 0.0 ? static_cast<float>(cross / power) : 0.0f;
-        weight[k] = static_cast<float>(power);
+        weight[k] = static_cast<float>(std::sqrt(power));
     }
-    const double floor = peak * kTimeFloor;
+    const auto floor = static_cast<float>(std::sqrt(peak * kTimeFloor));
     for (std::size_t k = 0; k < bins; ++k) {
         const bool trusted = weight[k] > floor;
         const double time = trusted ? std::clamp(static_cast<double>(shift[k]), -limit, limit) : 0.0;
         shift[k] = static_cast<float>(context.SynthesisTime(time) - time);
-        weight[k] = trusted ? std::sqrt(weight[k]) : 0.0f;
+        if (!trusted) weight[k] = 0.0f;
     }
 }
 
