@@ -58,10 +58,16 @@ float Buffer::At(std::int64_t position) const noexcept {
 
 void Buffer::Read(std::int64_t start, float* out, std::size_t count) const noexcept {
     const auto capacity = static_cast<std::int64_t>(m_data.size());
-    const std::int64_t oldest = std::max<std::int64_t>(0, m_written - capacity);
-    for (std::size_t i = 0; i < count; ++i) {
-        const std::int64_t p = start + static_cast<std::int64_t>(i);
-        out[i] = (p >= oldest && p < m_written) ? m_data[static_cast<std::size_t>(p) & m_mask] : 0.0f;
+    const std::int64_t end = start + static_cast<std::int64_t>(count);
+    const std::int64_t from = std::min(std::max({start, m_written - capacity, std::int64_t{0}}), end);
+    const std::int64_t to = std::max(std::min(end, m_written), from);
+    std::fill(out, out + (from - start), 0.0f);
+    std::fill(out + (to - start), out + count, 0.0f);
+    for (std::int64_t p = from; p < to;) {
+        const std::size_t at = static_cast<std::size_t>(p) & m_mask;
+        const auto n = static_cast<std::size_t>(std::min<std::int64_t>(to - p, capacity - static_cast<std::int64_t>(at)));
+        std::memcpy(out + (p - start), m_data.data() + at, n * sizeof(float));
+        p += static_cast<std::int64_t>(n);
     }
 }
 

@@ -48,8 +48,20 @@ struct Context {
     bool SharedRow() const { return joint && rows > channels; }
     // Synthesis time per analysis time around this frame.
     double Stretch() const { return static_cast<double>(synthesisHop) / analysisHop; }
-    // Time after the synthesis centre of content `time` after the analysis centre.
+    // Time after the synthesis centre of content `time` after the analysis
+    // centre, and whether that is a straight line (slope and offset).
     double SynthesisTime(double time) const { return timeMap != nullptr ? (*timeMap)(time) : Stretch() * time; }
+    bool SynthesisLine(double& slope, double& offset) const {
+        if (timeMap != nullptr) return timeMap->IsLine(slope, offset);
+        slope = Stretch();
+        offset = 0.0;
+        return true;
+    }
+    // Whether the frame's content moves within it at all on synthesis.
+    bool Stretched() const {
+        double slope, offset;
+        return !SynthesisLine(slope, offset) || slope != 1.0 || offset != 0.0;
+    }
 };
 
 }  // namespace ora::fft

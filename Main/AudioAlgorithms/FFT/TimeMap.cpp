@@ -1,6 +1,7 @@
 #include "FFT/TimeMap.h"
 
 #include <algorithm>
+#include <cmath>
 
 namespace ora::fft {
 
@@ -27,6 +28,20 @@ double TimeMap::MaxSlope() const {
     for (std::size_t i = 1; i < m_count; ++i)
         slope = std::max(slope, (m_synthesis[i] - m_synthesis[i - 1]) / (m_analysis[i] - m_analysis[i - 1]));
     return slope;
+}
+
+bool TimeMap::IsLine(double& slope, double& offset) const {
+    if (m_count < 2) {
+        slope = 1.0;
+        offset = m_count == 1 ? m_synthesis[0] - m_analysis[0] : 0.0;
+        return true;
+    }
+    slope = (m_synthesis[1] - m_synthesis[0]) / (m_analysis[1] - m_analysis[0]);
+    offset = m_synthesis[0] - slope * m_analysis[0];
+    for (std::size_t i = 2; i < m_count; ++i)
+        if (std::abs(offset + slope * m_analysis[i] - m_synthesis[i]) > 1e-9 * (1.0 + std::abs(m_synthesis[i])))
+            return false;
+    return true;
 }
 
 }  // namespace ora::fft

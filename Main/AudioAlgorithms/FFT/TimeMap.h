@@ -24,6 +24,9 @@ public:
     // The steepest segment: the fastest the stretched stream around this
     // frame will be read at, per input sample.
     double MaxSlope() const;
+    // True when the map is one straight line (a steady stretch), given as
+    // synthesis = offset + slope * analysis.
+    bool IsLine(double& slope, double& offset) const;
 
 private:
     std::array<double, kCapacity> m_analysis{};

@@ -67,6 +67,7 @@ bool Engine::Reset() noexcept {
     m_decided = 0;
     m_nextFrame = 0;
     m_segment = 0;
+    m_segmentSlope = 0.0;  // found on the first read
     return true;
 }
 
@@ -109,10 +110,11 @@ void Engine::RunFrame() noexcept {
 }
 
 double Engine::ReadPosition(double time) noexcept {
-    while (time >= Centre(m_segment + 1)) ++m_segment;
-    const double from = Centre(m_segment);
-    const double to = Centre(m_segment + 1);
-    return SynthesisCentre(m_segment) + (time - from) * (SynthesisCentre(1) - SynthesisCentre(0)) / (to - from);
+    if (m_segmentSlope == 0.0 || time >= Centre(m_segment + 1)) {
+        while (time >= Centre(m_segment + 1)) ++m_segment;
+        m_segmentSlope = (SynthesisCentre(1) - SynthesisCentre(0)) / (Centre(m_segment + 1) - Centre(m_segment));
+    }
+    return SynthesisCentre(m_segment) + (time - Centre(m_segment)) * m_segmentSlope;
 }
 
 bool Engine::Process(const Block& in, Block& out) noexcept {
@@ -147,8 +149,8 @@ bool Engine::Process(const Block& in, Block& out) noexcept {
             const auto frac = static_cast<float>(position - base);
             for (std::size_t c = 0; c < m_channels; ++c) {
                 const fft::Buffer& s = m_FifoOutI[c];
-                outChunk[c][i] = interp::cubic::Interpolate(s.At(index - 1), s.At(index), s.At(index + 1),
-                                                            s.At(index + 2), frac);
+                outChunk[c][i] = interp::cubic::Interpolate(s.Held(index - 1), s.Held(index), s.Held(index + 1),
+                                                            s.Held(index + 2), frac);
             }
             ++m_output;
         }

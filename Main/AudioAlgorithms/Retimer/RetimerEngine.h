@@ -90,6 +90,7 @@ private:
     std::int64_t m_decided = 0;    // frames whose centre is decided
     std::int64_t m_nextFrame = 0;  // index of the next synthesis frame
     std::int64_t m_segment = 0;    // the reader lies between this frame's centre and the next
+    double m_segmentSlope = 0.0;   // stretched samples per input sample there; 0: not found yet
 };
 
 }  // namespace ora::retimer

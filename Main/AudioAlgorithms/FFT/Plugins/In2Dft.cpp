@@ -42,7 +42,7 @@ void In2Dft::Process(Frame& frame, Context& context) noexcept {
         Centre(samples, win, t, n, m);
         context.fft->ForwardReal(t, fsig + c * context.bins);
     }
-    if (!m_timeWeighted) return;
+    if (!m_timeWeighted || !context.Stretched()) return;
     Complex* weighted = frame.Cplx(variable::CFEAT, type::FREQ_CPLX_VECTOR);
     if (weighted == nullptr) return;
     // Time from the frame's true centre, which lies analysisOffset past the

@@ -54,10 +54,9 @@ bool PhaseGrad::UsePg(std::size_t row, const float* mag2, const Context& context
 void PhaseGrad::StretchShift(const Frame& frame, const Context& context, std::size_t row, float* shift,
                              float* weight) noexcept {
     const std::size_t bins = context.bins;
-    const bool uniform = context.timeMap == nullptr;
     const Frame::Variable* weightedVar = frame.Get(variable::CFEAT, type::FREQ_CPLX_VECTOR);
     const Frame::Variable* fsigVar = frame.Get(variable::FSIG, type::FREQ_CPLX_VECTOR);
-    if ((uniform && context.Stretch() == 1.0) || weightedVar == nullptr || fsigVar == nullptr) {
+    if (!context.Stretched() || weightedVar == nullptr || fsigVar == nullptr) {
         std::fill(shift, shift + bins, 0.0f);
         std::fill(weight, weight + bins, 1.0f);
         return;
@@ -80,10 +79,13 @@ void PhaseGrad::StretchShift(const Frame& frame, const Context& context, std::si
         weight[k] = static_cast<float>(std::sqrt(power));
     }
     const auto floor = static_cast<float>(std::sqrt(peak * kTimeFloor));
+    double slope, offset;
+    const bool line = context.SynthesisLine(slope, offset);
     for (std::size_t k = 0; k < bins; ++k) {
         const bool trusted = weight[k] > floor;
         const double time = trusted ? std::clamp(static_cast<double>(shift[k]), -limit, limit) : 0.0;
-        shift[k] = static_cast<float>(context.SynthesisTime(time) - time);
+        const double moved = line ? offset + slope * time : context.SynthesisTime(time);
+        shift[k] = static_cast<float>(moved - time);
         if (!trusted) weight[k] = 0.0f;
     }
 }

@@ -6,12 +6,6 @@
 
 namespace ora::fft {
 
-namespace {
-// Below this share of the total magnitude the channels' sum has no
-// trustworthy phase (anti-phase material).
-constexpr float kCancellation = 1e-3f;
-}  // namespace
-
 bool Rect2Polar::Configure(Frame& frame, const Context& context) {
     return frame.RequireVector(variable::FSIG, type::FREQ_CPLX_VECTOR, context.channels, context.bins) &&
            frame.RequireVector(variable::SFEAT, type::FREQ_REAL_VECTOR, context.rows, context.bins) &&
@@ -29,6 +23,17 @@ void Rect2Polar::Process(Frame& frame, Context& context) noexcept {
     // Phases at the frame's true centre: bin k turns by its frequency times
     // the offset.
     const double turn = kTwoPi / static_cast<double>(context.fftLength) * context.analysisOffset;
+    if (context.SharedRow()) {
+        const std::size_t r = context.channels * bins;
+        for (std::size_t k = 0; k < bins; ++k) {
+            float power;
+            const Complex ref = SharedReference(fsig, context.channels, bins, k, power);
+            mag2[r + k] = power;
+            mag[r + k] = std::sqrt(power);
+            phase[r + k] = static_cast<float>(std::atan2(ref.imag(), ref.real()) + turn * static_cast<double>(k));
+        }
+        return;
+    }
     for (std::size_t c = 0; c < context.channels; ++c) {
         const Complex* x = fsig + c * bins;
         for (std::size_t k = 0; k < bins; ++k) {
@@ -37,21 +42,6 @@ void Rect2Polar::Process(Frame& frame, Context& context) noexcept {
             mag[c * bins + k] = std::sqrt(power);
             phase[c * bins + k] = static_cast<float>(std::atan2(x[k].imag(), x[k].real()) + turn * static_cast<double>(k));
         }
-    }
-    if (!context.SharedRow()) return;
-    const std::size_t r = context.channels * bins;
-    for (std::size_t k = 0; k < bins; ++k) {
-        Complex sum{0.0f, 0.0f};
-        float power = 0.0f;
-        for (std::size_t c = 0; c < context.channels; ++c) {
-            sum += fsig[c * bins + k];
-            power += mag2[c * bins + k];
-        }
-        mag2[r + k] = power;
-        mag[r + k] = std::sqrt(power);
-        phase[r + k] = std::abs(sum) > kCancellation * mag[r + k]
-                           ? static_cast<float>(std::arg(sum) + turn * static_cast<double>(k))
-                           : phase[k];
     }
 }
 
