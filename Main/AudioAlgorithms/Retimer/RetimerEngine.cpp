@@ -34,7 +34,8 @@ bool Engine::Configure(std::size_t channels, double minRatio, double maxRatio, f
     // the shortest analysis hop; and the frames one frame's map spans.
     const double shortestHop = static_cast<double>(m_stretch.Hop()) / maxRatio;
     const double kept = static_cast<double>(m_rate.Latency()) + 2.0 * static_cast<double>(frame);
-    const auto centres = static_cast<std::size_t>(std::ceil(kept / shortestHop)) + 8;
+    std::size_t centres = 1;
+    while (static_cast<double>(centres) < std::ceil(kept / shortestHop) + 8.0) centres *= 2;
     if (!ORA_CHECK(static_cast<double>(frame) / shortestHop + 4.0 <= static_cast<double>(fft::TimeMap::kCapacity)))
         return false;
     try {
@@ -42,6 +43,7 @@ bool Engine::Configure(std::size_t channels, double minRatio, double maxRatio, f
         m_FifoOutI.resize(channels);
         for (auto& b : m_FifoOutI) b.Allocate(fifo, fft::Buffer::Layout::Ring);
         m_centres.assign(centres, 0.0);
+        m_centreMask = centres - 1;
     } catch (const std::bad_alloc&) {
         return false;
     }
@@ -81,7 +83,7 @@ double Engine::SynthesisCentre(std::int64_t frame) const {
 void Engine::DecideCentre(double ratio) noexcept {
     const double centre = m_decided == 0 ? static_cast<double>(m_rate.Origin() - m_rate.Latency())
                                          : Centre(m_decided - 1) + static_cast<double>(m_stretch.Hop()) / ratio;
-    m_centres[static_cast<std::size_t>(m_decided) % m_centres.size()] = centre;
+    m_centres[static_cast<std::size_t>(m_decided) & m_centreMask] = centre;
     ++m_decided;
 }
 

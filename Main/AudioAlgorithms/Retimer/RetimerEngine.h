@@ -64,7 +64,7 @@ public:
     fft::stretch::pv::Engine& Stretch() { return m_stretch; }
 
 private:
-    double Centre(std::int64_t frame) const { return m_centres[static_cast<std::size_t>(frame) % m_centres.size()]; }
+    double Centre(std::int64_t frame) const { return m_centres[static_cast<std::size_t>(frame) & m_centreMask]; }
     // Stretched-stream position of frame `frame`'s synthesis centre.
     double SynthesisCentre(std::int64_t frame) const;
     // Decides the analysis centre of the next frame not yet decided.
@@ -81,6 +81,7 @@ private:
     rate_control m_rate;
     std::vector<fft::Buffer> m_FifoOutI;  // the stretched stream per channel
     std::vector<double> m_centres;        // analysis centres (input time) by frame, a ring
+    std::size_t m_centreMask = 0;
     fft::TimeMap m_map;
 
     std::size_t m_channels = 0;

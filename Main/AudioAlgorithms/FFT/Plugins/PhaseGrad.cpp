@@ -24,6 +24,8 @@ bool PhaseGrad::Configure(Frame& frame, const Context& context) {
     m_prevPgTgrad.Resize(size);
     m_shift.Resize(context.bins);
     m_weight.Resize(context.bins);
+    m_pgNow.Resize(context.bins);
+    m_advance.Resize(context.bins);
     m_hasPrev.assign(context.rows, 0);
     for (variable v : {variable::SFEAT, variable::MAG2, variable::PHASE_IN, variable::MAG_LOG, variable::TGRAD,
                        variable::FGRAD_LEFT, variable::FGRAD_RIGHT})
@@ -42,13 +44,22 @@ bool PhaseGrad::UsePg(std::size_t row, const float* mag2, const Context& context
     if (m_mode == Mode::PG || !m_hasPrev[row]) return true;
     if (m_mode == Mode::PV || context.analysisHop == static_cast<double>(context.synthesisHop)) return false;
     const float* prev = m_prevMag2.data() + row * m_bins;
-    double total = 0.0;
-    double rise = 0.0;
-    for (std::size_t k = 0; k < m_bins; ++k) {
-        total += mag2[k];
-        rise += std::max(0.0f, mag2[k] - prev[k]);
+    Float4 total = Splat(0.0f);
+    Float4 rise = Splat(0.0f);
+    std::size_t k = 0;
+    for (; k + 4 <= m_bins; k += 4) {
+        const Float4 now = Load4(mag2 + k);
+        const Float4 change = now - Load4(prev + k);
+        total += now;
+        rise += Select4(change > 0.0f, change, Splat(0.0f));
     }
-    return total > 0.0 && rise > kOnsetShare * total;
+    float totalSum = total[0] + total[1] + total[2] + total[3];
+    float riseSum = rise[0] + rise[1] + rise[2] + rise[3];
+    for (; k < m_bins; ++k) {
+        totalSum += mag2[k];
+        riseSum += std::max(0.0f, mag2[k] - prev[k]);
+    }
+    return totalSum > 0.0f && riseSum > static_cast<float>(kOnsetShare) * totalSum;
 }
 
 void PhaseGrad::StretchShift(const Frame& frame, const Context& context, std::size_t row, float* shift,
@@ -64,29 +75,43 @@ void PhaseGrad::StretchShift(const Frame& frame, const Context& context, std::si
     const auto* weighted = reinterpret_cast<const Complex*>(weightedVar->data) + row * bins;
     const auto* fsig = reinterpret_cast<const Complex*>(fsigVar->data);
     const bool shared = row >= context.channels;
-    const double limit = static_cast<double>(context.frameLength / 2);
-    double peak = 0.0;
+    // Re(weighted * conj(x)) / |x|^2: the bin's time from the centre.
+    float peak = 0.0f;
     for (std::size_t k = 0; k < bins; ++k) {
         Complex x = shared ? Complex{} : fsig[row * bins + k];
         if (shared)
             for (std::size_t c = 0; c < context.channels; ++c) x += fsig[c * bins + k];
-        const double power = static_cast<double>(x.real()) * x.real() + static_cast<double>(x.imag()) * x.imag();
+        const float power = x.real() * x.real() + x.imag() * x.imag();
         peak = std::max(peak, power);
-        // Re(weighted * conj(x)) / |x|^2: the bin's time from the centre.
-        const double cross = static_cast<double>(weighted[k].real()) * x.real() +
-                             static_cast<double>(weighted[k].imag()) * x.imag();
-        shift[k] = power > 0.0 ? static_cast<float>(cross / power) : 0.0f;
-        weight[k] = static_cast<float>(std::sqrt(power));
+        shift[k] = weighted[k].real() * x.real() + weighted[k].imag() * x.imag();
+        weight[k] = power;
     }
-    const auto floor = static_cast<float>(std::sqrt(peak * kTimeFloor));
-    double slope, offset;
+    const Float4 floor = Splat(peak * static_cast<float>(kTimeFloor));
+    const Float4 limit = Splat(static_cast<float>(context.frameLength / 2));
+    double slope = 1.0, offset = 0.0;
     const bool line = context.SynthesisLine(slope, offset);
-    for (std::size_t k = 0; k < bins; ++k) {
-        const bool trusted = weight[k] > floor;
-        const double time = trusted ? std::clamp(static_cast<double>(shift[k]), -limit, limit) : 0.0;
-        const double moved = line ? offset + slope * time : context.SynthesisTime(time);
-        shift[k] = static_cast<float>(moved - time);
-        if (!trusted) weight[k] = 0.0f;
+    // The time moved to where the map puts it, less the time: the shift.
+    auto four = [&](Float4 cross, Float4 power, Float4& moved, Float4& trust) {
+        const Int4 trusted = power > floor;
+        Float4 time = cross / Select4(trusted, power, Splat(1.0f));
+        time = Select4(trusted, Select4(time > limit, limit, Select4(time < -limit, -limit, time)), Splat(0.0f));
+        moved = static_cast<float>(offset) + static_cast<float>(slope - 1.0) * time;
+        if (!line)
+            for (std::size_t i = 0; i < 4; ++i) moved[i] = static_cast<float>(context.SynthesisTime(time[i]) - time[i]);
+        trust = Select4(trusted, power, Splat(0.0f));
+    };
+    std::size_t k = 0;
+    for (; k + 4 <= bins; k += 4) {
+        Float4 moved, trust;
+        four(Load4(shift + k), Load4(weight + k), moved, trust);
+        Store4(shift + k, moved);
+        for (std::size_t i = 0; i < 4; ++i) weight[k + i] = std::sqrt(trust[i]);
+    }
+    for (; k < bins; ++k) {
+        Float4 moved, trust;
+        four(Splat(shift[k]), Splat(weight[k]), moved, trust);
+        shift[k] = moved[0];
+        weight[k] = std::sqrt(trust[0]);
     }
 }
 
@@ -107,7 +132,14 @@ void PhaseGrad::Process(Frame& frame, Context& context) noexcept {
     const double sigma2 = kHannLambda * n * n / kTwoPi;
     const double ha = context.analysisHop;
     const double binToOmega = kTwoPi / m;
+    const auto omega = static_cast<float>(binToOmega);
+    const Float4 lane = {0.0f, 1.0f, 2.0f, 3.0f};
     *mask = 0;
+
+    // What a steady partial at each bin's frequency advances over the hop,
+    // wrapped (the products themselves are too large for single precision).
+    const double advanceStep = Princarg(binToOmega * ha);
+    for (std::size_t k = 0; k < bins; ++k) m_advance[k] = static_cast<float>(Princarg(advanceStep * static_cast<double>(k)));
 
     for (std::size_t r = context.FirstReconstructedRow(); r < context.EndReconstructedRow(); ++r) {
         const std::size_t row = r * bins;
@@ -121,30 +153,59 @@ void PhaseGrad::Process(Frame& frame, Context& context) noexcept {
         float* prevPgTgrad = m_prevPgTgrad.data() + row;
 
         const float peak = *std::max_element(mag, mag + bins);
-        const float floor = std::max(kAbsoluteFloor, peak * kLogFloor);
-        for (std::size_t k = 0; k < bins; ++k) logMag[k] = std::log(std::max(mag[k], floor));
+        const Float4 floor = Splat(std::max(kAbsoluteFloor, peak * kLogFloor));
+        std::size_t k = 0;
+        for (; k + 4 <= bins; k += 4) {
+            const Float4 v = Load4(mag + k);
+            Store4(logMag + k, Log4(Select4(v > floor, v, floor)));
+        }
+        for (; k < bins; ++k) logMag[k] = Log4(Splat(std::max(mag[k], floor[0])))[0];
 
         const bool pg = UsePg(r, mag2All + row, context);
-        if (pg) *mask |= std::int64_t{1} << r;
+        if (pg) *mask |= r < 64 ? std::int64_t{1} << r : 0;
         const bool hasPrev = m_hasPrev[r] != 0;
 
-        // Magnitude-based estimate: kept for the next frame even when this
-        // frame uses PV.
-        const double logToOmega = m / (kTwoPi * sigma2);
-        for (std::size_t k = 0; k < bins; ++k) {
-            const std::size_t lo = k > 0 ? k - 1 : k;
-            const std::size_t hi = k + 1 < bins ? k + 1 : k;
-            const double slope = (logMag[hi] - logMag[lo]) / static_cast<double>(hi - lo);
-            const double pgNow = binToOmega * static_cast<double>(k) + logToOmega * slope;
-            if (pg) {
-                tgrad[k] = static_cast<float>(hasPrev ? 0.5 * (pgNow + prevPgTgrad[k]) : pgNow);
-            } else {
-                const double omega = binToOmega * static_cast<double>(k);
-                const double deviation = Princarg(static_cast<double>(phase[k]) - prevPhase[k] - omega * ha);
-                tgrad[k] = static_cast<float>(omega + deviation / ha);
+        // Magnitude-based estimate (the log-magnitude's slope across bins):
+        // kept for the next frame even when this frame uses PV.
+        const auto logToOmega = static_cast<float>(m / (kTwoPi * sigma2));
+        float* pgNow = m_pgNow.data();
+        pgNow[0] = logToOmega * (logMag[1] - logMag[0]);
+        pgNow[bins - 1] = static_cast<float>(binToOmega * static_cast<double>(bins - 1)) +
+                          logToOmega * (logMag[bins - 1] - logMag[bins - 2]);
+        for (k = 1; k + 4 < bins; k += 4)
+            Store4(pgNow + k, (lane + static_cast<float>(k)) * omega +
+                                  (0.5f * logToOmega) * (Load4(logMag + k + 1) - Load4(logMag + k - 1)));
+        for (; k + 1 < bins; ++k)
+            pgNow[k] = static_cast<float>(k) * omega + 0.5f * logToOmega * (logMag[k + 1] - logMag[k - 1]);
+
+        const double inverseHop = 1.0 / ha;
+        // The PV estimate: the bin's frequency plus the phase it gained
+        // beyond a steady partial's, per sample; the frequency is added in
+        // double, as each frame adds the hop times this to a phase and a
+        // rounding of it would drift.
+        if (pg) {
+            for (k = 0; k + 4 <= bins; k += 4) {
+                const Float4 now = Load4(pgNow + k);
+                Store4(tgrad + k, hasPrev ? 0.5f * (now + Load4(prevPgTgrad + k)) : now);
             }
-            prevPgTgrad[k] = static_cast<float>(pgNow);
+            for (; k < bins; ++k) tgrad[k] = hasPrev ? 0.5f * (pgNow[k] + prevPgTgrad[k]) : pgNow[k];
+        } else {
+            for (k = 0; k < bins; k += 4) {
+                const std::size_t count = std::min<std::size_t>(4, bins - k);
+                Float4 deviation;
+                if (count == 4) {
+                    deviation = Princarg4(Load4(phase + k) - Load4(prevPhase + k) - Load4(m_advance.data() + k));
+                } else {
+                    for (std::size_t i = 0; i < 4; ++i) {
+                        const std::size_t b = k + std::min(i, count - 1);
+                        deviation[i] = Princarg1(phase[b] - prevPhase[b] - m_advance[b]);
+                    }
+                }
+                for (std::size_t i = 0; i < count; ++i)
+                    tgrad[k + i] = static_cast<float>(binToOmega * static_cast<double>(k + i) + deviation[i] * inverseHop);
+            }
         }
+        std::copy(pgNow, pgNow + bins, prevPgTgrad);
 
         // A bin whose energy sits a time t from the centre steps its phase
         // by -t per radian of frequency; between two bins the time of the
@@ -152,16 +213,22 @@ void PhaseGrad::Process(Frame& frame, Context& context) noexcept {
         float* shift = m_shift.data();
         float* weight = m_weight.data();
         StretchShift(frame, context, r, shift, weight);
-        const auto omega = static_cast<float>(binToOmega);
-        left[0] = 0.0f;
-        for (std::size_t k = 0; k + 1 < bins; ++k) {
-            const auto step = static_cast<float>(Princarg(static_cast<double>(phase[k + 1]) - phase[k]));
+        for (k = 0; k + 4 < bins; k += 4) {
+            const Float4 w0 = Load4(weight + k), w1 = Load4(weight + k + 1);
+            const Float4 total = w0 + w1;
+            const Float4 shifted = w0 * Load4(shift + k) + w1 * Load4(shift + k + 1);
+            const Int4 any = total > 0.0f;
+            const Float4 time = Select4(any, shifted / Select4(any, total, Splat(1.0f)), Splat(0.0f));
+            Store4(right + k, Princarg4(Load4(phase + k + 1) - Load4(phase + k)) - omega * time);
+        }
+        for (; k + 1 < bins; ++k) {
             const float total = weight[k] + weight[k + 1];
             const float time = total > 0.0f ? (weight[k] * shift[k] + weight[k + 1] * shift[k + 1]) / total : 0.0f;
-            right[k] = step - omega * time;
-            left[k + 1] = right[k];
+            right[k] = Princarg1(phase[k + 1] - phase[k]) - omega * time;
         }
         right[bins - 1] = 0.0f;
+        left[0] = 0.0f;
+        std::copy(right, right + bins - 1, left + 1);
 
         std::copy(phase, phase + bins, prevPhase);
         std::copy(mag2All + row, mag2All + row + bins, m_prevMag2.data() + row);

@@ -70,6 +70,8 @@ private:
     AlignedBuffer<float> m_prevPgTgrad;
     AlignedBuffer<float> m_shift;  // of one row
     AlignedBuffer<float> m_weight;  // of one row
+    AlignedBuffer<float> m_pgNow;   // of one row
+    AlignedBuffer<float> m_advance;  // a steady partial's phase advance over the hop, per bin
     std::vector<std::uint8_t> m_hasPrev;
 };
 

@@ -9,7 +9,10 @@ namespace ora::fft {
 
 bool Plpv::Configure(Frame& frame, const Context& context) {
     m_bins = context.bins;
-    m_candidates.assign(context.bins, 0);
+    m_candidates.assign(context.bins + 4, 0);
+    // Room for reading four past the end, kept below any magnitude.
+    m_padded.Resize(context.bins + 8);
+    std::fill(m_padded.begin(), m_padded.end(), -1.0f);
     m_peaks.reserve(kPeakCapacity);
     m_peakPhase.assign(kPeakCapacity, 0.0f);
     m_steps.assign(context.bins, 0.0);
@@ -30,17 +33,20 @@ std::size_t Plpv::FindPeaks(const float* mag) noexcept {
     const std::size_t bins = m_bins;
     const float eps = m_threshold * *std::max_element(mag, mag + bins);
     m_eps = eps;
+    // A local maximum over two bins each side (a Hann main lobe's width):
+    // above those below it, not below those above. Two bins of -1 each side
+    // stand for the ends.
+    float* padded = m_padded.data();
+    std::copy(mag, mag + bins, padded + 2);
     std::size_t count = 0;
-    for (std::size_t k = 0; k < bins; ++k) {
-        const float v = mag[k];
-        if (!(v > eps)) continue;
-        // A local maximum over two bins each side (a Hann main lobe's width).
-        bool peak = true;
-        for (std::size_t d = 1; d <= 2 && peak; ++d) {
-            if (k >= d && !(v > mag[k - d])) peak = false;
-            if (k + d < bins && v < mag[k + d]) peak = false;
+    for (std::size_t k = 0; k < bins; k += 4) {
+        const Float4 v = Load4(padded + k + 2);
+        const Int4 peak = (v > eps) & (v > Load4(padded + k + 1)) & (v > Load4(padded + k)) &
+                          (v >= Load4(padded + k + 3)) & (v >= Load4(padded + k + 4));
+        for (std::size_t i = 0; i < 4; ++i) {
+            m_candidates[count] = static_cast<std::int32_t>(k + i);
+            count += peak[i] != 0 && k + i < bins ? 1 : 0;
         }
-        if (peak) m_candidates[count++] = static_cast<std::int32_t>(k);
     }
     const auto begin = m_candidates.begin();
     if (count > m_maxPeaks) {

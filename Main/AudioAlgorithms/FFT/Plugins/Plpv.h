@@ -53,6 +53,7 @@ private:
     std::size_t m_maxPeaks = 50;
     std::size_t m_bins = 0;
     std::vector<std::int32_t> m_candidates;
+    AlignedBuffer<float> m_padded;  // a row's magnitudes between two bins of -1 each side
     std::vector<std::int32_t> m_peaks;
     std::vector<float> m_peakPhase;
     std::vector<double> m_steps;    // running sum of the frequency steps of one row

@@ -14,6 +14,9 @@ public:
     const char* Name() const override { return "Polar2Rect"; }
     bool Configure(Frame& frame, const Context& context) override;
     void Process(Frame& frame, Context& context) noexcept override;
+
+private:
+    AlignedBuffer<Complex> m_turn;  // the shared row's unit phasors
 };
 
 }  // namespace ora::fft

@@ -35,6 +35,9 @@ public:
         const float sumPower = sum.real() * sum.real() + sum.imag() * sum.imag();
         return sumPower > kCancellation * kCancellation * power ? sum : fsig[k];
     }
+
+private:
+    AlignedBuffer<Complex> m_reference;  // the shared row's bins
 };
 
 }  // namespace ora::fft
