@@ -2,7 +2,19 @@
 
 #include <algorithm>
 
+#include "FFT/PhaseMath.h"
+
 namespace ora::fft {
+
+namespace {
+
+void Multiply(const float* a, const float* b, float* out, std::size_t n) noexcept {
+    std::size_t j = 0;
+    for (; j + 4 <= n; j += 4) Store4(out + j, Load4(a + j) * Load4(b + j));
+    for (; j < n; ++j) out[j] = a[j] * b[j];
+}
+
+}  // namespace
 
 bool In2Dft::Configure(Frame& frame, const Context& context) {
     const std::size_t n = context.frameLength;
@@ -24,8 +36,8 @@ void In2Dft::Centre(const float* samples, const float* window, float* t, std::si
     // Frame sample j sits at transform index (j - n/2) mod m.
     const std::size_t half = n / 2;
     std::fill(t + (n - half), t + (m - half), 0.0f);
-    for (std::size_t j = 0; j < half; ++j) t[j + m - half] = samples[j] * window[j];
-    for (std::size_t j = half; j < n; ++j) t[j - half] = samples[j] * window[j];
+    Multiply(samples, window, t + (m - half), half);
+    Multiply(samples + half, window + half, t, n - half);
 }
 
 void In2Dft::Process(Frame& frame, Context& context) noexcept {
@@ -48,7 +60,9 @@ void In2Dft::Process(Frame& frame, Context& context) noexcept {
     // Time from the frame's true centre, which lies analysisOffset past the
     // middle of the samples read.
     const auto offset = static_cast<float>(context.analysisOffset);
-    for (std::size_t j = 0; j < n; ++j) m_weighted[j] = m_timeWindow[j] - offset * win[j];
+    std::size_t j = 0;
+    for (; j + 4 <= n; j += 4) Store4(m_weighted.data() + j, Load4(m_timeWindow.data() + j) - offset * Load4(win + j));
+    for (; j < n; ++j) m_weighted[j] = m_timeWindow[j] - offset * win[j];
     // TSIG's first row is free again once its transform is done.
     float* t = tsig;
     if (context.SharedRow()) {
@@ -56,7 +70,9 @@ void In2Dft::Process(Frame& frame, Context& context) noexcept {
         std::copy(first, first + n, m_sum.data());
         for (std::size_t c = 1; c < context.channels; ++c) {
             const float* s = m_frame.data() + c * n;
-            for (std::size_t j = 0; j < n; ++j) m_sum[j] += s[j];
+            std::size_t i = 0;
+            for (; i + 4 <= n; i += 4) Store4(m_sum.data() + i, Load4(m_sum.data() + i) + Load4(s + i));
+            for (; i < n; ++i) m_sum[i] += s[i];
         }
         Centre(m_sum.data(), m_weighted.data(), t, n, m);
         context.fft->ForwardReal(t, weighted + context.channels * context.bins);
