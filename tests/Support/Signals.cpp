@@ -57,4 +57,39 @@ std::size_t ArgPeak(const std::vector<float>& x) {
     return best;
 }
 
+namespace {
+
+std::vector<double> Envelope(const std::vector<float>& x, int smoothing) {
+    std::vector<double> weights(static_cast<std::size_t>(2 * smoothing + 1));
+    for (int j = -smoothing; j <= smoothing; ++j)
+        weights[static_cast<std::size_t>(j + smoothing)] = 0.5 + 0.5 * std::cos(kPi * j / (smoothing + 1));
+    const auto n = static_cast<std::ptrdiff_t>(x.size());
+    std::vector<double> envelope(x.size(), 0.0);
+    for (std::ptrdiff_t i = 0; i < n; ++i) {
+        double sum = 0.0;
+        for (std::ptrdiff_t j = std::max<std::ptrdiff_t>(-smoothing, -i); j <= smoothing && i + j < n; ++j)
+            sum += weights[static_cast<std::size_t>(j + smoothing)] * x[i + j] * x[i + j];
+        envelope[static_cast<std::size_t>(i)] = sum;
+    }
+    return envelope;
+}
+
+}  // namespace
+
+double EnvelopeLag(const std::vector<float>& reference, const std::vector<float>& test, int maxLag, int smoothing) {
+    const std::vector<double> a = Envelope(reference, smoothing);
+    const std::vector<double> b = Envelope(test, smoothing);
+    const auto n = static_cast<std::ptrdiff_t>(std::min(a.size(), b.size()));
+    std::vector<double> correlation(static_cast<std::size_t>(2 * maxLag + 1));
+    for (int lag = -maxLag; lag <= maxLag; ++lag) {
+        double sum = 0.0;
+        for (std::ptrdiff_t i = std::max<std::ptrdiff_t>(0, -lag); i < n && i + lag < n; ++i) sum += a[i] * b[i + lag];
+        correlation[static_cast<std::size_t>(lag + maxLag)] = sum;
+    }
+    const auto best = static_cast<std::size_t>(std::max_element(correlation.begin(), correlation.end()) - correlation.begin());
+    if (best == 0 || best + 1 == correlation.size()) return static_cast<double>(best) - maxLag;
+    const double left = correlation[best - 1], centre = correlation[best], right = correlation[best + 1];
+    return static_cast<double>(best) - maxLag + 0.5 * (left - right) / (left - 2.0 * centre + right);
+}
+
 }  // namespace zentest

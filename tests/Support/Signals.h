@@ -22,4 +22,12 @@ float LargestStep(const std::vector<float>& x);
 // Index of the largest magnitude.
 std::size_t ArgPeak(const std::vector<float>& x);
 
+// Delay of `test` against `reference` in samples (positive: later), from
+// the peak of the cross-correlation of their energy envelopes (squares
+// smoothed over +-`smoothing` samples by a Hann window), searched within
+// +-maxLag and interpolated between samples. Holds for signals whose
+// waveform a process changes but whose events it keeps in place.
+double EnvelopeLag(const std::vector<float>& reference, const std::vector<float>& test, int maxLag,
+                   int smoothing = 48);
+
 }  // namespace zentest
