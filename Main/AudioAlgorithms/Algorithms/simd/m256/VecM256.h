@@ -51,7 +51,9 @@ struct VecM256 {
     static T Ge(T a, T b) { return _mm256_cmp_ps(a, b, _CMP_GE_OQ); }
     static T Eq(T a, T b) { return _mm256_cmp_ps(a, b, _CMP_EQ_OQ); }
     static T Ordered(T a, T b) { return _mm256_cmp_ps(a, b, _CMP_ORD_Q); }
-    static T Select(T mask, T a, T b) { return _mm256_blendv_ps(b, a, mask); }
+    // Bitwise: GCC turns a blendv of a comparison into a 256-bit integer
+    // sign test, which AVX without AVX2 does lane by lane.
+    static T Select(T mask, T a, T b) { return _mm256_or_ps(_mm256_and_ps(mask, a), _mm256_andnot_ps(mask, b)); }
 
     // Loads, stores and conversions only: integer arithmetic needs AVX2.
     static I Set1Int(std::uint32_t v) { return _mm256_set1_epi32(static_cast<int>(v)); }
