@@ -1,26 +1,32 @@
 // Every kernel family in every form this processor runs, forced one by one:
 // "realtime" is seconds of 48 kHz audio (one channel, or one matrix-vector
-// product per frame for Gemv) per second of CPU, so the forms of a family
-// compare directly with its ref.
+// product per frame for Gemv, one bin per frame for the complex families,
+// the lags of each 512-sample block for AutoCorr) per second of CPU, so the
+// forms of a family compare directly with its ref.
 #include <benchmark/benchmark.h>
 
+#include <cmath>
 #include <cstdint>
 #include <functional>
 #include <memory>
 #include <string>
 #include <vector>
 
+#include "Algorithms/AutoCorr.h"
 #include "Algorithms/Blas1.h"
 #include "Algorithms/Blas2.h"
+#include "Algorithms/CSquareMagnitude.h"
 #include "Algorithms/CastFloatInt32.h"
 #include "Algorithms/Deinterleave.h"
 #include "Algorithms/FIR.h"
 #include "Algorithms/FIRS.h"
 #include "Algorithms/FindMinMax.h"
+#include "Algorithms/Func.h"
 #include "Algorithms/Interleave.h"
 #include "Algorithms/LR2MS.h"
 #include "Algorithms/MS2LR.h"
 #include "Algorithms/Mix.h"
+#include "Algorithms/Rect2Polar.h"
 #include "Algorithms/TruePeak.h"
 #include "Algorithms/UpsamplerTruePeak_x4.h"
 #include "Algorithms/Vec.h"
@@ -186,6 +192,37 @@ std::vector<Family> Families() {
                             auto f = std::make_shared<random::LCG>();
                             return std::function<void()>([=] { f->Generate(out->data(), kFrames); });
                         }});
+    families.push_back({"AutoCorr/64 lags", true, false, [=] {
+                            auto f = std::make_shared<AutoCorr>(AutoCorrConfig{64});
+                            return std::function<void()>([=] { f->Process(a->data(), kFrames, out->data()); });
+                        }});
+    // Bins of magnitude about 1 to 100, as an FFT of audio gives.
+    families.push_back({"CSquareMagnitude", false, false, [=] {
+                            auto f = std::make_shared<CSquareMagnitude>();
+                            return std::function<void()>([=] { f->Process(a->data(), out->data(), kFrames); });
+                        }});
+    families.push_back({"Rect2Polar", false, false, [=] {
+                            auto f = std::make_shared<Rect2Polar>();
+                            return std::function<void()>(
+                                [=] { f->Process(a->data(), out->data(), out2->data(), kFrames); });
+                        }});
+    using Function = void (Func::*)(const float*, float*, std::size_t) const noexcept;
+    // Inputs as the callers have them: magnitudes for Log10, dB / 20 for
+    // Pow10, levels for Exp and Tanh, powers for Sqrt.
+    auto magnitudes = std::make_shared<std::vector<float>>(Noise(kFrames, 6));
+    for (float& v : *magnitudes) v = std::fabs(v) + 1e-6f;
+    const struct {
+        const char* name;
+        Function function;
+        std::shared_ptr<std::vector<float>> input;
+    } functions[] = {{"Func/Log10", &Func::Log10, magnitudes}, {"Func/Pow10", &Func::Pow10, a},
+                     {"Func/Exp", &Func::Exp, a},               {"Func/Tanh", &Func::Tanh, a},
+                     {"Func/Sqrt", &Func::Sqrt, magnitudes}};
+    for (const auto& function : functions)
+        families.push_back({function.name, true, false, [=, f = function.function, in = function.input] {
+                                auto func = std::make_shared<Func>();
+                                return std::function<void()>([=] { ((*func).*f)(in->data(), out->data(), kFrames); });
+                            }});
     return families;
 }
 

@@ -1,18 +1,22 @@
 // The streaming loops of the vector forms (element-wise maps, conversions,
-// channel layouts, mixing, the random generator), written once over a vector
-// type V (VecM128, VecM256 and their integer types). Free of intrinsics:
-// each form's source includes its own V and instantiates these templates, so
-// every instantiation has internal linkage and is compiled for that form's
-// instruction set only. No std:: helper may be called here: an inline
-// function emitted in a vector source could be the copy every caller links
-// to.
+// channel layouts, mixing, complex bins, the random generator), written once
+// over a vector type V (VecM128, VecM256 and their fused and integer types;
+// VecScalar for the `ref` of the families whose element arithmetic is
+// shared). Free of intrinsics: each form's source includes its own V and
+// instantiates these templates, so every instantiation has internal linkage
+// and is compiled for that form's instruction set only. No std:: helper may
+// be called here: an inline function emitted in a vector source could be
+// the copy every caller links to.
 #pragma once
 
 #include <cstddef>
 #include <cstdint>
 
 #include "Algorithms/simd/CastFloatInt32Kernels.h"
+#include "Algorithms/simd/FuncKernels.h"
 #include "Algorithms/simd/LCGKernels.h"
+#include "Algorithms/simd/MathBodies.h"
+#include "Algorithms/simd/VecKernels.h"
 
 namespace ora::numeric::simd {
 
@@ -48,6 +52,39 @@ void Stream(const float* const (&in)[Ins], float* const (&out)[Outs], std::size_
         for (std::size_t k = 0; k < Outs; ++k) V::Store(out[k] + i, y[k]);
     }
     if (i < n) StreamTail<V>(in, out, i, n, op);
+}
+
+// The last partial vector of StreamComplex.
+template <class V, std::size_t Outs, class Op>
+__attribute__((noinline)) void StreamComplexTail(const float* bins, float* const (&out)[Outs], std::size_t i,
+                                                 std::size_t n, Op op) {
+    constexpr std::size_t W = V::kWidth;
+    typename V::T re, im, y[Outs];
+    float pad[2 * W] = {};
+    for (std::size_t j = 0; i + j < n; ++j) {
+        pad[2 * j] = bins[2 * (i + j)];
+        pad[2 * j + 1] = bins[2 * (i + j) + 1];
+    }
+    V::Deinterleave(V::Load(pad), V::Load(pad + W), re, im);
+    op(re, im, y);
+    for (std::size_t k = 0; k < Outs; ++k) {
+        V::Store(pad, y[k]);
+        for (std::size_t j = 0; i + j < n; ++j) out[k][i + j] = pad[j];
+    }
+}
+
+// The same over complex bins (re, im pairs): op(re, im, y).
+template <class V, std::size_t Outs, class Op>
+void StreamComplex(const float* bins, float* const (&out)[Outs], std::size_t n, Op op) {
+    constexpr std::size_t W = V::kWidth;
+    typename V::T re, im, y[Outs];
+    std::size_t i = 0;
+    for (; i + W <= n; i += W) {
+        V::Deinterleave(V::Load(bins + 2 * i), V::Load(bins + 2 * i + W), re, im);
+        op(re, im, y);
+        for (std::size_t k = 0; k < Outs; ++k) V::Store(out[k] + i, y[k]);
+    }
+    if (i < n) StreamComplexTail<V>(bins, out, i, n, op);
 }
 
 // m = (l + r) * 0.5, s = (l - r) * 0.5
@@ -100,6 +137,11 @@ template <class V>
 void Clamp(const float* a, float lo, float hi, float* out, std::size_t n) {
     const typename V::T low = V::Set1(lo), high = V::Set1(hi);
     Stream<V, 1, 1>({a}, {out}, n, [low, high](const auto& x, auto& y) { y[0] = V::Min(V::Max(x[0], low), high); });
+}
+
+template <class V>
+constexpr kernels::VecKernels VecTable() {
+    return {Add<V>, Subtract<V>, Multiply<V>, Scale<V>, Abs<V>, Clamp<V>};
 }
 
 // y += a * x
@@ -226,6 +268,31 @@ std::uint32_t Lcg(std::uint32_t state, float* out, std::size_t n) {
         lanes = V::AddInt(V::MulInt(lanes, jumpMultiplier), jumpIncrement);
     }
     return kernels::LCG_ref(state, out + i, n - i);
+}
+
+// |z|^2 = re * re + im * im
+template <class V>
+void CSquareMagnitude(const float* bins, float* out, std::size_t n) {
+    StreamComplex<V, 1>(bins, {out}, n, [](auto re, auto im, auto& y) { y[0] = V::Add(V::Mul(re, re), V::Mul(im, im)); });
+}
+
+template <class V>
+void Rect2Polar(const float* bins, float* magnitude, float* phase, std::size_t n) {
+    StreamComplex<V, 2>(bins, {magnitude, phase}, n, [](auto re, auto im, auto& y) {
+        y[0] = V::Sqrt(V::Add(V::Mul(re, re), V::Mul(im, im)));
+        y[1] = Atan2<V>(im, re);
+    });
+}
+
+// out[i] = F(x[i])
+template <class V, typename V::T (*F)(typename V::T)>
+void Map(const float* x, float* out, std::size_t n) {
+    Stream<V, 1, 1>({x}, {out}, n, [](const auto& in, auto& y) { y[0] = F(in[0]); });
+}
+
+template <class V>
+constexpr kernels::FuncKernels FuncTable() {
+    return {Map<V, Log10<V>>, Map<V, Pow10<V>>, Map<V, Exp<V>>, Map<V, Tanh<V>>, Map<V, V::Sqrt>};
 }
 
 }  // namespace ora::numeric::simd

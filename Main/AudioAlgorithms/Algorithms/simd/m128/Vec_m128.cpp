@@ -5,7 +5,6 @@
 
 namespace ora::numeric::kernels {
 
-const VecKernels kVec_m128 = {simd::Add<VecM128>,   simd::Subtract<VecM128>, simd::Multiply<VecM128>,
-                             simd::Scale<VecM128>, simd::Abs<VecM128>,      simd::Clamp<VecM128>};
+const VecKernels kVec_m128 = simd::VecTable<VecM128>();
 
 }  // namespace ora::numeric::kernels

@@ -5,7 +5,6 @@
 
 namespace ora::numeric::kernels {
 
-const VecKernels kVec_m256 = {simd::Add<VecM256>,   simd::Subtract<VecM256>, simd::Multiply<VecM256>,
-                             simd::Scale<VecM256>, simd::Abs<VecM256>,      simd::Clamp<VecM256>};
+const VecKernels kVec_m256 = simd::VecTable<VecM256>();
 
 }  // namespace ora::numeric::kernels
