@@ -9,6 +9,17 @@
 
 namespace ora::numeric::simd {
 
+// v's lanes folded down to the first `Lanes` by fold(v, width), which puts
+// the upper half of `width` lanes onto the lower; unrolled, since the widths
+// are known.
+template <class V, int Lanes, class Fold>
+typename V::T FoldTo(typename V::T v, Fold fold) {
+    if constexpr (V::kWidth >= 8 && Lanes < 8) v = fold(v, 8);
+    if constexpr (V::kWidth >= 4 && Lanes < 4) v = fold(v, 4);
+    if constexpr (V::kWidth >= 2 && Lanes < 2) v = fold(v, 2);
+    return v;
+}
+
 // Eight partial sums s[i % 8], (s_k + s_k+4) folded as ((t0 + t2) + (t1 + t3)),
 // then the rest one by one: kDotPartials / W vectors carry the partials.
 constexpr std::size_t kDotPartials = 8;
@@ -24,8 +35,7 @@ float Dot(const float* x, const float* y, std::size_t n) {
             acc[v] = V::Add(acc[v], V::Mul(V::Load(x + i + v * W), V::Load(y + i + v * W)));
     typename V::T t = acc[0];
     for (std::size_t v = 1; v < kVectors; ++v) t = V::Add(t, acc[v]);
-    for (int width = V::kWidth; width > 1; width /= 2) t = V::FoldAdd(t, width);
-    float sum = V::First(t);
+    float sum = V::First(FoldTo<V, 1>(t, [](auto v, int width) { return V::FoldAdd(v, width); }));
     for (; i < n; ++i) sum += x[i] * y[i];
     return sum;
 }
@@ -69,12 +79,8 @@ void FindMinMaxOf(const float* x, std::size_t frames, float* mn, float* mx) {
         lo = V::Min(v, lo);
         hi = V::Max(v, hi);
     }
-    for (int width = W; width > C; width /= 2) {
-        lo = V::FoldMin(lo, width);
-        hi = V::FoldMax(hi, width);
-    }
-    V::StoreFirst(mn, lo, C);
-    V::StoreFirst(mx, hi, C);
+    V::StoreFirst(mn, FoldTo<V, C>(lo, [](auto v, int width) { return V::FoldMin(v, width); }), C);
+    V::StoreFirst(mx, FoldTo<V, C>(hi, [](auto v, int width) { return V::FoldMax(v, width); }), C);
     for (; i < values; ++i) {
         const std::size_t c = i % C;
         if (x[i] < mn[c]) mn[c] = x[i];
@@ -108,8 +114,7 @@ float TruePeakScan(const float* points, std::size_t middles, float peak) {
         const typename V::T isPeak = V::And(V::And(V::Ge(b, a), V::Ge(b, c)), V::Gt(d, zero));
         best = V::Max(V::Select(isPeak, vertex, b), best);
     }
-    for (int width = V::kWidth; width > 1; width /= 2) best = V::FoldMax(best, width);
-    peak = V::First(best);
+    peak = V::First(FoldTo<V, 1>(best, [](auto v, int width) { return V::FoldMax(v, width); }));
     for (; i <= middles; ++i) {
         const float a = __builtin_fabsf(points[i - 1]);
         const float b = __builtin_fabsf(points[i]);

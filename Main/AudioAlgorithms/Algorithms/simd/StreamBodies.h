@@ -20,27 +20,29 @@
 
 namespace ora::numeric::simd {
 
-// The last partial vector of Stream, through zero-padded copies; out of
-// line, so that the loop of whole vectors needs no stack frame.
+// The last partial vector of Stream, `rest` elements from in[k] and out[k],
+// through zero-padded copies; out of line, so that the loop of whole
+// vectors needs no stack frame.
 template <class V, std::size_t Ins, std::size_t Outs, class Op>
-__attribute__((noinline)) void StreamTail(const float* const (&in)[Ins], float* const (&out)[Outs], std::size_t i,
-                                          std::size_t n, Op op) {
+__attribute__((noinline)) void StreamTail(const float* const* in, float* const* out, std::size_t rest, const Op& op) {
     typename V::T x[Ins], y[Outs];
     float pad[V::kWidth] = {};
     for (std::size_t k = 0; k < Ins; ++k) {
-        for (std::size_t j = 0; i + j < n; ++j) pad[j] = in[k][i + j];
+        for (std::size_t j = 0; j < rest; ++j) pad[j] = in[k][j];
         x[k] = V::Load(pad);
     }
     op(x, y);
     for (std::size_t k = 0; k < Outs; ++k) {
         V::Store(pad, y[k]);
-        for (std::size_t j = 0; i + j < n; ++j) out[k][i + j] = pad[j];
+        for (std::size_t j = 0; j < rest; ++j) out[k][j] = pad[j];
     }
 }
 
 // op(x, y) maps Ins input vectors to Outs output vectors. Whole vectors are
 // read in place; the last partial one goes through zero-padded copies, so
-// every element takes the same lane arithmetic. Outputs may be inputs.
+// every element takes the same lane arithmetic. Outputs may be inputs. Ops
+// capture scalars, not vectors (their constants are hoisted out of the
+// loop), so that handing the op to the tail spills nothing.
 template <class V, std::size_t Ins, std::size_t Outs, class Op>
 void Stream(const float* const (&in)[Ins], float* const (&out)[Outs], std::size_t n, Op op) {
     constexpr std::size_t W = V::kWidth;
@@ -51,25 +53,27 @@ void Stream(const float* const (&in)[Ins], float* const (&out)[Outs], std::size_
         op(x, y);
         for (std::size_t k = 0; k < Outs; ++k) V::Store(out[k] + i, y[k]);
     }
-    if (i < n) StreamTail<V>(in, out, i, n, op);
+    if (i == n) return;
+    const float* tailIn[Ins];
+    float* tailOut[Outs];
+    for (std::size_t k = 0; k < Ins; ++k) tailIn[k] = in[k] + i;
+    for (std::size_t k = 0; k < Outs; ++k) tailOut[k] = out[k] + i;
+    StreamTail<V, Ins, Outs>(tailIn, tailOut, n - i, op);
 }
 
 // The last partial vector of StreamComplex.
 template <class V, std::size_t Outs, class Op>
-__attribute__((noinline)) void StreamComplexTail(const float* bins, float* const (&out)[Outs], std::size_t i,
-                                                 std::size_t n, Op op) {
+__attribute__((noinline)) void StreamComplexTail(const float* bins, float* const* out, std::size_t rest,
+                                                 const Op& op) {
     constexpr std::size_t W = V::kWidth;
     typename V::T re, im, y[Outs];
     float pad[2 * W] = {};
-    for (std::size_t j = 0; i + j < n; ++j) {
-        pad[2 * j] = bins[2 * (i + j)];
-        pad[2 * j + 1] = bins[2 * (i + j) + 1];
-    }
+    for (std::size_t j = 0; j < 2 * rest; ++j) pad[j] = bins[j];
     V::Deinterleave(V::Load(pad), V::Load(pad + W), re, im);
     op(re, im, y);
     for (std::size_t k = 0; k < Outs; ++k) {
         V::Store(pad, y[k]);
-        for (std::size_t j = 0; i + j < n; ++j) out[k][i + j] = pad[j];
+        for (std::size_t j = 0; j < rest; ++j) out[k][j] = pad[j];
     }
 }
 
@@ -84,16 +88,18 @@ void StreamComplex(const float* bins, float* const (&out)[Outs], std::size_t n, 
         op(re, im, y);
         for (std::size_t k = 0; k < Outs; ++k) V::Store(out[k] + i, y[k]);
     }
-    if (i < n) StreamComplexTail<V>(bins, out, i, n, op);
+    if (i == n) return;
+    float* tailOut[Outs];
+    for (std::size_t k = 0; k < Outs; ++k) tailOut[k] = out[k] + i;
+    StreamComplexTail<V, Outs>(bins + 2 * i, tailOut, n - i, op);
 }
 
 // m = (l + r) * 0.5, s = (l - r) * 0.5
 template <class V>
 void LR2MS(const float* l, const float* r, float* m, float* s, std::size_t frames) {
-    const typename V::T half = V::Set1(0.5f);
-    Stream<V, 2, 2>({l, r}, {m, s}, frames, [half](const auto& x, auto& y) {
-        y[0] = V::Mul(V::Add(x[0], x[1]), half);
-        y[1] = V::Mul(V::Sub(x[0], x[1]), half);
+    Stream<V, 2, 2>({l, r}, {m, s}, frames, [](const auto& x, auto& y) {
+        y[0] = V::Mul(V::Add(x[0], x[1]), V::Set1(0.5f));
+        y[1] = V::Mul(V::Sub(x[0], x[1]), V::Set1(0.5f));
     });
 }
 
@@ -123,8 +129,7 @@ void Multiply(const float* a, const float* b, float* out, std::size_t n) {
 
 template <class V>
 void Scale(const float* a, float s, float* out, std::size_t n) {
-    const typename V::T factor = V::Set1(s);
-    Stream<V, 1, 1>({a}, {out}, n, [factor](const auto& x, auto& y) { y[0] = V::Mul(x[0], factor); });
+    Stream<V, 1, 1>({a}, {out}, n, [s](const auto& x, auto& y) { y[0] = V::Mul(x[0], V::Set1(s)); });
 }
 
 template <class V>
@@ -135,8 +140,8 @@ void Abs(const float* a, float* out, std::size_t n) {
 // Max(x, lo) is x > lo ? x : lo, which sends NaN to lo as the reference does.
 template <class V>
 void Clamp(const float* a, float lo, float hi, float* out, std::size_t n) {
-    const typename V::T low = V::Set1(lo), high = V::Set1(hi);
-    Stream<V, 1, 1>({a}, {out}, n, [low, high](const auto& x, auto& y) { y[0] = V::Min(V::Max(x[0], low), high); });
+    Stream<V, 1, 1>({a}, {out}, n,
+                    [lo, hi](const auto& x, auto& y) { y[0] = V::Min(V::Max(x[0], V::Set1(lo)), V::Set1(hi)); });
 }
 
 template <class V>
@@ -147,10 +152,8 @@ constexpr kernels::VecKernels VecTable() {
 // y += a * x
 template <class V>
 void Axpy(float a, const float* x, float* y, std::size_t n) {
-    const typename V::T factor = V::Set1(a);
-    Stream<V, 2, 1>({x, y}, {y}, n, [factor](const auto& in, auto& out) {
-        out[0] = V::Add(in[1], V::Mul(factor, in[0]));
-    });
+    Stream<V, 2, 1>({x, y}, {y}, n,
+                    [a](const auto& in, auto& out) { out[0] = V::Add(in[1], V::Mul(V::Set1(a), in[0])); });
 }
 
 // out[n] = sum_i weights[i] * sources[i][n], in source order.

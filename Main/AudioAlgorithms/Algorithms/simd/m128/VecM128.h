@@ -24,7 +24,9 @@ struct VecM128 {
     // first lanes; count 1, 2 or 4.
     static T LoadRepeated(const float* p, int count) {
         if (count == 1) return _mm_set1_ps(p[0]);
-        return count == 2 ? _mm_setr_ps(p[0], p[1], p[0], p[1]) : _mm_loadu_ps(p);
+        if (count == 4) return _mm_loadu_ps(p);
+        const __m128 pair = _mm_castsi128_ps(_mm_loadl_epi64(reinterpret_cast<const __m128i*>(p)));
+        return _mm_movelh_ps(pair, pair);
     }
     static void StoreFirst(float* p, T v, int count) {
         if (count == 1) return _mm_store_ss(p, v);

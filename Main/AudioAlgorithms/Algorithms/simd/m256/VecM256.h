@@ -22,7 +22,8 @@ struct VecM256 {
     static float First(T v) { return _mm256_cvtss_f32(v); }
     static T LoadRepeated(const float* p, int count) {
         if (count == 1) return _mm256_set1_ps(p[0]);
-        if (count == 2) return _mm256_setr_ps(p[0], p[1], p[0], p[1], p[0], p[1], p[0], p[1]);
+        // One 64-bit load: lanes built from scalars would be stored and read back.
+        if (count == 2) return _mm256_castpd_ps(_mm256_broadcast_sd(reinterpret_cast<const double*>(p)));
         return _mm256_broadcast_ps(reinterpret_cast<const __m128*>(p));
     }
     static void StoreFirst(float* p, T v, int count) {
