@@ -94,3 +94,35 @@ TEST(SmoothedValueGroup, SettlesExactlyOnItsTarget) {
     // No creeping toward denormals: the value lands on the target.
     EXPECT_EQ(group[0].current.load(), 0.0);
 }
+
+TEST(SmoothedValueGroup, ASettledCursorGivesTheRecursionsValuesBitForBit) {
+    // Ramps up, down and from a value never reached, block after block, past
+    // the fixed point where the cursor stops computing: every value is the
+    // plain recursion's, and the cursor says it settled only there.
+    zen::OnePoleSmoother::RefreshAll(44100.0);
+    const double a = zen::GlobalSmoothing::SharedSmoother().GetA(), b = zen::GlobalSmoothing::SharedSmoother().GetB();
+    std::atomic<bool> processing{true};
+    zen::SmoothedValueGroup group(1, 1.0f);
+    group.SetRampingFlag(&processing);
+    double expected = 1.0;
+    for (float target : {2.818383f, 0.0617f, 1.0f}) {
+        zen::GlobalSmoothing::EnterProcessing();
+        group.SetTarget(target);
+        zen::GlobalSmoothing::LeaveProcessing();
+        int settledBlocks = 0;
+        for (int block = 0; block < 200; ++block) {
+            auto cursor = group.Track(0);
+            const bool fixedPoint = a * expected + b * target == expected;
+            ASSERT_EQ(cursor.IsSettled(), fixedPoint) << target << " block " << block;
+            settledBlocks += fixedPoint;
+            for (int i = 0; i < 509; ++i) {
+                expected = a * expected + b * target;
+                ASSERT_EQ(cursor.Next(), expected) << target << " block " << block << " sample " << i;
+            }
+            EXPECT_EQ(cursor.Value(), expected);
+        }
+        EXPECT_GT(settledBlocks, 50) << target;  // about a second in
+        EXPECT_EQ(static_cast<float>(expected), target);
+    }
+    zen::OnePoleSmoother::RefreshAll(48000.0);
+}

@@ -26,7 +26,8 @@ public:
               m_current(element.current.load(std::memory_order_relaxed)),
               m_target(element.target.load(std::memory_order_relaxed)),
               m_a(a),
-              m_b(b) {}
+              m_b(b),
+              m_settled(m_a * m_current + m_b * m_target == m_current) {}
         ~Cursor() {
             // Snap only far below float resolution: a ramp toward 0 never
             // reaches denormals, and no block split can change what is heard.
@@ -37,9 +38,16 @@ public:
         Cursor& operator=(const Cursor&) = delete;
 
         double Next() noexcept {
-            m_current = m_a * m_current + m_b * m_target;
+            if (!m_settled) m_current = m_a * m_current + m_b * m_target;
             return m_current;
         }
+
+        // True when the recursion has reached its fixed point (usually a few
+        // hundred ulps short of the target, about a second after a change):
+        // every Next() of this block returns Value(), so callers may apply it
+        // as a constant.
+        bool IsSettled() const noexcept { return m_settled; }
+        double Value() const noexcept { return m_current; }
 
     private:
         static constexpr double kSnapDistance = 1e-30;
@@ -48,6 +56,8 @@ public:
         const double m_target;
         const double m_a;
         const double m_b;
+        // Skipping the recursion at its fixed point changes no value.
+        const bool m_settled;
     };
 
     SmoothedValueGroup(std::size_t elementCount, float initialValue);
