@@ -80,19 +80,19 @@ void ZenLimiter::ApplyInputGain(float* const* channels, std::uint32_t channelCou
     }
 }
 
-void ZenLimiter::TrackCeiling(std::uint32_t frames) noexcept {
+void ZenLimiter::Limit(float* const* channels, std::uint32_t frames) noexcept {
     auto ceiling = Smoothed(kCeiling).Track(0);
     if (ceiling.IsSettled()) {
-        std::fill_n(m_ceilings.begin(), frames, static_cast<float>(ceiling.Value()));
+        m_limiter.Process(channels, frames, static_cast<float>(ceiling.Value()));
         return;
     }
     for (std::uint32_t i = 0; i < frames; ++i) m_ceilings[i] = static_cast<float>(ceiling.Next());
+    m_limiter.Process(channels, frames, m_ceilings.data());
 }
 
 void ZenLimiter::ProcessBlock(float* const* channels, std::uint32_t channelCount, std::uint32_t frames) noexcept {
     ApplyInputGain(channels, channelCount, frames);
-    TrackCeiling(frames);
-    m_limiter.Process(channels, frames, m_ceilings.data());
+    Limit(channels, frames);
 
     for (std::uint32_t c = 0; c < channelCount; ++c) {
         PublishMeter(kInputTruePeakMeter, c, m_limiter.GetInputTruePeak(c));

@@ -41,7 +41,8 @@ protected:
 
 private:
     void ApplyInputGain(float* const* channels, std::uint32_t channelCount, std::uint32_t frames) noexcept;
-    void TrackCeiling(std::uint32_t frames) noexcept;
+    // The limiter with the smoothed ceiling, per sample while it moves.
+    void Limit(float* const* channels, std::uint32_t frames) noexcept;
 
     Limiter m_limiter;
     ora::numeric::Vec m_vec;
