@@ -38,14 +38,16 @@ public:
         Cursor& operator=(const Cursor&) = delete;
 
         double Next() noexcept {
-            if (!m_settled) m_current = m_a * m_current + m_b * m_target;
+            m_current = m_a * m_current + m_b * m_target;
             return m_current;
         }
 
-        // True when the recursion has reached its fixed point (usually a few
-        // hundred ulps short of the target, about a second after a change):
-        // every Next() of this block returns Value(), so callers may apply it
-        // as a constant.
+        // True when the recursion stands at its fixed point (a few hundred
+        // ulps short of the target, about a second after a change): every
+        // Next() of this block returns Value(), so a caller may apply it as a
+        // constant, by a vector kernel, instead of advancing per sample.
+        // Next() itself does not test it: a branch per sample costs light
+        // loops more than the recursion it saves.
         bool IsSettled() const noexcept { return m_settled; }
         double Value() const noexcept { return m_current; }
 
@@ -56,7 +58,6 @@ public:
         const double m_target;
         const double m_a;
         const double m_b;
-        // Skipping the recursion at its fixed point changes no value.
         const bool m_settled;
     };
 
