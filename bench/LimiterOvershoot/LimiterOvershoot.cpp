@@ -2,10 +2,12 @@
 // and on: the output's true peak read 16 times per sample by the tests'
 // independent checker, less the ceiling, over noises, music-like material,
 // sines and any WAV files given (their first channel). Prints a Markdown
-// table. Not part of make test or make bench.
+// table; --peak only reads the true peak of each file given (a limiter's
+// output, say). Not part of make test or make bench.
 //
 //   cmake --build build --target ZenLimiterOvershoot
 //   build/bin/ZenLimiterOvershoot [--ceiling dB] [file.wav ...]
+//   build/bin/ZenLimiterOvershoot --peak file.wav ...
 #include <sndfile.h>
 
 #include <cmath>
@@ -41,7 +43,8 @@ std::vector<float> PinkNoise(std::size_t frames, std::uint32_t seed) {
     return pink;
 }
 
-std::vector<float> ReadFirstChannel(const std::string& path, double& rate) {
+// Planar channels.
+std::vector<std::vector<float>> Read(const std::string& path, double& rate) {
     SF_INFO info{};
     SNDFILE* file = sf_open(path.c_str(), SFM_READ, &info);
     if (file == nullptr) {
@@ -51,10 +54,12 @@ std::vector<float> ReadFirstChannel(const std::string& path, double& rate) {
     std::vector<float> interleaved(static_cast<std::size_t>(info.frames * info.channels));
     sf_readf_float(file, interleaved.data(), info.frames);
     sf_close(file);
-    std::vector<float> first(static_cast<std::size_t>(info.frames));
-    for (std::size_t n = 0; n < first.size(); ++n) first[n] = interleaved[n * static_cast<std::size_t>(info.channels)];
+    const auto channels = static_cast<std::size_t>(info.channels);
+    std::vector<std::vector<float>> planar(channels, std::vector<float>(static_cast<std::size_t>(info.frames)));
+    for (std::size_t n = 0; n < planar[0].size(); ++n)
+        for (std::size_t c = 0; c < channels; ++c) planar[c][n] = interleaved[n * channels + c];
     rate = info.samplerate;
-    return first;
+    return planar;
 }
 
 // Output true peak minus the ceiling, in dB.
@@ -78,13 +83,26 @@ void Row(const std::string& name, const std::vector<float>& input, double rate, 
 
 int main(int argc, char** argv) {
     float ceilingDb = -1.0f;
+    bool peakOnly = false;
     std::vector<std::string> files;
     for (int i = 1; i < argc; ++i) {
         const std::string argument = argv[i];
         if (argument == "--ceiling" && i + 1 < argc)
             ceilingDb = std::strtof(argv[++i], nullptr);
+        else if (argument == "--peak")
+            peakOnly = true;
         else
             files.push_back(argument);
+    }
+    if (peakOnly) {
+        const zentest::OversampledPeak check;
+        for (const std::string& path : files) {
+            double rate = kRate;
+            for (const std::vector<float>& channel : Read(path, rate))
+                std::printf("%s: sample peak %+.2f dBFS, true peak %+.2f dBTP\n", path.c_str(),
+                            zentest::ToDb(zentest::Peak(channel)), zentest::ToDb(check.Measure(channel)));
+        }
+        return 0;
     }
     std::printf("Output true peak (16x) less the ceiling of %.1f dBTP, in dB; 48 kHz unless a file says otherwise\n\n",
                 ceilingDb);
@@ -101,7 +119,7 @@ int main(int argc, char** argv) {
                 zentest::Sine(frequency, kRate, kRate, 1.0, 0.7), kRate, ceilingDb, gain);
     for (const std::string& path : files) {
         double rate = kRate;
-        const std::vector<float> input = ReadFirstChannel(path, rate);
+        const std::vector<float> input = Read(path, rate)[0];
         for (float gain : {0.0f, 6.0f, 12.0f}) Row(path, input, rate, ceilingDb, gain);
     }
     return 0;
