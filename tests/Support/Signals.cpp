@@ -28,6 +28,26 @@ std::vector<float> Impulse(std::size_t frames, std::size_t at, float value) {
     return x;
 }
 
+std::vector<float> MusicLike(double sampleRate, std::size_t frames) {
+    std::vector<float> x(frames, 0.0f);
+    const std::vector<float> noise = Noise(frames, 1.0, 77);
+    const double notes[] = {110.0, 164.8, 220.0, 277.2, 329.6, 440.0, 659.3, 880.0};
+    const auto beat = static_cast<std::size_t>(sampleRate * 0.125);
+    for (std::size_t n = 0; n < frames; ++n) {
+        const double t = static_cast<double>(n) / sampleRate;
+        const std::size_t bar = n / beat;
+        const double local = static_cast<double>(n % beat) / sampleRate;
+        const double f = notes[bar % 8];
+        double v = 0.0;
+        for (int h = 1; h <= 12; ++h) v += std::sin(2.0 * kPi * f * h * t + h) / h * std::exp(-local * (3.0 + h));
+        v += 1.2 * std::sin(2.0 * kPi * (50.0 + 120.0 * std::exp(-local * 30.0)) * local) * std::exp(-local * 12.0);
+        if (bar % 2 == 1) v += 0.6 * noise[n] * std::exp(-local * 60.0);
+        v += 0.2 * std::sin(2.0 * kPi * 9000.0 * t) * (0.5 + 0.5 * std::sin(2.0 * kPi * 3.0 * t));
+        x[n] = static_cast<float>(0.9 * v);
+    }
+    return x;
+}
+
 float Peak(const std::vector<float>& x, std::size_t from, std::size_t to) {
     float peak = 0.0f;
     for (std::size_t n = from; n < std::min(to, x.size()); ++n) peak = std::max(peak, std::fabs(x[n]));
