@@ -20,10 +20,6 @@ constexpr std::uint64_t kForwardedTo[] = {SpectrumAnalyzer::kSize, SpectrumAnaly
 
 constexpr float kFloorPower = 1e-12f;  // -120 dB
 
-void ToDb(const float* power, float* db, std::size_t n) {
-    for (std::size_t k = 0; k < n; ++k) db[k] = 10.0f * std::log10(std::max(power[k], kFloorPower));
-}
-
 }  // namespace
 
 ZenFrequency::ZenFrequency() {
@@ -63,7 +59,7 @@ const zen::MeterTableDefinition& ZenFrequency::Meters() {
                        OctaveBands::kBands)
                 .PerChannel()
                 .AtRest(kFloorDb),
-            RingMeter("SPECTRUM", QT_TRANSLATE_NOOP("ZenFrequency", "Spectrum"), "dBFS", -90.0f, 6.0f, kRecordWidth,
+            RingMeter("SPECTRUM", QT_TRANSLATE_NOOP("ZenFrequency", "Spectrum"), "", 0.0f, 1.0f, kRecordWidth,
                       kSpectrumRecords)
                 .PerChannel(),
         });
@@ -75,12 +71,17 @@ void ZenFrequency::UpdateProcessingParameter(std::uint32_t index, float value) {
     m_analyzer.SetParameter(kForwardedTo[index], value);
     // Other bins or other rows: what the editor holds no longer fits.
     if (index != kAverage && index != kDecay) ResetMeters();
+    if (index == kSize) {
+        std::fill(m_record.begin(), m_record.end(), 0.0f);
+        ChooseRecordStep();
+    }
 }
 
 void ZenFrequency::PrepareProcessing(float sampleRate, std::uint32_t maxBlockSize) {
     m_analyzer.SetChannelCount(GetProcessChannelCount());
     m_analyzer.Prepare(sampleRate, maxBlockSize);
-    m_record.assign(kRecordWidth, kFloorDb);
+    m_record.assign(kRecordWidth, 0.0f);
+    ChooseRecordStep();
     SetLatency(0);
 }
 
@@ -96,16 +97,26 @@ void ZenFrequency::ProcessBlock(float* const* channels, std::uint32_t channelCou
     }
 }
 
+void ZenFrequency::ChooseRecordStep() noexcept {
+    const double framesPerSecond =
+        GetSampleRate() * static_cast<double>(SpectrumAnalyzer::kFramesPerSize) / static_cast<double>(m_analyzer.Size());
+    m_recordStep = static_cast<std::uint64_t>(std::max(1.0, std::ceil(framesPerSecond / kMaxRecordsPerSecond)));
+}
+
 void ZenFrequency::PublishFrame() noexcept {
     const std::size_t bins = m_analyzer.Bins();
+    const bool record = m_analyzer.Frames() % m_recordStep == 0;
     for (std::size_t row = 0; row < m_analyzer.Rows(); ++row) {
         const auto channel = static_cast<std::uint32_t>(row);
-        m_record[0] = static_cast<float>(bins);
-        ToDb(m_analyzer.Spectrum(row), m_record.data() + 1, bins);
-        ToDb(m_analyzer.PeakHold(row), m_record.data() + 1 + bins, bins);
-        std::fill(m_record.begin() + static_cast<std::ptrdiff_t>(1 + 2 * bins), m_record.end(), kFloorDb);
-        PushRing(kSpectrum, channel, m_record.data());
-        ToDb(m_analyzer.Bands(row), m_bands, zen::OctaveBands::kBands);
+        if (record) {
+            m_record[0] = static_cast<float>(bins);
+            std::copy_n(m_analyzer.Spectrum(row), bins, m_record.data() + 1);
+            std::copy_n(m_analyzer.PeakHold(row), bins, m_record.data() + 1 + bins);
+            PushRing(kSpectrum, channel, m_record.data());
+        }
+        const float* bands = m_analyzer.Bands(row);
+        for (std::size_t b = 0; b < zen::OctaveBands::kBands; ++b)
+            m_bands[b] = 10.0f * std::log10(std::max(bands[b], kFloorPower));
         PublishArray(kBands, channel, m_bands);
     }
 }
