@@ -3,6 +3,7 @@
 #include <QCoreApplication>
 #include <cmath>
 
+#include "LoudnessMeter.h"
 #include "SpeakerLayout.h"
 
 namespace zen {
@@ -21,6 +22,13 @@ int LfeChoice::Channel(std::size_t channels, float choice) {
     if (value == kAuto) return SpeakerLayout::DefaultLfe(channels);
     const int channel = value - kFirstChannel;
     return channel >= 0 && static_cast<std::size_t>(channel) < channels ? channel : SpeakerLayout::kNoLfe;
+}
+
+int LfeChoice::ApplyWeights(LoudnessMeter& meter, float choice) {
+    const auto channels = static_cast<std::size_t>(meter.GetChannelCount());
+    const int lfe = Channel(channels, choice);
+    for (std::size_t c = 0; c < channels; ++c) meter.SetChannelWeight(c, SpeakerLayout::LoudnessWeight(channels, c, lfe));
+    return lfe;
 }
 
 }  // namespace zen

@@ -7,6 +7,8 @@
 
 #include "../ParameterDefinition.h"
 
+class LoudnessMeter;
+
 namespace zen {
 
 class LfeChoice {
@@ -21,6 +23,9 @@ public:
     // The LFE's channel index for a choice, or SpeakerLayout::kNoLfe (also
     // for a channel the layout does not have).
     static int Channel(std::size_t channels, float choice);
+    // Weighs the meter's channels for a choice (surrounds +1.5 dB, the LFE
+    // left out); returns the LFE's channel. No allocation.
+    static int ApplyWeights(LoudnessMeter& meter, float choice);
 };
 
 }  // namespace zen

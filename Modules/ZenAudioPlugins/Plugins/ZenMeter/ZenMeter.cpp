@@ -5,7 +5,6 @@
 #include <cmath>
 
 #include "Common/Algorithms/LfeChoice.h"
-#include "Common/Algorithms/SpeakerLayout.h"
 #include "Common/ZenAudioPlugin.h"
 
 const zen::PluginDescriptor ZenMeter::kDescriptor = {
@@ -82,7 +81,7 @@ void ZenMeter::UpdateProcessingParameter(std::uint32_t index, float value) {
     switch (index) {
         case kLfeChannel:
             m_lfeChoice = value;
-            ApplyLfe();
+            zen::LfeChoice::ApplyWeights(m_loudness, m_lfeChoice);
             break;
         case kTruePeak: m_loudness.SetTruePeakEnabled(value >= 0.5f); break;
         case kReset: {
@@ -99,17 +98,10 @@ void ZenMeter::UpdateProcessingParameter(std::uint32_t index, float value) {
     }
 }
 
-void ZenMeter::ApplyLfe() noexcept {
-    const auto channels = static_cast<std::size_t>(m_loudness.GetChannelCount());
-    const int lfe = zen::LfeChoice::Channel(channels, m_lfeChoice);
-    for (std::size_t c = 0; c < channels; ++c)
-        m_loudness.SetChannelWeight(c, zen::SpeakerLayout::LoudnessWeight(channels, c, lfe));
-}
-
 void ZenMeter::PrepareProcessing(float sampleRate, std::uint32_t maxBlockSize) {
     m_loudness.SetChannelCount(GetProcessChannelCount());
     m_loudness.Prepare(sampleRate, maxBlockSize);
-    ApplyLfe();
+    zen::LfeChoice::ApplyWeights(m_loudness, m_lfeChoice);
     m_hopsPushed = 0;
     SetLatency(0);
 }

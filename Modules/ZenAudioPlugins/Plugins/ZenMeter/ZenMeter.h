@@ -53,7 +53,6 @@ protected:
     void ResetProcessing() override;
 
 private:
-    void ApplyLfe() noexcept;
     void Publish() noexcept;
 
     LoudnessMeter m_loudness;

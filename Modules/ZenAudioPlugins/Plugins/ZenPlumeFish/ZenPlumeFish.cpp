@@ -70,9 +70,7 @@ void ZenPlumeFish::UpdateProcessingParameter(std::uint32_t index, float value) {
 
 void ZenPlumeFish::Configure() noexcept {
     const auto channels = static_cast<std::size_t>(m_loudness.GetChannelCount());
-    const int lfe = zen::LfeChoice::Channel(channels, m_lfeChoice);
-    for (std::size_t c = 0; c < channels; ++c)
-        m_loudness.SetChannelWeight(c, zen::SpeakerLayout::LoudnessWeight(channels, c, lfe));
+    const int lfe = zen::LfeChoice::ApplyWeights(m_loudness, m_lfeChoice);
     m_image.Configure(channels, lfe);
     const bool centre = zen::SpeakerLayout::HasAzimuths(channels) && channels >= 3 &&
                         !zen::SpeakerLayout::IsSurround(channels, kCentre) && lfe != static_cast<int>(kCentre);
