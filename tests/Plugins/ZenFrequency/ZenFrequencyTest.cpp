@@ -35,7 +35,8 @@ std::vector<float> Bands(AudioPlugin& audio, const std::string& name) {
 }  // namespace
 
 TEST(ZenFrequency, ATonePeaksAtItsBinAndBandAtItsLevel) {
-    for (float window : {0.0f, 1.0f, 2.0f, 3.0f}) {
+    // The windows' scaling is the algorithm's; here, where the readings go.
+    for (float window : {0.0f, 2.0f}) {
         PluginHarness plugin = zentest::Prepared("Frequency Analyzer", {{"Window", window}, {"Average", 0.0f}}, 1);
         const double frequency = 85 * kRate / 4096;  // on bin 85, in the 1 kHz band
         plugin.Run(zentest::Sine(frequency, kRate, 16384, kMinusSix), 1, 512);
