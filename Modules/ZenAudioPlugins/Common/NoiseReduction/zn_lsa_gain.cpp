@@ -10,6 +10,9 @@ namespace {
 
 constexpr float kEulerGamma = 0.5772157f;
 constexpr float kMinV = 1e-12f;
+// Beyond this v, exp(-v) and E1(v) are below 1e-7: speech is certain and
+// the LSA gain is the Wiener gain.
+constexpr float kCertainV = 16.0f;
 
 // Half the exponential integral E1(v): polynomial below 1 and rational
 // above (Abramowitz and Stegun 5.1.53 and 5.1.56, errors below 2e-7 and
@@ -81,23 +84,27 @@ void zn_lsa_gain::Compute(std::size_t channel, const float* power, const float* 
 
     const float logFloor = std::log(std::clamp(floor, 1e-6f, 1.0f));
     const float share = 1.0f / std::max(overSubtraction, 1e-6f);
-    const double bandNoise = std::pow(10.0, kBandNoiseDb / 10.0);
-    const double bandRange = std::log(std::pow(10.0, kBandSpeechDb / 10.0) / bandNoise);
+    const float bandNoise = std::pow(10.0f, kBandNoiseDb / 10.0f), bandSpeech = std::pow(10.0f, kBandSpeechDb / 10.0f);
+    const float bandRange = std::log(bandSpeech / bandNoise);
     const std::size_t w = m_bandHalfWidth;
     for (std::size_t k = 0; k < bins; ++k) {
         const float gamma = std::min(power[k] / std::max(noise[k], kMinNoise), kMaxPosterioriSnr);
         // Presence, from the SNRs against the noise as estimated.
-        const float q = presence != nullptr ? std::clamp(1.0f - presence[k], kMinAbsencePrior, kMaxAbsencePrior)
-                                            : kAbsencePrior;
+        float p = 1.0f;
         const float vRaw = xi[k] * gamma / (1.0f + xi[k]);
-        float p = 1.0f / (1.0f + q / (1.0f - q) * (1.0f + xi[k]) * std::exp(-vRaw));
-        const std::size_t lo = k >= w ? k - w : 0, hi = std::min(k + w + 1, bins);
-        const double band = (prefix[hi] - prefix[lo]) / static_cast<double>(hi - lo);
-        if (band > bandNoise) p = std::max(p, static_cast<float>(std::min(1.0, std::log(band / bandNoise) / bandRange)));
+        if (vRaw < kCertainV) {
+            const float q = presence != nullptr ? std::clamp(1.0f - presence[k], kMinAbsencePrior, kMaxAbsencePrior)
+                                                : kAbsencePrior;
+            p = 1.0f / (1.0f + q / (1.0f - q) * (1.0f + xi[k]) * std::exp(-vRaw));
+            const std::size_t lo = k >= w ? k - w : 0, hi = std::min(k + w + 1, bins);
+            const auto band = static_cast<float>((prefix[hi] - prefix[lo]) / static_cast<double>(hi - lo));
+            if (band >= bandSpeech) p = 1.0f;
+            else if (band > bandNoise) p = std::max(p, std::log(band / bandNoise) / bandRange);
+        }
         // The gain, against the noise the sensitivity sets.
         const float x = std::max(xi[k] * share, kMinPrioriSnr), g = gamma * share;
         const float v = std::max(x * g / (1.0f + x), kMinV);
-        const float logLsa = std::min(std::log(x / (1.0f + x)) + HalfExpIntegral(v), 0.0f);
+        const float logLsa = std::min(std::log(x / (1.0f + x)) + (v < kCertainV ? HalfExpIntegral(v) : 0.0f), 0.0f);
         gain[k] = std::exp(p * std::max(logLsa, logFloor) + (1.0f - p) * logFloor);
         previous[k] = gain[k] * gain[k] * gamma;
     }
