@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <complex>
 
 namespace zentest {
 
@@ -55,6 +56,17 @@ std::size_t ArgPeak(const std::vector<float>& x) {
     for (std::size_t n = 1; n < x.size(); ++n)
         if (std::fabs(x[n]) > std::fabs(x[best])) best = n;
     return best;
+}
+
+double MagnitudeDb(const std::vector<float>& impulseResponse, double frequency, double sampleRate) {
+    const std::complex<double> step = std::polar(1.0, -2.0 * kPi * frequency / sampleRate);
+    std::complex<double> turn = 1.0, sum = 0.0;
+    for (std::size_t n = 0; n < impulseResponse.size(); ++n) {
+        sum += static_cast<double>(impulseResponse[n]) * turn;
+        turn *= step;
+        if (n % 1024 == 1023) turn /= std::abs(turn);  // keeps the rotation on the unit circle
+    }
+    return 20.0 * std::log10(std::abs(sum));
 }
 
 }  // namespace zentest

@@ -21,5 +21,7 @@ double ToDb(double gain);
 float LargestStep(const std::vector<float>& x);
 // Index of the largest magnitude.
 std::size_t ArgPeak(const std::vector<float>& x);
+// Magnitude in dB at `frequency` of an impulse response (its DFT there).
+double MagnitudeDb(const std::vector<float>& impulseResponse, double frequency, double sampleRate);
 
 }  // namespace zentest
