@@ -1,5 +1,5 @@
 // SoftKneeCompressor: with no knee it is the Compressor's law sample for
-// sample; the knee's quadratic curve, its edges and the limit; times; and a
+// sample (within a thousandth of a dB); the knee's quadratic curve, its edges and the limit; times; and a
 // law handed per sample.
 #include <gtest/gtest.h>
 
@@ -35,7 +35,7 @@ double SteadyGainDb(const Settings& settings, double levelDb) {
 
 }  // namespace
 
-TEST(SoftKneeCompressor, WithoutAKneeItIsTheCompressorSampleForSample) {
+TEST(SoftKneeCompressor, WithoutAKneeItIsTheCompressorsLawSampleForSample) {
     const std::vector<float> music = [] {
         std::vector<float> x = zentest::Sine(180.0, 48000.0, 96 * 512, 0.6);
         const std::vector<float> noise = zentest::Noise(x.size(), 0.3, 5);
@@ -62,12 +62,17 @@ TEST(SoftKneeCompressor, WithoutAKneeItIsTheCompressorSampleForSample) {
         float* g[] = {got[0] + done, got[1] + done};
         reference.Process(w, 512);
         knee->Process(g, 512);
-        ASSERT_FLOAT_EQ(knee->GetMeter(SoftKneeCompressor::kGainReductionMeter),
-                        reference.GetMeter(Compressor::kGainReductionMeter))
+        ASSERT_NEAR(knee->GetMeter(SoftKneeCompressor::kGainReductionMeter),
+                    reference.GetMeter(Compressor::kGainReductionMeter), 1e-3)
             << done;
     }
-    EXPECT_EQ(c, a);
-    EXPECT_EQ(d, b);  // linked: the quiet channel takes the loud one's gain
+    // Both channels, the quiet one taking the loud one's gain (linked).
+    double worst = 0.0;
+    for (std::size_t n = 0; n < music.size(); ++n) {
+        if (music[n] != 0.0f) worst = std::max(worst, std::fabs(zentest::GainDb(c, a, n)));
+        worst = std::max(worst, std::fabs(zentest::GainDb(d, b, n)));
+    }
+    EXPECT_LT(worst, 1e-3);
 }
 
 TEST(SoftKneeCompressor, TheKneeIsQuadraticBetweenItsEdgesAndTheLimitHolds) {

@@ -6,7 +6,8 @@
 //   -s (E - T + W/2)^2 / (2 W)   inside the knee,
 //   (T - E) s                    above it,
 // never below the reduction limit, plus the makeup. With no knee this is the
-// Compressor's law exactly (no hold, a 50 dB limit).
+// Compressor's law (no hold, a 50 dB limit), the level's logarithm taken by
+// way of log2 (faster, a few units in the last place apart).
 //
 // The owner may hand the law's four settings sample by sample (an automated
 // threshold glides instead of stepping); otherwise the parameters hold.
@@ -62,6 +63,9 @@ public:
     // the detector channels; `law`, when given, holds the law per sample.
     void ComputeGains(const float* const* detectors, std::size_t detectorCount, float* gains, std::size_t count,
                       const Law* law = nullptr) noexcept;
+    // The same with one law for the whole block.
+    void ComputeGains(const float* const* detectors, std::size_t detectorCount, float* gains, std::size_t count,
+                      const Law& law) noexcept;
 
     const Law& GetLaw() const { return m_law; }
 

@@ -202,6 +202,17 @@ SoftKneeCompressor::Law ZenMultiBandCompressor::CurrentLaw(std::uint32_t band) n
 
 void ZenMultiBandCompressor::FillLaws(std::uint32_t frames) noexcept {
     for (std::uint32_t b = 0; b < m_bands; ++b) {
+        bool settled = true;
+        for (BandParameter p : {kThreshold, kRatio, kKnee, kMakeup}) {
+            const zen::SmoothedValueGroup::Element& e = Smoothed(Index(b, p))[0];
+            settled = settled && e.current.load(std::memory_order_relaxed) ==
+                                     double{e.target.load(std::memory_order_relaxed)};
+        }
+        m_lawSettled[b] = settled;
+        if (settled) {
+            m_laws[b][0] = CurrentLaw(b);
+            continue;
+        }
         auto threshold = Smoothed(Index(b, kThreshold)).Track(0);
         auto slope = Smoothed(Index(b, kRatio)).Track(0);
         auto knee = Smoothed(Index(b, kKnee)).Track(0);
@@ -210,6 +221,12 @@ void ZenMultiBandCompressor::FillLaws(std::uint32_t frames) noexcept {
         for (std::uint32_t i = 0; i < frames; ++i)
             law[i] = {static_cast<float>(threshold.Next()), static_cast<float>(slope.Next()),
                       static_cast<float>(knee.Next()), static_cast<float>(makeup.Next())};
+    }
+    const zen::SmoothedValueGroup::Element& e = Smoothed(kOutput)[0];
+    m_outputSettled = e.current.load(std::memory_order_relaxed) == double{e.target.load(std::memory_order_relaxed)};
+    if (m_outputSettled) {
+        m_outputGain[0] = static_cast<float>(e.current.load(std::memory_order_relaxed));
+        return;
     }
     auto output = Smoothed(kOutput).Track(0);
     for (std::uint32_t i = 0; i < frames; ++i) m_outputGain[i] = static_cast<float>(output.Next());
@@ -254,14 +271,18 @@ void ZenMultiBandCompressor::ProcessSpan(float* const* channels, std::uint32_t c
         const std::uint32_t first = keys > 0 ? mains : 0;
         const std::uint32_t count = keys > 0 ? keys : mains;
         for (std::uint32_t c = 0; c < count; ++c) m_detectors[c] = band[first + c];
-        m_compressors[b].ComputeGains(m_detectors.data(), count, m_gains[b].data(), frames,
-                                      m_laws[b].data() + offset);
+        if (m_lawSettled[b])
+            m_compressors[b].ComputeGains(m_detectors.data(), count, m_gains[b].data(), frames, m_laws[b][0]);
+        else
+            m_compressors[b].ComputeGains(m_detectors.data(), count, m_gains[b].data(), frames,
+                                          m_laws[b].data() + offset);
         ApplyFades(b, m_gains[b].data(), frames);
         if (m_lookahead.GetDelay() > 0)
             for (std::uint32_t c = 0; c < mains; ++c) m_lookahead.ProcessChannel(b * channelCount + c, band[c], frames);
     }
 
-    const float* output = m_outputGain.data() + offset;
+    const float* output = m_outputGain.data() + (m_outputSettled ? 0 : offset);
+    const float fixedOutput = m_outputGain[0];
     for (std::uint32_t c = 0; c < mains; ++c) {
         float* y = channels[c] + offset;
         const float* g = m_gains[0].data();
@@ -272,7 +293,12 @@ void ZenMultiBandCompressor::ProcessSpan(float* const* channels, std::uint32_t c
             x = m_crossover.Band(b)[c];
             for (std::uint32_t i = 0; i < frames; ++i) y[i] += g[i] * x[i];
         }
-        for (std::uint32_t i = 0; i < frames; ++i) y[i] *= output[i];
+        if (m_outputSettled) {
+            if (fixedOutput != 1.0f)
+                for (std::uint32_t i = 0; i < frames; ++i) y[i] *= fixedOutput;
+        } else {
+            for (std::uint32_t i = 0; i < frames; ++i) y[i] *= output[i];
+        }
     }
 }
 

@@ -117,9 +117,12 @@ private:
     std::array<float, kMaxSplits> m_designed{};  // split frequencies in the crossover
     std::uint64_t m_position = 0;  // samples since Prepare, for the glide grid
 
-    std::vector<std::vector<SoftKneeCompressor::Law>> m_laws;  // per band, per sample of a block
+    // Per band, per sample of a block; only the first while the law holds still.
+    std::vector<std::vector<SoftKneeCompressor::Law>> m_laws;
+    std::array<bool, kMaxBands> m_lawSettled{};
+    bool m_outputSettled = true;
     std::vector<std::vector<float>> m_gains;  // per band, per sample of a span
-    std::vector<float> m_outputGain;          // per sample of a block
+    std::vector<float> m_outputGain;          // per sample of a block, or the first alone
     std::vector<const float*> m_detectors;
     std::vector<const float*> m_spanInput;
 };
