@@ -15,8 +15,6 @@ const zen::PluginDescriptor ZenMultiBandCompressor::kDescriptor = {
 
 namespace {
 
-constexpr std::uint32_t kMaxChannels = 10;
-
 // Four bands by default; a fifth takes the top octave when asked for.
 constexpr float kDefaultBands = 4.0f;
 constexpr float kDefaultCrossovers[] = {120.0f, 1000.0f, 5000.0f, 10000.0f};
@@ -109,7 +107,7 @@ const zen::MeterTableDefinition& ZenMultiBandCompressor::Meters() {
 }
 
 bool ZenMultiBandCompressor::AcceptsChannelConfiguration(std::uint32_t inputs, std::uint32_t outputs) const {
-    return inputs == outputs && inputs >= 1 && inputs <= kMaxChannels;
+    return inputs == outputs && inputs >= 1 && inputs <= kDescriptor.inputChannelLimit;
 }
 
 std::uint32_t ZenMultiBandCompressor::GetTailLength() const {
