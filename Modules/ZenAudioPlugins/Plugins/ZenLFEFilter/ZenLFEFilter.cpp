@@ -123,10 +123,13 @@ void ZenLFEFilter::UpdateProcessingParameter(std::uint32_t index, float value) {
     switch (index) {
         case kType: m_type = static_cast<Type>(std::lround(value)); break;
         case kSlope: m_slope = static_cast<Slope>(std::lround(value)); break;
-        case kChannel:
-            m_channel = static_cast<int>(std::lround(value));
-            for (auto& section : m_sections) section->Reset();  // a channel joins from silence
+        case kChannel: {
+            const int channel = static_cast<int>(std::lround(value));
+            if (channel != m_channel)
+                for (auto& section : m_sections) section->Reset();  // a channel joins from silence
+            m_channel = channel;
             break;
+        }
         default: break;
     }
     if (index == kType || index == kSlope) Design();

@@ -130,8 +130,10 @@ bool ZenMultiBandCompressor::ApplyNeutralSetting() {
 
 void ZenMultiBandCompressor::UpdateProcessingParameter(std::uint32_t index, float value) {
     if (index == kBands) {
+        const auto bands = static_cast<std::uint32_t>(
+            std::clamp(std::lround(value), 1L, static_cast<long>(kMaxBands)));
         // Splits that join start where their frequencies stand.
-        for (std::uint32_t s = 0; s < kMaxSplits; ++s) {
+        for (std::uint32_t s = 0; bands != m_bands && s < kMaxSplits; ++s) {
             m_designed[s] = static_cast<float>(Smoothed(kCrossover1 + s)[0].current.load(std::memory_order_relaxed));
             m_crossover.SetParameter(LinkwitzRileyCrossover::kFrequency1 + s, m_designed[s]);
         }
