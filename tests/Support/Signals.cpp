@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <complex>
 
 namespace zentest {
 
@@ -110,6 +111,17 @@ double EnvelopeLag(const std::vector<float>& reference, const std::vector<float>
     if (best == 0 || best + 1 == correlation.size()) return static_cast<double>(best) - maxLag;
     const double left = correlation[best - 1], centre = correlation[best], right = correlation[best + 1];
     return static_cast<double>(best) - maxLag + 0.5 * (left - right) / (left - 2.0 * centre + right);
+}
+
+double MagnitudeDb(const std::vector<float>& impulseResponse, double frequency, double sampleRate) {
+    const std::complex<double> step = std::polar(1.0, -2.0 * kPi * frequency / sampleRate);
+    std::complex<double> turn = 1.0, sum = 0.0;
+    for (std::size_t n = 0; n < impulseResponse.size(); ++n) {
+        sum += static_cast<double>(impulseResponse[n]) * turn;
+        turn *= step;
+        if (n % 1024 == 1023) turn /= std::abs(turn);  // keeps the rotation on the unit circle
+    }
+    return 20.0 * std::log10(std::abs(sum));
 }
 
 }  // namespace zentest

@@ -24,6 +24,8 @@ double ToDb(double gain);
 float LargestStep(const std::vector<float>& x);
 // Index of the largest magnitude.
 std::size_t ArgPeak(const std::vector<float>& x);
+// Magnitude in dB at `frequency` of an impulse response (its DFT there).
+double MagnitudeDb(const std::vector<float>& impulseResponse, double frequency, double sampleRate);
 
 // Delay of `test` against `reference` in samples (positive: later), from
 // the peak of the cross-correlation of their energy envelopes (squares

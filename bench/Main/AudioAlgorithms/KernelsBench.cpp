@@ -14,6 +14,7 @@
 #include <vector>
 
 #include "Algorithms/AutoCorr.h"
+#include "Algorithms/BiquadLanes.h"
 #include "Algorithms/Blas1.h"
 #include "Algorithms/Blas2.h"
 #include "Algorithms/CSquareMagnitude.h"
@@ -204,6 +205,24 @@ std::vector<Family> Families() {
                             auto* ints = reinterpret_cast<std::int32_t*>(Buffer(5));
                             return std::function<void()>(
                                 [=] { f->ToInt32(a, ints, kFrames, CastFloatInt32::kPcm32Scale); });
+                        }});
+    // A stage of a stereo five-band crossover: low and high halves of one
+    // split and the all-pass corrections of two earlier bands, per channel.
+    families.push_back({"BiquadLanes/8 lanes", false, false, [=] {
+                            auto f = std::make_shared<BiquadLanes>();
+                            auto lanes = std::make_shared<std::vector<BiquadLane>>(8);
+                            auto buffers = std::make_shared<std::vector<std::vector<float>>>(8, Noise(kFrames, 6));
+                            for (std::size_t l = 0; l < 8; ++l)
+                                (*lanes)[l].sections[0] = (*lanes)[l].sections[1] = {-0.98, 1.98, 1.0, 2.0, 1e-4};
+                            return std::function<void()>([=] {
+                                BiquadLane* l[8];
+                                float* x[8];
+                                for (std::size_t k = 0; k < 8; ++k) {
+                                    l[k] = &(*lanes)[k];
+                                    x[k] = (*buffers)[k].data();
+                                }
+                                f->Process(l, x, 8, kFrames);
+                            });
                         }});
     families.push_back({"random::LCG", false, true, [=] {
                             auto f = std::make_shared<random::LCG>();

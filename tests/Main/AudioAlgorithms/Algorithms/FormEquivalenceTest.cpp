@@ -9,6 +9,7 @@
 #include <functional>
 #include <memory>
 
+#include "Algorithms/BiquadLanes.h"
 #include "Algorithms/BiquadPair.h"
 #include "Algorithms/Blas1.h"
 #include "Algorithms/CSquareMagnitude.h"
@@ -99,6 +100,22 @@ struct Rotor {
 struct Biquads {
     BiquadPair kernel;
     BiquadPairState state;
+    const char* FormName() const { return kernel.FormName(); }
+};
+
+// Lanes that differ in both sections; one keeps a wire as its second.
+struct Lanes {
+    BiquadLanes kernel;
+    std::vector<BiquadLane> lanes;
+    std::vector<BiquadLane*> pointers;
+    explicit Lanes(std::size_t count) : lanes(count) {
+        for (std::size_t l = 0; l < count; ++l) {
+            const double d = 0.05 * static_cast<double>(l);
+            lanes[l].sections[0] = {-0.6 + d, 1.5 - d, 0.5, -0.3 + d, 0.2 + d};
+            if (l != 2) lanes[l].sections[1] = {-0.3, 0.2 + d, 1.0 - d, 2.0, 0.7 - d};
+            pointers.push_back(&lanes[l]);
+        }
+    }
     const char* FormName() const { return kernel.FormName(); }
 };
 
@@ -270,6 +287,12 @@ std::vector<Kernel> Kernels() {
                            const BiquadSection sections[2] = {{-0.6, 1.5, 0.5, -0.3, 0.2}, {-0.3, 0.2, 1.0, 2.0, 0.7}};
                            for (std::size_t l = 0; l < lanes; ++l) std::copy_n(in[l], n, out[l]);
                            k.kernel.Process(sections, k.state, out, lanes, n);
+                       })});
+    for (std::size_t lanes : {1u, 2u, 3u, 4u, 5u, 7u, 9u})
+        all.push_back({"BiquadLanes" + std::to_string(lanes), lanes, 1, lanes, 1, false,
+                       Use<Lanes>([lanes] { return new Lanes(lanes); }, [lanes](Lanes& k, In in, Out out, std::size_t n) {
+                           for (std::size_t l = 0; l < lanes; ++l) std::copy_n(in[l], n, out[l]);
+                           k.kernel.Process(k.pointers.data(), out, lanes, n);
                        })});
     return all;
 }
