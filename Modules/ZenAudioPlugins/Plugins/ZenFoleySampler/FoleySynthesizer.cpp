@@ -65,24 +65,38 @@ void Mix(Buffer& into, const Buffer& from, std::size_t at, double gain = 1.0) {
 // Noise shaped by an attack and an exponential decay (seconds).
 Buffer Burst(Random& random, double attack, double decay, double length) {
     Buffer x(Samples(length));
-    for (std::size_t i = 0; i < x.size(); ++i) {
-        const double t = i / kRate;
-        const double envelope = (1.0 - std::exp(-t / attack)) * std::exp(-t / decay);
-        x[i] = static_cast<float>(random.Bipolar() * envelope);
+    const double rise = std::exp(-1.0 / (attack * kRate)), fall = std::exp(-1.0 / (decay * kRate));
+    double rising = 1.0, falling = 1.0;
+    for (float& s : x) {
+        s = static_cast<float>(random.Bipolar() * (1.0 - rising) * falling);
+        rising *= rise;
+        falling *= fall;
     }
     return x;
 }
 
-// A decaying mode whose frequency glides from `start` toward `end`.
+// A decaying mode whose frequency glides from `start` toward `end`: a
+// rotating phasor, its step renewed every few samples as the glide settles.
 void AddMode(Buffer& x, std::size_t at, double start, double end, double glide, double decay, double amplitude,
              double phase = 0.0) {
+    constexpr std::size_t kStride = 16;
     const std::size_t length = std::min(Samples(decay * 7.0), x.size() > at ? x.size() - at : 0);
-    double angle = phase;
+    const double fall = std::exp(-1.0 / (decay * kRate));
+    const double settle = std::exp(-static_cast<double>(kStride) / (glide * kRate));
+    double excess = start - end;
+    double re = std::cos(phase) * amplitude, im = std::sin(phase) * amplitude;
+    double stepRe = 1.0, stepIm = 0.0;
     for (std::size_t i = 0; i < length; ++i) {
-        const double t = i / kRate;
-        const double frequency = end + (start - end) * std::exp(-t / glide);
-        x[at + i] += static_cast<float>(amplitude * std::exp(-t / decay) * std::sin(angle));
-        angle += 2.0 * kPi * frequency / kRate;
+        if (i % kStride == 0) {
+            const double w = 2.0 * kPi * (end + excess) / kRate;
+            stepRe = std::cos(w) * fall;
+            stepIm = std::sin(w) * fall;
+            excess *= settle;
+        }
+        x[at + i] += static_cast<float>(im);
+        const double r = re * stepRe - im * stepIm;
+        im = re * stepIm + im * stepRe;
+        re = r;
     }
 }
 
@@ -90,10 +104,11 @@ void AddMode(Buffer& x, std::size_t at, double start, double end, double glide, 
 // early, through a band-pass.
 Buffer Grains(Random& random, double length, double perSecond, double decay, double centre, double q) {
     Buffer x(Samples(length), 0.0f);
-    for (std::size_t i = 0; i < x.size(); ++i) {
-        const double t = i / kRate;
-        const double density = perSecond / kRate * std::exp(-t / decay);
-        if (random.Between(0.0, 1.0) < density) x[i] = static_cast<float>(random.Bipolar() * std::exp(-t / decay));
+    const double fall = std::exp(-1.0 / (decay * kRate));
+    double envelope = 1.0;
+    for (float& s : x) {
+        if (random.Between(0.0, 1.0) < perSecond / kRate * envelope) s = static_cast<float>(random.Bipolar() * envelope);
+        envelope *= fall;
     }
     BandPass(x, centre, q);
     return x;
