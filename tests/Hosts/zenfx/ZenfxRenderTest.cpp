@@ -119,7 +119,7 @@ TEST(FoleySamplerRealtime, SixtyFourOverlappingTriggersNeverAllocate) {
     std::uint32_t voices = 0;
     for (std::uint32_t m = 0; m < audio.GetMeterCount(); ++m) {
         zen::MeterInfo info;
-        if (audio.GetMeterInfo(m, info) && info.name == std::string("Voices")) voices = m;
+        if (audio.GetMeterInfo(m, info) && info.name == std::string("Active Voices")) voices = m;
     }
     EXPECT_GE(audio.GetMeter(voices), 64.0f);
 }

@@ -59,24 +59,24 @@ TEST(ZenFoleySampler, RisingEdgesTriggerAndHeldTriggersDoNot) {
     plugin.Set("Trigger", 1.0f);
     Channels io = Silence(256);
     plugin.Process(io);
-    EXPECT_EQ(plugin.Meter("Voices"), 1.0f);
+    EXPECT_EQ(plugin.Meter("Active Voices"), 1.0f);
     for (int b = 0; b < 3; ++b) plugin.Process(io);  // held high
-    EXPECT_EQ(plugin.Meter("Voices"), 1.0f);
+    EXPECT_EQ(plugin.Meter("Active Voices"), 1.0f);
     plugin.Audio().Prepare(48000.0f, 512);  // the prepared hand-over of a held trigger is no edge
     plugin.Process(io);
-    EXPECT_EQ(plugin.Meter("Voices"), 0.0f);
+    EXPECT_EQ(plugin.Meter("Active Voices"), 0.0f);
     plugin.Set("Trigger", 0.0f);
     plugin.Process(io);
     plugin.Set("Trigger", 1.0f);
     plugin.Process(io);
-    EXPECT_EQ(plugin.Meter("Voices"), 1.0f);
+    EXPECT_EQ(plugin.Meter("Active Voices"), 1.0f);
     // A pad beyond the bank plays nothing.
     plugin.Set("Pad", 100.0f);
     plugin.Set("Trigger", 0.0f);
     plugin.Process(io);
     plugin.Set("Trigger", 1.0f);
     plugin.Process(io);
-    EXPECT_EQ(plugin.Meter("Voices"), 1.0f);
+    EXPECT_EQ(plugin.Meter("Active Voices"), 1.0f);
     EXPECT_EQ(plugin.Meter("Pads"), 11.0f);
 }
 
@@ -133,9 +133,9 @@ TEST(ZenFoleySampler, StealsTheOldestVoiceWithAFade) {
         const std::vector<float> part = Play(plugin, 128, 64);
         out.insert(out.end(), part.begin(), part.end());
     }
-    EXPECT_EQ(plugin.Meter("Voices"), 3.0f);  // two sounding, the oldest fading
+    EXPECT_EQ(plugin.Meter("Active Voices"), 3.0f);  // two sounding, the oldest fading
     const std::vector<float> after = Play(plugin, 480, 64, 99);
-    EXPECT_EQ(plugin.Meter("Voices"), 2.0f);
+    EXPECT_EQ(plugin.Meter("Active Voices"), 2.0f);
     // The fade leaves no step: neighbours differ no more than the ringing does.
     out.insert(out.end(), after.begin(), after.end());
     float step = 0.0f;
@@ -145,9 +145,9 @@ TEST(ZenFoleySampler, StealsTheOldestVoiceWithAFade) {
     // Triggers two samples apart outpace the fades.
     PluginHarness full = Sampler(kMetal, {{"Voices", 64.0f}}, 48000.0f, 1);
     for (int t = 0; t < 90; ++t) Play(full, 2, 1);
-    EXPECT_EQ(full.Meter("Voices"), 64.0f + 16.0f);  // 64 sounding and every fade slot busy
+    EXPECT_EQ(full.Meter("Active Voices"), 64.0f + 16.0f);  // 64 sounding and every fade slot busy
     Play(full, 480, 16, 99);
-    EXPECT_EQ(full.Meter("Voices"), 64.0f);
+    EXPECT_EQ(full.Meter("Active Voices"), 64.0f);
 }
 
 TEST(ZenFoleySampler, OutputIsOnlyTheVoicesAndEndsWithinTheTail) {
@@ -162,7 +162,7 @@ TEST(ZenFoleySampler, OutputIsOnlyTheVoicesAndEndsWithinTheTail) {
     const std::vector<float> out = Play(plugin, tail + 1024, 512);
     EXPECT_GT(zentest::Peak(out, 0, tail), 0.1f);
     EXPECT_EQ(zentest::Peak(out, tail), 0.0f) << "tail " << tail;
-    EXPECT_EQ(plugin.Meter("Voices"), 0.0f);
+    EXPECT_EQ(plugin.Meter("Active Voices"), 0.0f);
     EXPECT_FALSE(plugin.Audio().ApplyNeutralSetting());
 }
 

@@ -56,7 +56,7 @@ const zen::MeterTableDefinition& ZenFoleySampler::Meters() {
     static const MeterTableDefinition table = MakeMeterTable(
         "ZenFoleySampler",
         {
-            ValueMeter("VOICES", QT_TRANSLATE_NOOP("ZenFoleySampler", "Voices"), "", 0.0f, kMaxVoices + kFadeSlots),
+            ValueMeter("ACTIVE_VOICES", QT_TRANSLATE_NOOP("ZenFoleySampler", "Active Voices"), "", 0.0f, kMaxVoices + kFadeSlots),
             ValueMeter("PADS", QT_TRANSLATE_NOOP("ZenFoleySampler", "Pads"), "", 0.0f, kMaxPads),
             LevelMeter("OUTPUT_PEAK", QT_TRANSLATE_NOOP("ZenFoleySampler", "Output Peak"), "dBFS", -60.0f, 6.0f)
                 .PerChannel(),
