@@ -129,6 +129,20 @@ FoleySound Finish(const std::string& name, Buffer x, double peakDb = 0.0) {
     return FoleySound(name, kRate, {x});
 }
 
+// A pad of takes, each made from its own random sequence; `make` may set the
+// take's peak in dB relative to the common one.
+template <class Make>
+FoleyBank::Pad Takes(const std::string& name, std::uint32_t seed, Make make) {
+    FoleyBank::Pad pad{name, {}};
+    for (int take = 0; take < FoleySynthesizer::kTakesPerPad; ++take) {
+        Random random(seed * 100 + static_cast<std::uint32_t>(take));
+        double peakDb = 0.0;
+        Buffer x = make(random, peakDb);
+        pad.takes.push_back(Finish(name + " " + std::to_string(take + 1), std::move(x), peakDb));
+    }
+    return pad;
+}
+
 // --- footsteps: a heel strike, then the ball of the foot a moment later.
 
 void ConcreteStrike(Buffer& x, std::size_t at, Random& random, double weight) {
@@ -176,25 +190,21 @@ void GrassStrike(Buffer& x, std::size_t at, Random& random, double weight) {
 }
 
 FoleyBank::Pad Footsteps(const char* name, void (*strike)(Buffer&, std::size_t, Random&, double), std::uint32_t seed) {
-    FoleyBank::Pad pad{name, {}};
-    for (int take = 0; take < FoleySynthesizer::kTakesPerPad; ++take) {
-        Random random(seed * 100 + take);
+    return Takes(name, seed, [&](Random& random, double& peakDb) {
         Buffer x(Samples(0.5), 0.0f);
         const std::size_t heel = Samples(0.002);
         const std::size_t toe = heel + Samples(random.Between(0.07, 0.12));
         strike(x, heel, random, 1.0);
         strike(x, toe, random, random.Between(0.45, 0.65));
-        pad.takes.push_back(Finish(std::string(name) + " " + std::to_string(take + 1), x, random.Between(-1.5, 0.0)));
-    }
-    return pad;
+        peakDb = random.Between(-1.5, 0.0);
+        return x;
+    });
 }
 
 // --- cloth: friction of fabric against itself over one movement.
 
 FoleyBank::Pad Cloth(std::uint32_t seed) {
-    FoleyBank::Pad pad{"Cloth Rustle", {}};
-    for (int take = 0; take < FoleySynthesizer::kTakesPerPad; ++take) {
-        Random random(seed * 100 + take);
+    return Takes("Cloth Rustle", seed, [&](Random& random, double&) {
         const double length = random.Between(0.45, 0.7);
         Buffer hiss(Samples(length));
         // Slow irregular pressure of the movement: low-passed noise, rectified.
@@ -215,9 +225,8 @@ FoleyBank::Pad Cloth(std::uint32_t seed) {
         for (std::size_t i = 0; i < fibres.size(); ++i)
             fibres[i] *= static_cast<float>(std::sin(kPi * i / static_cast<double>(fibres.size())));
         Mix(hiss, fibres, 0, 1.5);
-        pad.takes.push_back(Finish("Cloth Rustle " + std::to_string(take + 1), hiss));
-    }
-    return pad;
+        return hiss;
+    });
 }
 
 // --- door.
@@ -225,9 +234,7 @@ FoleyBank::Pad Cloth(std::uint32_t seed) {
 // Stick-slip of a hinge: an irregular train of pulses, its rate swept by
 // the door's speed, ringing the panel's resonances.
 FoleyBank::Pad DoorCreak(std::uint32_t seed) {
-    FoleyBank::Pad pad{"Door Creak", {}};
-    for (int take = 0; take < FoleySynthesizer::kTakesPerPad; ++take) {
-        Random random(seed * 100 + take);
+    return Takes("Door Creak", seed, [&](Random& random, double& peakDb) {
         const double length = random.Between(0.8, 1.2);
         const double low = random.Between(35.0, 50.0);
         const double high = random.Between(110.0, 160.0);
@@ -254,9 +261,9 @@ FoleyBank::Pad DoorCreak(std::uint32_t seed) {
             if (pulses[i] != 0.0f)
                 for (std::size_t k = 0; k < ring.size(); ++k) body[i + k] += pulses[i] * ring[k];
         Filter(body, BiQuad::kHighPass, 250.0);
-        pad.takes.push_back(Finish("Door Creak " + std::to_string(take + 1), body, -1.0));
-    }
-    return pad;
+        peakDb = -1.0;
+        return body;
+    });
 }
 
 void MetalClick(Buffer& x, std::size_t at, Random& random, double weight, double size) {
@@ -270,23 +277,18 @@ void MetalClick(Buffer& x, std::size_t at, Random& random, double weight, double
 }
 
 FoleyBank::Pad DoorLatch(std::uint32_t seed) {
-    FoleyBank::Pad pad{"Door Latch", {}};
-    for (int take = 0; take < FoleySynthesizer::kTakesPerPad; ++take) {
-        Random random(seed * 100 + take);
+    return Takes("Door Latch", seed, [&](Random& random, double&) {
         Buffer x(Samples(0.3), 0.0f);
         const double size = random.Between(0.9, 1.1);
         MetalClick(x, Samples(0.002), random, 0.5, size);
         MetalClick(x, Samples(random.Between(0.045, 0.075)), random, 1.0, size);
         AddMode(x, Samples(random.Between(0.045, 0.075)), 240.0, 200.0, 0.01, 0.02, 0.15);
-        pad.takes.push_back(Finish("Door Latch " + std::to_string(take + 1), x));
-    }
-    return pad;
+        return x;
+    });
 }
 
 FoleyBank::Pad DoorSlam(std::uint32_t seed) {
-    FoleyBank::Pad pad{"Door Slam", {}};
-    for (int take = 0; take < FoleySynthesizer::kTakesPerPad; ++take) {
-        Random random(seed * 100 + take);
+    return Takes("Door Slam", seed, [&](Random& random, double&) {
         Buffer x(Samples(1.2), 0.0f);
         const std::size_t hit = Samples(0.002);
         Buffer crack = Burst(random, 0.0005, 0.02, 0.15);
@@ -301,9 +303,8 @@ FoleyBank::Pad DoorSlam(std::uint32_t seed) {
         Buffer room = Burst(random, 0.01, 0.18, 1.1);
         Filter(room, BiQuad::kLowPass, 700.0);
         Mix(x, room, hit, 0.25);
-        pad.takes.push_back(Finish("Door Slam " + std::to_string(take + 1), x));
-    }
-    return pad;
+        return x;
+    });
 }
 
 // --- impacts: a short excitation ringing the struck body's modes.
@@ -311,9 +312,7 @@ FoleyBank::Pad DoorSlam(std::uint32_t seed) {
 FoleyBank::Pad Impact(const char* name, const double* ratios, const double* decays, const double* levels, int count,
                       double lowest, double highest, double clickDecay, double clickHighPass, double beating,
                       double length, std::uint32_t seed) {
-    FoleyBank::Pad pad{name, {}};
-    for (int take = 0; take < FoleySynthesizer::kTakesPerPad; ++take) {
-        Random random(seed * 100 + take);
+    return Takes(name, seed, [&](Random& random, double&) {
         Buffer x(Samples(length), 0.0f);
         Buffer click = Burst(random, 0.0001, clickDecay, 0.05);
         Filter(click, BiQuad::kHighPass, clickHighPass);
@@ -327,15 +326,12 @@ FoleyBank::Pad Impact(const char* name, const double* ratios, const double* deca
             // A slightly detuned twin makes metal beat as real plates do.
             AddMode(x, 0, f * 1.0035, f * 1.0035, 1.0, decays[m], beating * level, 0.0);
         }
-        pad.takes.push_back(Finish(std::string(name) + " " + std::to_string(take + 1), x));
-    }
-    return pad;
+        return x;
+    });
 }
 
 FoleyBank::Pad Thud(std::uint32_t seed) {
-    FoleyBank::Pad pad{"Impact Thud", {}};
-    for (int take = 0; take < FoleySynthesizer::kTakesPerPad; ++take) {
-        Random random(seed * 100 + take);
+    return Takes("Impact Thud", seed, [&](Random& random, double&) {
         Buffer x(Samples(0.5), 0.0f);
         const double f = random.Between(55.0, 70.0);
         AddMode(x, 0, f * 1.5, f, 0.02, random.Between(0.05, 0.07), 1.0);
@@ -345,9 +341,8 @@ FoleyBank::Pad Thud(std::uint32_t seed) {
         Buffer slap = Burst(random, 0.0003, 0.005, 0.05);
         BandPass(slap, random.Between(900.0, 1300.0), 0.8);
         Mix(x, slap, 0, 0.3);
-        pad.takes.push_back(Finish("Impact Thud " + std::to_string(take + 1), x));
-    }
-    return pad;
+        return x;
+    });
 }
 
 }  // namespace
