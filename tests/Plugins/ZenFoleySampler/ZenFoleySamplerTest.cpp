@@ -178,3 +178,15 @@ TEST(ZenFoleySampler, MonoOutputSumsStereoTakesAtHalfLevel) {
     mono.Process(io);
     for (std::size_t i = 0; i < 2048; ++i) ASSERT_EQ(io[0][i], x[i]) << i;  // built-in takes are mono
 }
+
+TEST(ZenFoleySampler, ListedWithTwoChannelsAndNoAudioInput) {
+    const auto list = GetZenPluginInterface()->GetPluginList(zen::kAudioPluginKind);
+    const auto row = list.find("Foley Sampler:1517184627");
+    ASSERT_NE(row, list.end());
+    EXPECT_EQ(row->second.channelCount, 2u);
+    EXPECT_EQ(ZenFoleySampler::kDescriptor.code, zen::MakePluginCode('Z', 'n', 'f', 's'));
+    PluginHarness plugin("Foley Sampler");
+    EXPECT_FALSE(plugin.Audio().ConfigureChannels(2, 2));
+    EXPECT_FALSE(plugin.Audio().ConfigureChannels(0, 3));
+    EXPECT_TRUE(plugin.Audio().ConfigureChannels(0, 1));
+}
