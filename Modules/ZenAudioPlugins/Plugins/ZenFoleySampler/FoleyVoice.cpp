@@ -38,6 +38,23 @@ void FoleyVoice::Render(float* const* out, std::uint32_t channels, std::uint32_t
     double position = m_position;
     float fade = m_fade;
     std::uint32_t i = 0;
+    // The common case, a mono take at full level into two outputs, runs without per-sample choices.
+    if (!stereo && channels == 2 && !IsReleasing()) {
+        const auto end = static_cast<double>(length);
+        float* out0 = out[0];
+        float* out1 = out[1];
+        const float g = m_gain;
+        for (; i < frames && position < end; ++i) {
+            const auto index = static_cast<std::uint64_t>(position);
+            const float y = Hermite(left + index, static_cast<float>(position - static_cast<double>(index))) * g;
+            out0[i] += y;
+            out1[i] += y;
+            position += m_increment;
+        }
+        m_position = position;
+        if (i < frames) m_sound = nullptr;
+        return;
+    }
     for (; i < frames; ++i) {
         const auto index = static_cast<std::uint64_t>(position);
         if (index >= length || fade <= 0.0f) break;
