@@ -19,7 +19,8 @@ PluginHarness::PluginHarness(const std::string& name) {
 }
 
 void PluginHarness::Prepare(std::uint32_t channels, float sampleRate, std::uint32_t maxBlock) {
-    if (!m_audio->ConfigureChannels(channels, channels)) throw std::runtime_error("layout refused");
+    const std::uint32_t inputs = m_instance->GetDescriptor()->inputChannelLimit == 0 ? 0 : channels;
+    if (!m_audio->ConfigureChannels(inputs, channels)) throw std::runtime_error("layout refused");
     if (!m_audio->Prepare(sampleRate, maxBlock)) throw std::runtime_error("prepare refused");
 }
 

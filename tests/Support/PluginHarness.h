@@ -22,7 +22,8 @@ public:
     AudioPlugin& Audio() { return *m_audio; }
     zen::PluginInstance& Instance() { return *m_instance; }
 
-    // Configures channels in = out and prepares; both must succeed.
+    // Configures channels in = out (no inputs for a plug-in without audio
+    // input) and prepares; both must succeed.
     void Prepare(std::uint32_t channels, float sampleRate = 48000.0f, std::uint32_t maxBlock = 512);
 
     void Set(const std::string& labelOrIdentifier, float value);

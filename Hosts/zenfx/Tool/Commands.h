@@ -56,12 +56,27 @@ struct AnalyzeOptions {
     std::optional<double> target;  // LUFS: report the gain that reaches it
 };
 
+struct RenderOptions {
+    std::string plugin;
+    std::string triggers;  // the trigger list file
+    std::string output;
+    // In command-line order: {"--preset", name} or {"--set", "PARAM=VALUE"}.
+    std::vector<std::pair<std::string, std::string>> actions;
+    std::vector<std::string> stateFields;  // KEY=VALUE text fields of the state
+    int sampleRate = 48000;
+    std::uint32_t channels = 2;
+    std::uint32_t block = 512;
+    double seconds = 0.0;  // 0: the last trigger and the plug-in's tail
+    std::string format;
+};
+
 int RunList(PluginLibrary& library, bool json);
 int RunInfo(PluginLibrary& library, const InfoOptions& options);
 int RunProcess(PluginLibrary& library, const ProcessOptions& options);
 int RunValidate(PluginLibrary& library, const ValidateOptions& options);
 int RunControl(PluginLibrary& library, const ControlOptions& options);
 int RunAnalyze(PluginLibrary& library, const AnalyzeOptions& options);
+int RunRender(PluginLibrary& library, const RenderOptions& options);
 int RunDemo(const std::string& output, const std::string& format);
 
 }  // namespace zenfx

@@ -29,6 +29,18 @@ std::vector<zenfx::StageSpec> CollectStages(const CLI::App& process, const CLI::
     return stages;
 }
 
+// The --set and --preset of render, in command-line order.
+std::vector<std::pair<std::string, std::string>> CollectActions(const CLI::App& command, const CLI::Option* set,
+                                                                const CLI::Option* preset) {
+    std::vector<std::pair<std::string, std::string>> actions;
+    std::size_t setIndex = 0, presetIndex = 0;
+    for (const CLI::Option* option : command.parse_order()) {
+        if (option == set) actions.emplace_back("--set", option->results().at(setIndex++));
+        else if (option == preset) actions.emplace_back("--preset", option->results().at(presetIndex++));
+    }
+    return actions;
+}
+
 }  // namespace
 
 int main(int argc, char** argv) {
@@ -122,6 +134,33 @@ int main(int argc, char** argv) {
                                                            "Loudness to reach (LUFS): report the gain it takes")
                                     ->check(CLI::Range(-70.0, 0.0));
 
+    zenfx::RenderOptions render;
+    std::vector<std::string> renderSets, renderPresets;
+    CLI::App* renderCommand =
+        app.add_subcommand("render", "Play a plug-in without audio input (Foley Sampler) from a trigger list");
+    renderCommand->add_option("PLUGIN", render.plugin, "Display name or key, case-insensitive")->required();
+    renderCommand->add_option("--triggers", render.triggers, "File of 'TIME PAD' lines, time in seconds")->required();
+    renderCommand->add_option("-o,--output", render.output, "Output file; its extension picks the type")->required();
+    CLI::Option* renderSetOption = renderCommand->add_option("--set", renderSets, "PARAM=VALUE")
+                                       ->expected(1)
+                                       ->multi_option_policy(CLI::MultiOptionPolicy::TakeAll)
+                                       ->allow_extra_args(false);
+    CLI::Option* renderPresetOption = renderCommand->add_option("--preset", renderPresets, "Factory preset")
+                                          ->expected(1)
+                                          ->multi_option_policy(CLI::MultiOptionPolicy::TakeAll)
+                                          ->allow_extra_args(false);
+    renderCommand->add_option("--state-set", render.stateFields, "KEY=VALUE text field of the state (folder=PATH)")
+        ->expected(1)
+        ->multi_option_policy(CLI::MultiOptionPolicy::TakeAll)
+        ->allow_extra_args(false);
+    renderCommand->add_option("--rate", render.sampleRate, "Sample rate (Hz, default 48000)")
+        ->check(CLI::Range(8000, 384000));
+    renderCommand->add_option("--channels", render.channels, "Output channels (default 2)");
+    renderCommand->add_option("--block", render.block, "Largest block in frames (default 512)");
+    renderCommand->add_option("--length", render.seconds, "Seconds to render (default: to the end of the last sound)")
+        ->check(CLI::Range(0.0, 3600.0));
+    renderCommand->add_option("--format", render.format, "Sample format: pcm16, pcm24, pcm32, float, double");
+
     std::string demoOutput, demoFormat;
     CLI::App* demo = app.add_subcommand("demo", "Write the built-in demo material to a file");
     demo->add_option("-o,--output", demoOutput, "Output file")->required();
@@ -149,6 +188,10 @@ int main(int argc, char** argv) {
         if (*controlCommand) {
             for (CLI::App* sub : controlCommand->get_subcommands()) control.action = sub->get_name();
             return zenfx::RunControl(library, control);
+        }
+        if (*renderCommand) {
+            render.actions = CollectActions(*renderCommand, renderSetOption, renderPresetOption);
+            return zenfx::RunRender(library, render);
         }
         process.stages = CollectStages(*processCommand, pluginOption, setOption, presetOption);
         process.compensateLatency = !noCompensation;

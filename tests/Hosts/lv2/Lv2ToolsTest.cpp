@@ -97,6 +97,8 @@ TEST(Lv2Tools, Lv2applyProcessesAWavFileAsZenfxDoes) {
             const zenlv2::Variant& variant = variants[v];
             const bool widest = v + 1 == variants.size() || variants[v + 1].key != variant.key;
             if (!widest || !done.insert(variant.key).second) continue;
+            // lv2apply filters a file: a plug-in without audio input has nothing to apply to.
+            if (variant.inputs == 0) continue;
             SCOPED_TRACE(variant.uri);
             constexpr std::size_t kFrames = 2000;
             std::vector<std::vector<float>> channels;

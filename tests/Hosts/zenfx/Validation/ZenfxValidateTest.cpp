@@ -71,8 +71,12 @@ TEST(ZenfxValidate, EveryRegisteredPluginPasses) {
         const std::set<std::string> passed = WithStatus(plugin, "pass");
         for (const char* id : {"lifecycle.channel-layouts", "lifecycle.sample-rates", "parameters.set-get",
                                "parameters.state", "blocks.lengths", "signals.non-finite", "latency.bypass",
-                               "threads.parameters", "realtime.allocation", "realtime.locks"})
+                               "threads.parameters", "realtime.allocation", "realtime.locks"}) {
+            // A plug-in without audio input (a sampler) has no input to feed these.
+            const auto* check = FindCheck(plugin, id);
+            if (check != nullptr && (*check)["status"] == "skip" && (*check)["reason"] == "no audio input") continue;
             EXPECT_EQ(passed.count(id), 1u) << plugin["name"] << " " << id;
+        }
     }
 }
 
