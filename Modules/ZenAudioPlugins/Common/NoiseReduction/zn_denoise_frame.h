@@ -49,7 +49,8 @@ public:
     const zn_noise_profile& Profile() const { return m_profile; }
 
     // Of the last frame: power removed per channel in dB (<= 0), and per bin,
-    // averaged over channels, the noise estimate's power and the gain.
+    // averaged over channels, the gain and the noise estimate's power per
+    // unit window energy (white noise of variance v reads v in every bin).
     float ReductionDb(std::size_t channel) const;
     const float* NoiseSpectrum() const { return m_noiseSpectrum.data(); }
     const float* GainSpectrum() const { return m_gainSpectrum.data(); }
@@ -64,6 +65,7 @@ private:
     float m_evidence = 0.0f;
     float m_evidenceFall = 0.0f;
     double m_sampleRate = 48000.0;
+    float m_noisePerEnergy = 1.0f;
     float m_voice = 1.0f;
     std::size_t m_channels = 0;
     std::size_t m_bins = 0;
