@@ -51,6 +51,7 @@ void zn_denoise_frame::Reset() noexcept {
     m_noiseSpectrum.Clear();
     std::fill(m_gainSpectrum.begin(), m_gainSpectrum.end(), 1.0f);
     m_voice = 1.0f;
+    m_confirmed = 0.0f;
     m_evidence = 0.0f;
 }
 
@@ -84,6 +85,7 @@ void zn_denoise_frame::Process(ora::fft::Frame& frame, ora::fft::Context& contex
     // The detector steers the tracker; the floor follows only what both agree on.
     const float voice = s.voiceGuided ? std::clamp(m_voice, 0.0f, 1.0f) : 1.0f;
     const float confirmed = s.voiceGuided ? voice * SpeechEvidence() : 1.0f;
+    m_confirmed = confirmed;
     const float floor = s.voiceGuided ? std::pow(s.speechFloor, confirmed) * std::pow(s.floor, 1.0f - confirmed) : s.floor;
     const float overSubtraction =
         s.voiceGuided ? std::pow(s.overSubtraction, confirmed) * std::pow(kPauseOverSubtraction, 1.0f - confirmed)
