@@ -21,11 +21,18 @@ void zn_spectrum_points(const float* bins, std::size_t binCount, float* points, 
             points[p] = static_cast<float>((1.0 - t) * bins[i] + t * bins[i + 1]);
             continue;
         }
-        const auto begin = static_cast<std::size_t>(std::max(0.0, std::ceil(centre - 0.5 * step)));
-        const auto end = static_cast<std::size_t>(std::min(last, std::floor(centre + 0.5 * step - 1e-9)));
-        double sum = 0.0;
-        for (std::size_t k = begin; k <= end; ++k) sum += bins[k];
-        points[p] = static_cast<float>(sum / static_cast<double>(end - begin + 1));
+        // A band of one step around the point; bins on its edges count half.
+        const double lo = centre - 0.5 * step, hi = centre + 0.5 * step;
+        const auto begin = static_cast<std::size_t>(std::max(0.0, std::ceil(lo)));
+        const auto end = static_cast<std::size_t>(std::min(last, std::floor(hi)));
+        double sum = 0.0, weights = 0.0;
+        for (std::size_t k = begin; k <= end; ++k) {
+            const auto at = static_cast<double>(k);
+            const double w = at == lo || at == hi ? 0.5 : 1.0;
+            sum += w * bins[k];
+            weights += w;
+        }
+        points[p] = static_cast<float>(sum / weights);
     }
 }
 
