@@ -65,6 +65,18 @@ float PluginHarness::Meter(const std::string& name) {
     throw std::runtime_error("no meter " + name);
 }
 
+std::vector<float> PluginHarness::MeterArray(const std::string& name) {
+    for (std::uint32_t i = 0; i < m_audio->GetMeterCount(); ++i) {
+        zen::MeterInfo info;
+        m_audio->GetMeterInfo(i, info);
+        if (info.name != name) continue;
+        std::vector<float> values(info.size);
+        if (!m_audio->ReadMeterArray(i, values.data(), info.size)) throw std::runtime_error("unreadable meter " + name);
+        return values;
+    }
+    throw std::runtime_error("no meter " + name);
+}
+
 PluginHarness Prepared(const std::string& name, const std::vector<std::pair<std::string, float>>& settings,
                        std::uint32_t channels, float sampleRate, std::uint32_t maxBlock) {
     PluginHarness plugin(name);

@@ -35,6 +35,8 @@ public:
     Channels Run(const std::vector<float>& input, std::uint32_t channels = 1, std::size_t block = 0);
 
     float Meter(const std::string& name);
+    // The values of an array meter.
+    std::vector<float> MeterArray(const std::string& name);
 
 private:
     std::unique_ptr<zen::PluginInstance> m_instance;

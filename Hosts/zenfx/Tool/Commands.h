@@ -20,6 +20,7 @@ struct StageSpec {
     std::string plugin;
     // In command-line order: {"--preset", name} or {"--set", "PARAM=VALUE"}.
     std::vector<std::pair<std::string, std::string>> actions;
+    std::string learn;  // --learn START:END (seconds); empty: none
 };
 
 struct ProcessOptions {

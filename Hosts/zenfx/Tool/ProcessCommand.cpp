@@ -12,6 +12,7 @@
 #include "AudioFile.h"
 #include "Commands.h"
 #include "DemoMaterial.h"
+#include "LearnPass.h"
 #include "PluginChain.h"
 #include "ProgressBar.h"
 #include "TemporaryFile.h"
@@ -95,9 +96,11 @@ int RunProcess(PluginLibrary& library, const ProcessOptions& options) {
         throw ZenfxError("the output '" + options.output + "' is the input file; choose another output path",
                          kExitUsage);
 
-    std::unique_ptr<AudioSource> source;
-    if (options.input.empty()) source = std::make_unique<DemoMaterial>();
-    else source = std::make_unique<AudioFileReader>(options.input);
+    const auto open = [&options]() -> std::unique_ptr<AudioSource> {
+        if (options.input.empty()) return std::make_unique<DemoMaterial>();
+        return std::make_unique<AudioFileReader>(options.input);
+    };
+    std::unique_ptr<AudioSource> source = open();
     const int channels = source->Channels();
     const int rate = source->SampleRate();
     const int format = ChooseOutputFormat(options.output, source->Format(), options.format);
@@ -112,6 +115,7 @@ int RunProcess(PluginLibrary& library, const ProcessOptions& options) {
         }
     }
     chain.Prepare(rate, options.block);
+    RunLearnPasses(chain, options.stages, open, options.block);
     const std::uint64_t latency = chain.Latency();
 
     AudioFileWriter writer(options.output, rate, channels, format);

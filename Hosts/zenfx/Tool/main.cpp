@@ -7,15 +7,23 @@
 
 namespace {
 
-// Walks the process options in command-line order, so that every --set and
-// --preset belongs to the --plugin named before it.
+// Walks the process options in command-line order, so that every --set,
+// --preset and --learn belongs to the --plugin named before it.
 std::vector<zenfx::StageSpec> CollectStages(const CLI::App& process, const CLI::Option* plugin,
-                                            const CLI::Option* set, const CLI::Option* preset) {
+                                            const CLI::Option* set, const CLI::Option* preset,
+                                            const CLI::Option* learn) {
     std::vector<zenfx::StageSpec> stages;
-    std::size_t pluginIndex = 0, setIndex = 0, presetIndex = 0;
+    std::size_t pluginIndex = 0, setIndex = 0, presetIndex = 0, learnIndex = 0;
     for (const CLI::Option* option : process.parse_order()) {
         if (option == plugin) {
-            stages.push_back({option->results().at(pluginIndex++), {}});
+            stages.push_back({option->results().at(pluginIndex++), {}, {}});
+            continue;
+        }
+        if (option == learn) {
+            const std::string& region = option->results().at(learnIndex++);
+            if (stages.empty())
+                throw zenfx::ZenfxError("--learn " + region + " comes before any --plugin", zenfx::kExitUsage);
+            stages.back().learn = region;
             continue;
         }
         const bool isSet = option == set;
@@ -61,7 +69,7 @@ int main(int argc, char** argv) {
         ->check(CLI::Range(8000, 384000));
 
     zenfx::ProcessOptions process;
-    std::vector<std::string> plugins, sets, presets;
+    std::vector<std::string> plugins, sets, presets, learns;
     CLI::App* processCommand = app.add_subcommand("process", "Run a chain of plug-ins over an audio file");
     processCommand->add_option("INPUT", process.input, "Input file (WAV, FLAC, AIFF, ...); none: demo material");
     processCommand->add_option("-o,--output", process.output, "Output file; its extension picks the type")
@@ -78,6 +86,12 @@ int main(int argc, char** argv) {
             ->allow_extra_args(false);
     CLI::Option* presetOption =
         processCommand->add_option("--preset", presets, "Factory preset of the plug-in named before it")
+            ->expected(1)
+            ->multi_option_policy(CLI::MultiOptionPolicy::TakeAll)
+            ->allow_extra_args(false);
+    CLI::Option* learnOption =
+        processCommand
+            ->add_option("--learn", learns, "START:END seconds the plug-in named before it learns from (its \"Learn\")")
             ->expected(1)
             ->multi_option_policy(CLI::MultiOptionPolicy::TakeAll)
             ->allow_extra_args(false);
@@ -193,7 +207,7 @@ int main(int argc, char** argv) {
             render.actions = CollectActions(*renderCommand, renderSetOption, renderPresetOption);
             return zenfx::RunRender(library, render);
         }
-        process.stages = CollectStages(*processCommand, pluginOption, setOption, presetOption);
+        process.stages = CollectStages(*processCommand, pluginOption, setOption, presetOption, learnOption);
         process.compensateLatency = !noCompensation;
         return zenfx::RunProcess(library, process);
     } catch (const zenfx::ZenfxError& e) {

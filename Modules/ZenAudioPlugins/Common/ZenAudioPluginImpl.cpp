@@ -95,18 +95,25 @@ void ZenAudioPluginImpl::ApplyPendingParameters() noexcept {
 std::string ZenAudioPluginImpl::SaveState() const {
     QJsonObject extra;
     extra.insert(QStringLiteral("bypass"), IsBypassed());
+    SaveStateFields(extra);
     return zen::StateText::Save(m_descriptor->className, m_parameters, extra);
 }
 
 bool ZenAudioPluginImpl::LoadState(const std::string& state) {
     zen::StateText::Contents contents;
-    if (!zen::StateText::Parse(state, m_descriptor->className, m_parameters, contents)) return false;
+    if (!zen::StateText::Parse(state, m_descriptor->className, m_parameters, contents) ||
+        !LoadStateFields(contents.root))
+        return false;
     for (const auto& [index, value] : contents.values) SetParameter(index, value);
     const QJsonValue bypass = contents.root.value(QStringLiteral("bypass"));
     if (bypass.isBool()) SetBypass(bypass.toBool());
     m_parameters.MarkLoaded();
     return true;
 }
+
+void ZenAudioPluginImpl::SaveStateFields(QJsonObject&) const {}
+
+bool ZenAudioPluginImpl::LoadStateFields(const QJsonObject&) { return true; }
 
 std::vector<std::string> ZenAudioPluginImpl::GetPresetNames() const {
     return zen::StateText::PresetNames(m_descriptor->className);

@@ -20,6 +20,7 @@
 // ZenAudioPlugin<Class>.
 #pragma once
 
+#include <QJsonObject>
 #include <QObject>
 #include <atomic>
 #include <cstdint>
@@ -170,6 +171,12 @@ protected:
     virtual void PrepareProcessing(float sampleRate, std::uint32_t maxBlockSize);
     virtual void ProcessBlock(float* const* channels, std::uint32_t channelCount, std::uint32_t frames) noexcept = 0;
     virtual void ResetProcessing() {}
+
+    // State fields of the plug-in's own beside the parameters and bypass
+    // (UI thread). LoadStateFields sees the parsed state before any value
+    // changes; false refuses the whole state.
+    virtual void SaveStateFields(QJsonObject& root) const;
+    virtual bool LoadStateFields(const QJsonObject& root);
 
     // Reports the latency; call from PrepareProcessing.
     void SetLatency(std::uint32_t samples) { m_latency.store(samples, std::memory_order_release); }

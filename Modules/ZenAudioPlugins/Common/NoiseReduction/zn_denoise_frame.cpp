@@ -32,6 +32,7 @@ bool zn_denoise_frame::Configure(ora::fft::Frame& frame, const ora::fft::Context
     }
     m_channels = channels;
     m_bins = bins;
+    m_noisePerEnergy = static_cast<float>(1.0 / windowEnergy);
     const double binHz = m_sampleRate / static_cast<double>(context.fftLength);
     m_bandBegin = std::min(bins, static_cast<std::size_t>(kVoiceBandHz[0] / binHz));
     m_bandEnd = std::min(bins, static_cast<std::size_t>(kVoiceBandHz[1] / binHz) + 1);
@@ -50,6 +51,7 @@ void zn_denoise_frame::Reset() noexcept {
     m_noiseSpectrum.Clear();
     std::fill(m_gainSpectrum.begin(), m_gainSpectrum.end(), 1.0f);
     m_voice = 1.0f;
+    m_confirmed = 0.0f;
     m_evidence = 0.0f;
 }
 
@@ -83,6 +85,7 @@ void zn_denoise_frame::Process(ora::fft::Frame& frame, ora::fft::Context& contex
     // The detector steers the tracker; the floor follows only what both agree on.
     const float voice = s.voiceGuided ? std::clamp(m_voice, 0.0f, 1.0f) : 1.0f;
     const float confirmed = s.voiceGuided ? voice * SpeechEvidence() : 1.0f;
+    m_confirmed = confirmed;
     const float floor = s.voiceGuided ? std::pow(s.speechFloor, confirmed) * std::pow(s.floor, 1.0f - confirmed) : s.floor;
     const float overSubtraction =
         s.voiceGuided ? std::pow(s.overSubtraction, confirmed) * std::pow(kPauseOverSubtraction, 1.0f - confirmed)
@@ -90,6 +93,7 @@ void zn_denoise_frame::Process(ora::fft::Frame& frame, ora::fft::Context& contex
     const float amount = std::clamp(s.amount, 0.0f, 1.0f);
     const bool learned = s.estimate == zn_denoise_settings::Estimate::Learned && m_profile.HasProfile();
     const float share = 1.0f / static_cast<float>(m_channels);
+    const float noiseShare = share * m_noisePerEnergy;
     float* power = m_power.data();
     float* gain = m_gains.data();
     for (std::size_t c = 0; c < m_channels; ++c) {
@@ -116,7 +120,7 @@ void zn_denoise_frame::Process(ora::fft::Frame& frame, ora::fft::Context& contex
             const float applied = s.listenToRemoved ? 1.0f - g : g;
             x[k] *= applied;
             kept += static_cast<double>(g) * g * power[k];
-            m_noiseSpectrum[k] = (c == 0 ? 0.0f : m_noiseSpectrum[k]) + share * noise[k];
+            m_noiseSpectrum[k] = (c == 0 ? 0.0f : m_noiseSpectrum[k]) + noiseShare * noise[k];
             m_gainSpectrum[k] = (c == 0 ? 0.0f : m_gainSpectrum[k]) + share * g;
         }
         const double silent = static_cast<double>(kSilentPower) * static_cast<double>(m_bins);

@@ -44,12 +44,16 @@ public:
     const zn_denoise_settings& Settings() const { return m_settings; }
     // Voice probability (0..1) of the frame about to run.
     void SetVoice(float probability) noexcept { m_voice = probability; }
+    // Voice guided: how far the last frame counted as voice (0..1), the
+    // detector's probability as the tracker confirmed it.
+    float ConfirmedVoice() const { return m_confirmed; }
 
     zn_noise_profile& Profile() { return m_profile; }
     const zn_noise_profile& Profile() const { return m_profile; }
 
     // Of the last frame: power removed per channel in dB (<= 0), and per bin,
-    // averaged over channels, the noise estimate's power and the gain.
+    // averaged over channels, the gain and the noise estimate's power per
+    // unit window energy (white noise of variance v reads v in every bin).
     float ReductionDb(std::size_t channel) const;
     const float* NoiseSpectrum() const { return m_noiseSpectrum.data(); }
     const float* GainSpectrum() const { return m_gainSpectrum.data(); }
@@ -64,7 +68,9 @@ private:
     float m_evidence = 0.0f;
     float m_evidenceFall = 0.0f;
     double m_sampleRate = 48000.0;
+    float m_noisePerEnergy = 1.0f;
     float m_voice = 1.0f;
+    float m_confirmed = 0.0f;
     std::size_t m_channels = 0;
     std::size_t m_bins = 0;
     zn_noise_tracker m_tracker;

@@ -5,6 +5,7 @@
 #include <cstdio>
 #include <new>
 #include <sstream>
+#include <utility>
 
 namespace zen::noise_reduction {
 
@@ -23,7 +24,7 @@ bool zn_noise_profile::Configure(std::size_t channels, std::size_t bins, double 
         m_sum.Resize(channels * bins);
         m_counts.Resize(channels);
         m_power.Resize(channels * bins);
-        m_stored.reserve(channels * bins);
+        m_stored.power.reserve(channels * bins);
     } catch (const std::bad_alloc&) {
         return false;
     }
@@ -57,20 +58,44 @@ std::uint64_t zn_noise_profile::End() noexcept {
     m_learning = false;
     if (m_learnt == 0) return 0;
     // Within the capacity reserved at Configure: no allocation.
-    if (m_stored.capacity() < m_channels * m_bins) return 0;
-    m_stored.resize(m_channels * m_bins);
+    if (m_stored.power.capacity() < m_channels * m_bins) return 0;
+    m_stored.power.resize(m_channels * m_bins);
     for (std::size_t c = 0; c < m_channels; ++c) {
         const std::size_t source = m_counts[c] > 0 ? c : 0;
         const double scale = 1.0 / (static_cast<double>(m_counts[source]) * m_windowEnergy);
         for (std::size_t k = 0; k < m_bins; ++k)
-            m_stored[c * m_bins + k] = static_cast<float>(m_sum[source * m_bins + k] * scale);
+            m_stored.power[c * m_bins + k] = static_cast<float>(m_sum[source * m_bins + k] * scale);
     }
-    m_storedRate = m_sampleRate;
-    m_storedBins = m_bins;
-    m_storedChannels = m_channels;
-    m_hasProfile = true;
+    m_stored.rate = m_sampleRate;
+    m_stored.bins = m_bins;
+    m_stored.channels = m_channels;
     Rebuild();
     return m_learnt;
+}
+
+void zn_noise_profile::Forget() noexcept {
+    m_stored.bins = 0;
+    m_stored.channels = 0;
+    m_stored.power.clear();
+    Rebuild();
+}
+
+void zn_noise_profile::Adopt(Snapshot& snapshot) noexcept {
+    if (snapshot.bins < 2 || snapshot.channels == 0 || snapshot.power.size() != snapshot.bins * snapshot.channels) {
+        Forget();
+        return;
+    }
+    // Copied where it fits; otherwise the larger storage is taken, which
+    // still holds this configuration's profile.
+    if (snapshot.power.size() <= m_stored.power.capacity()) {
+        m_stored.power.assign(snapshot.power.begin(), snapshot.power.end());
+    } else {
+        m_stored.power.swap(snapshot.power);
+    }
+    m_stored.rate = snapshot.rate;
+    m_stored.bins = snapshot.bins;
+    m_stored.channels = snapshot.channels;
+    Rebuild();
 }
 
 const float* zn_noise_profile::Power(std::size_t channel) const {
@@ -78,20 +103,20 @@ const float* zn_noise_profile::Power(std::size_t channel) const {
 }
 
 void zn_noise_profile::Rebuild() noexcept {
-    if (!m_hasProfile || m_storedBins < 2 || m_storedChannels == 0 || m_bins == 0) {
+    if (!HasProfile() || m_bins == 0) {
         m_power.Clear();
         return;
     }
     const double binHz = m_sampleRate / (2.0 * static_cast<double>(m_bins - 1));
-    const double storedBinHz = m_storedRate / (2.0 * static_cast<double>(m_storedBins - 1));
+    const double storedBinHz = m_stored.rate / (2.0 * static_cast<double>(m_stored.bins - 1));
     for (std::size_t c = 0; c < m_channels; ++c) {
-        const float* stored = m_stored.data() + std::min(c, m_storedChannels - 1) * m_storedBins;
+        const float* stored = m_stored.power.data() + std::min(c, m_stored.channels - 1) * m_stored.bins;
         float* power = m_power.data() + c * m_bins;
         for (std::size_t k = 0; k < m_bins; ++k) {
             const double position = std::min(static_cast<double>(k) * binHz / storedBinHz,
-                                             static_cast<double>(m_storedBins - 1));
+                                             static_cast<double>(m_stored.bins - 1));
             const auto i = static_cast<std::size_t>(position);
-            const std::size_t j = std::min(i + 1, m_storedBins - 1);
+            const std::size_t j = std::min(i + 1, m_stored.bins - 1);
             const double t = position - static_cast<double>(i);
             const double perEnergy = (1.0 - t) * stored[i] + t * stored[j];
             power[k] = static_cast<float>(perEnergy * m_windowEnergy);
@@ -99,20 +124,40 @@ void zn_noise_profile::Rebuild() noexcept {
     }
 }
 
-std::string zn_noise_profile::ToText() const {
-    if (!m_hasProfile) return {};
-    std::string text = std::string(kTextTag) + " " + std::to_string(static_cast<long long>(std::llround(m_storedRate))) +
-                       " " + std::to_string(m_storedBins) + " " + std::to_string(m_storedChannels);
+std::string zn_noise_profile::ToText() const { return Format(m_stored); }
+
+bool zn_noise_profile::FromText(const std::string& text) {
+    Snapshot snapshot;
+    if (text.empty() || !Parse(text, snapshot)) return false;
+    try {
+        snapshot.power.reserve(m_channels * m_bins);
+    } catch (const std::bad_alloc&) {
+        return false;
+    }
+    m_stored = std::move(snapshot);
+    Rebuild();
+    return true;
+}
+
+std::string zn_noise_profile::Format(const Snapshot& snapshot) {
+    if (snapshot.bins == 0) return {};
+    std::string text = std::string(kTextTag) + " " + std::to_string(static_cast<long long>(std::llround(snapshot.rate))) +
+                       " " + std::to_string(snapshot.bins) + " " + std::to_string(snapshot.channels);
     char number[32];
-    for (std::size_t i = 0; i < m_storedBins * m_storedChannels; ++i) {
-        const double db = m_stored[i] > 0.0f ? std::max(10.0 * std::log10(m_stored[i]), kDbFloor) : kDbFloor;
+    for (std::size_t i = 0; i < snapshot.bins * snapshot.channels; ++i) {
+        const float p = snapshot.power[i];
+        const double db = p > 0.0f ? std::max(10.0 * std::log10(p), kDbFloor) : kDbFloor;
         std::snprintf(number, sizeof number, " %.2f", db);
         text += number;
     }
     return text;
 }
 
-bool zn_noise_profile::FromText(const std::string& text) {
+bool zn_noise_profile::Parse(const std::string& text, Snapshot& snapshot) {
+    if (text.empty()) {
+        snapshot = Snapshot{};
+        return true;
+    }
     std::istringstream in(text);
     std::string tag;
     double rate = 0.0;
@@ -128,12 +173,10 @@ bool zn_noise_profile::FromText(const std::string& text) {
     }
     std::string rest;
     if (in >> rest) return false;
-    m_stored.assign(values.begin(), values.end());
-    m_storedRate = rate;
-    m_storedBins = static_cast<std::size_t>(bins);
-    m_storedChannels = static_cast<std::size_t>(channels);
-    m_hasProfile = true;
-    Rebuild();
+    snapshot.rate = rate;
+    snapshot.bins = static_cast<std::size_t>(bins);
+    snapshot.channels = static_cast<std::size_t>(channels);
+    snapshot.power = std::move(values);
     return true;
 }
 

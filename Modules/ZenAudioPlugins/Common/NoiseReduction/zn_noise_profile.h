@@ -7,8 +7,8 @@
 // no frame leaves the previous profile in place. The profile survives Reset
 // (it is a setting, not signal state) and travels as text (ToText/FromText).
 //
-// Configure, ToText and FromText allocate; Begin, Learn, End, Apply and
-// Reset are real-time safe.
+// Configure, ToText and FromText allocate; Begin, Learn, End and Adopt are
+// real-time safe.
 #pragma once
 
 #include <cstddef>
@@ -25,6 +25,15 @@ public:
     static constexpr std::size_t kMaxChannels = 64;
     static constexpr const char* kTextTag = "noise-profile";
 
+    // A profile as learnt or loaded, in its own rate and bins: power per
+    // unit window energy, channels x bins. No bins: no profile.
+    struct Snapshot {
+        double rate = 48000.0;
+        std::size_t bins = 0;
+        std::size_t channels = 0;
+        std::vector<float> power;
+    };
+
     // `windowEnergy` is the sum of the squared analysis window.
     bool Configure(std::size_t channels, std::size_t bins, double sampleRate, double windowEnergy);
 
@@ -35,8 +44,8 @@ public:
     bool IsLearning() const { return m_learning; }
     std::uint64_t FramesLearnt() const { return m_learnt; }
 
-    bool HasProfile() const { return m_hasProfile; }
-    void Forget() noexcept { m_hasProfile = false; }
+    bool HasProfile() const { return m_stored.bins > 0; }
+    void Forget() noexcept;
     // The profile as expected periodogram power of this channel's frames
     // (channels beyond those learnt use the last learnt one).
     const float* Power(std::size_t channel) const;
@@ -46,6 +55,15 @@ public:
     std::string ToText() const;
     // False for text that is not a profile; the profile then stays as it was.
     bool FromText(const std::string& text);
+    static std::string Format(const Snapshot& snapshot);
+    // "" gives the empty snapshot.
+    static bool Parse(const std::string& text, Snapshot& snapshot);
+
+    // The profile held, empty without one.
+    const Snapshot& Learnt() const { return m_stored; }
+    // Takes `snapshot` as the profile (an empty one forgets it); `snapshot`
+    // may come back holding the previous profile's storage.
+    void Adopt(Snapshot& snapshot) noexcept;
 
 private:
     void Rebuild() noexcept;  // the stored profile in this configuration's bins
@@ -55,19 +73,14 @@ private:
     double m_sampleRate = 48000.0;
     double m_windowEnergy = 1.0;
     bool m_learning = false;
-    bool m_hasProfile = false;
     std::uint64_t m_learnt = 0;
     ora::AlignedBuffer<double> m_sum;
     ora::AlignedBuffer<std::uint64_t> m_counts;
     ora::AlignedBuffer<float> m_power;  // expected periodogram power, channels x bins
 
-    // The profile as learnt or loaded: its own rate and bins, power per unit
-    // window energy. Sized at Configure for this configuration, resized only
-    // by FromText.
-    double m_storedRate = 48000.0;
-    std::size_t m_storedBins = 0;
-    std::size_t m_storedChannels = 0;
-    std::vector<float> m_stored;
+    // Its capacity always holds a profile of this configuration, so that
+    // End never allocates.
+    Snapshot m_stored;
 };
 
 }  // namespace zen::noise_reduction

@@ -55,7 +55,8 @@ void zn_stft::Process(float* const* channels, std::size_t offset, std::size_t co
         for (std::size_t c = 0; c < m_channels; ++c) {
             const float* x = channels[c] + offset + done;
             float* copy = m_input[c].data();
-            for (std::size_t i = 0; i < n; ++i) copy[i] = std::isfinite(x[i]) ? x[i] : 0.0f;
+            for (std::size_t i = 0; i < n; ++i)
+                copy[i] = std::isfinite(x[i]) ? std::clamp(x[i], -kLargestInput, kLargestInput) : 0.0f;
             in[c] = copy;
             out[c] = channels[c] + offset + done;
         }

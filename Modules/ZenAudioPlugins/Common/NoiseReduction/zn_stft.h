@@ -7,7 +7,8 @@
 // Frames run when the samples written since Reset reach a multiple of the
 // hop, whatever the block split; an owner that must set something before a
 // frame (a voice decision) processes up to ToNextFrame() at a time.
-// Non-finite input samples enter the analysis as silence.
+// Non-finite input samples enter the analysis as silence, finite ones beyond
+// kLargestInput at that magnitude (a frame's power stays finite).
 //
 // Configure allocates; Process and Reset are real-time safe.
 #pragma once
@@ -28,6 +29,7 @@ public:
     static constexpr double kFrameSeconds = 1024.0 / 48000.0;
     static constexpr std::size_t kOverlap = 4;
     static constexpr std::size_t kMaxChannels = 64;
+    static constexpr float kLargestInput = 1e12f;
 
     // The power of two nearest kFrameSeconds at `sampleRate` (at least 64).
     static std::size_t FrameLengthFor(double sampleRate);

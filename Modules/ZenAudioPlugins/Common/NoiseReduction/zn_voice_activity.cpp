@@ -73,7 +73,7 @@ void zn_voice_activity::Process(const float* const* channels, std::size_t channe
             float sum = 0.0f;
             for (std::size_t c = 0; c < channelCount; ++c) {
                 const float x = channels[c][offset + done + i];
-                sum += std::isfinite(x) ? x : 0.0f;
+                sum += std::isfinite(x) ? std::clamp(x, -kLargestInput, kLargestInput) : 0.0f;
             }
             mono[i] = sum * share;
         }

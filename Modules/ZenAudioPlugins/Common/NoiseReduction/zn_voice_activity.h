@@ -25,6 +25,8 @@ public:
     static constexpr double kAntiAliasHz = 7000.0;
     static constexpr double kHoldSeconds = 0.2;           // pauses between words
     static constexpr double kFallSeconds = 0.15;          // from 1 to 0 after the hold
+    // The detector hears full scale at most; huge samples must not overflow its filter.
+    static constexpr float kLargestInput = 4.0f;
 
     zn_voice_activity();
     ~zn_voice_activity();
