@@ -50,15 +50,21 @@ bool TrackingNotchBank::SetParameter(std::uint64_t index, float value) {
     if (!ZenAudioAlgorithm::SetParameter(index, value)) return false;
     switch (index) {
         case kFundamental:
+            // The same value again leaves the tracking where it is.
+            if (value == m_nominal) break;
             m_nominal = value;
             SetFrequency(value);
             m_frequencyRate = 0.0;
             break;
         case kHarmonics:
             m_harmonics = static_cast<std::size_t>(std::clamp<long>(std::lround(value), 1, kMaxHarmonics));
+            // A harmonic taken up again starts from nothing, not from what it once learnt.
+            for (ChannelState& c : m_channels)
+                for (std::size_t k = m_harmonics; k < kMaxHarmonics; ++k) c.weight[k] = c.previous[k] = 0.0;
             break;
         case kWidth: m_width = value; break;
         case kTracking:
+            if (m_tracking == (value == 1.0f)) break;
             m_tracking = value == 1.0f;
             if (!m_tracking) SetFrequency(m_nominal);
             m_frequencyRate = 0.0;

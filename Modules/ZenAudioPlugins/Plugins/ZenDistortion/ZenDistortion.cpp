@@ -18,7 +18,6 @@ constexpr double kTailNepers = 11.5;
 
 // Half the tilt above the pivot, half below: the high band's gain.
 float TiltGain(float db) { return std::pow(10.0f, db / 40.0f); }
-float Fraction(float percent) { return 0.01f * percent; }
 
 }  // namespace
 
@@ -44,7 +43,7 @@ const zen::ParameterTableDefinition& ZenDistortion::Definitions() {
             ContinuousParameter("TONE", QT_TRANSLATE_NOOP("ZenDistortion", "Tone"), -12.0f, 12.0f, 0.0f, 0.1f, "dB")
                 .Smoothed(TiltGain),
             ContinuousParameter("MIX", QT_TRANSLATE_NOOP("ZenDistortion", "Mix"), 0.0f, 100.0f, 100.0f, 0.1f, "%")
-                .Smoothed(Fraction),
+                .Smoothed(working::PercentToFraction),
             ContinuousParameter("OUTPUT_LEVEL", QT_TRANSLATE_NOOP("ZenDistortion", "Output Level"), -kCeilingRangeDb,
                                 kCeilingRangeDb, 0.0f, 0.1f, "dB")
                 .Smoothed(working::DbToGain),

@@ -4,9 +4,9 @@
 // times the host's rate, so aliasing stays far below the harmonics; the dry
 // signal is delayed to match the reported latency.
 //
-// "Ceiling" and "Output Level" span the same number of decibels with their
-// middles at 0 dB, so moving both by the same share of their ranges, one
-// down and one up, drives harder at an unchanged peak level.
+// "Ceiling" spans 24 dB below full scale and "Output Level" 24 dB either
+// side of 0 dB: lowering the ceiling by a share of its range and raising
+// the output level by half that share drives harder at the same peak.
 #pragma once
 
 #include <vector>

@@ -15,8 +15,6 @@ namespace {
 constexpr double kPi = 3.141592653589793;
 constexpr float kMainsHz[] = {50.0f, 60.0f};
 
-float Fraction(float percent) { return 0.01f * percent; }
-
 }  // namespace
 
 ZenHumRemoval::ZenHumRemoval() {
@@ -37,7 +35,7 @@ const zen::ParameterTableDefinition& ZenHumRemoval::Definitions() {
             ContinuousParameter("WIDTH", QT_TRANSLATE_NOOP("ZenHumRemoval", "Width"), 0.1f, 10.0f, 1.0f, 0.01f, "Hz"),
             SwitchParameter("TRACKING", QT_TRANSLATE_NOOP("ZenHumRemoval", "Tracking"), 1.0f),
             ContinuousParameter("AMOUNT", QT_TRANSLATE_NOOP("ZenHumRemoval", "Amount"), 0.0f, 100.0f, 100.0f, 0.1f, "%")
-                .Smoothed(Fraction),
+                .Smoothed(working::PercentToFraction),
             SwitchParameter("LISTEN", QT_TRANSLATE_NOOP("ZenHumRemoval", "listen to removed hum"), 0.0f)
                 .Smoothed(working::Identity),
         });

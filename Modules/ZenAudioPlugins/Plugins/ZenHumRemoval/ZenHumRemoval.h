@@ -18,8 +18,8 @@ public:
 
     enum Parameter : std::uint32_t { kFrequency, kHarmonics, kWidth, kTracking, kAmount, kListen };
     enum Mains { k50Hz, k60Hz };
-    // Rows of the meter table: the fundamental the notches sit on, the
-    // removed hum's peak (all channels) and each channel's output peak.
+    // Rows of the meter table: the fundamental the notches sit on, the peak
+    // of the hum found (all channels) and each channel's output peak.
     enum Meter : std::uint32_t { kHumFrequency, kHumLevel, kOutputPeak };
 
     // After the input stops, the cancellers' memory has fallen by 100 dB.
