@@ -22,5 +22,8 @@ inline float DbToGain(float db) { return zen::DbToGain(db); }
 // 10^(dB/20), never below the smallest normal float.
 inline float DbToGainFloored(float db) { return zen::DbToGainFloored(db); }
 
+// A share in % as a fraction.
+inline float PercentToFraction(float percent) { return 0.01f * percent; }
+
 }  // namespace working
 }  // namespace zen

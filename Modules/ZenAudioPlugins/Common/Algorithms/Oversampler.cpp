@@ -1,0 +1,82 @@
+#include "Oversampler.h"
+
+#include <cmath>
+#include <stdexcept>
+
+#include "Algorithms/KaiserLowPass.h"
+
+namespace {
+
+// Kaiser's estimates: the window's shape for a stop band of A dB, and the
+// length for a transition band of df cycles per sample.
+double KaiserBeta(double attenuationDb) { return 0.1102 * (attenuationDb - 8.7); }
+double KaiserLength(double attenuationDb, double df) { return (attenuationDb - 7.95) / (14.36 * df); }
+
+}  // namespace
+
+Oversampler::Oversampler(std::size_t factor, bool stageHalfSample)
+    : m_factor(factor), m_stageHalfSample(stageHalfSample), m_tapsPerPhase(TapsPerPhase()) {
+    if (factor != 2 && factor != 4 && factor != 8) throw std::invalid_argument("Oversampler: factor 2, 4 or 8");
+}
+
+Oversampler::~Oversampler() = default;
+
+std::size_t Oversampler::TapsPerPhase() {
+    // The transition band scales with the factor, so the taps per phase do not.
+    return static_cast<std::size_t>(std::ceil(KaiserLength(kStopbandDb, kStopbandEdge - kPassbandEdge)));
+}
+
+std::vector<float> Oversampler::Prototype(std::size_t factor, std::size_t taps) {
+    const double cutoff = 0.5 * (kPassbandEdge + kStopbandEdge) / static_cast<double>(factor);
+    return ora::numeric::KaiserLowPass(taps, cutoff, KaiserBeta(kStopbandDb));
+}
+
+bool Oversampler::Prepare(float sampleRate, std::uint32_t maxBlock) {
+    const std::size_t block = maxBlock > 0 ? maxBlock : 1;
+    const std::size_t taps = m_factor * m_tapsPerPhase;
+    // Delays (Nu - 1) / 2 + (Nd - 1) / 2 plus the stage's must leave the
+    // decimator's phase on a whole base-rate sample: Nu + Nd + 2 x stage = 2 taps.
+    const std::vector<float> up = Prototype(m_factor, m_stageHalfSample ? taps - 1 : taps);
+    const std::vector<float> down = Prototype(m_factor, taps);
+    for (Channel& channel : m_channels) {
+        channel.up = std::make_unique<ora::numeric::Upsampler>(
+            ora::numeric::UpsamplerConfig{m_factor, m_tapsPerPhase, up, 1, block});
+        channel.down = std::make_unique<ora::numeric::Downsampler>(
+            ora::numeric::DownsamplerConfig{m_factor, m_tapsPerPhase, down, 1, block * m_factor});
+        channel.high.Resize(block * m_factor);
+    }
+    return ZenAudioAlgorithm::Prepare(sampleRate, maxBlock);
+}
+
+void Oversampler::SetChannelCount(std::uint64_t channels) {
+    ZenAudioAlgorithm::SetChannelCount(channels);
+    m_channels.resize(channels);
+}
+
+void Oversampler::Reset() {
+    for (Channel& channel : m_channels) {
+        if (channel.up) channel.up->Reset();
+        if (channel.down) channel.down->Reset();
+        channel.high.Clear();
+    }
+}
+
+float* Oversampler::Up(std::uint64_t channel, const float* in, std::uint64_t frames) noexcept {
+    Channel& ch = m_channels[channel];
+    ch.up->Process(in, ch.high.data(), frames);
+    return ch.high.data();
+}
+
+void Oversampler::Down(std::uint64_t channel, float* out, std::uint64_t frames) noexcept {
+    Channel& ch = m_channels[channel];
+    ch.down->Process(ch.high.data(), out, frames * m_factor);
+}
+
+bool Oversampler::Process(float* const* channels, std::uint64_t count) {
+    for (std::uint64_t c = 0; c < m_channels.size(); ++c) {
+        if (!m_channels[c].up) return false;
+        Up(c, channels[c], count);
+        Down(c, channels[c], count);
+    }
+    return true;
+}

@@ -1,0 +1,76 @@
+// Runs a non-linear stage at a multiple of the host's rate, so that the
+// harmonics it makes above the host's Nyquist frequency are filtered away
+// instead of folding back into the audio band. Per channel: Up() interpolates
+// a block into the channel's high-rate buffer, the owner processes that
+// buffer in place, Down() decimates it back.
+//
+// Both directions use one linear-phase Kaiser low-pass, flat (within
+// 0.001 dB) up to kPassbandEdge of the base rate and kStopbandDb down from
+// the base Nyquist frequency on, so that nothing the stage makes above the
+// host's band folds back louder than that. The round trip delays by a whole
+// number of base-rate samples, GetLatency(), counting the stage's own delay
+// when it is half a high-rate sample (a first-order antiderivative shaper).
+#pragma once
+
+#include <cstdint>
+#include <memory>
+#include <vector>
+
+#include "../ZenAudioAlgorithm.h"
+#include "Algorithms/Downsampler.h"
+#include "Algorithms/Upsampler.h"
+#include "System/AlignedBuffer.h"
+
+class Oversampler : public ZenAudioAlgorithm {
+    Q_OBJECT
+
+public:
+    static constexpr std::size_t kDefaultFactor = 4;
+    static constexpr double kPassbandEdge = 0.42;  // of the base rate: 20.2 kHz at 48 kHz
+    static constexpr double kStopbandEdge = 0.5;   // of the base rate
+    static constexpr double kStopbandDb = 90.0;
+
+    // `factor` 2, 4 or 8; `stageHalfSample`: the owner's stage delays by half
+    // a high-rate sample, and the round trip makes up the other half.
+    explicit Oversampler(std::size_t factor = kDefaultFactor, bool stageHalfSample = false);
+    ~Oversampler() override;
+
+    // Builds the filters for the channel count and maxBlock base-rate frames.
+    bool Prepare(float sampleRate, std::uint32_t maxBlock) override;
+    void SetChannelCount(std::uint64_t channels) override;
+    void Reset() override;
+    // The round trip alone: the input low-passed and delayed by GetLatency()
+    // (half a high-rate sample less when the stage's half sample is counted).
+    bool Process(float* const* channels, std::uint64_t count) override;
+
+    // `frames` base-rate samples (at most the prepared block) into the
+    // channel's high-rate buffer, which is returned: GetFactor() x frames.
+    float* Up(std::uint64_t channel, const float* in, std::uint64_t frames) noexcept;
+    // The channel's high-rate buffer, as the owner left it, back to `frames`
+    // base-rate samples. `out` may be the block given to Up().
+    void Down(std::uint64_t channel, float* out, std::uint64_t frames) noexcept;
+
+    std::size_t GetFactor() const { return m_factor; }
+    // Round-trip delay in base-rate samples, the stage's included.
+    std::uint32_t GetLatency() const { return static_cast<std::uint32_t>(m_tapsPerPhase - 1); }
+    std::size_t GetTapsPerPhase() const { return m_tapsPerPhase; }
+
+    // The low-pass at the high rate (unit DC gain): the decimator's, of
+    // factor x taps-per-phase coefficients; the interpolator's is one shorter
+    // when the stage delays by half a sample.
+    static std::vector<float> Prototype(std::size_t factor, std::size_t taps);
+    // Taps per phase the Kaiser design needs for the band edges and the stop band.
+    static std::size_t TapsPerPhase();
+
+private:
+    struct Channel {
+        std::unique_ptr<ora::numeric::Upsampler> up;
+        std::unique_ptr<ora::numeric::Downsampler> down;
+        ora::AlignedBuffer<float> high;
+    };
+
+    const std::size_t m_factor;
+    const bool m_stageHalfSample;
+    const std::size_t m_tapsPerPhase;
+    std::vector<Channel> m_channels;
+};

@@ -1,0 +1,86 @@
+// Oversampler: the round trip flat and delayed by whole samples, the
+// interpolator's images and the decimator's aliases held below the stop band.
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <vector>
+
+#include "Common/Algorithms/Oversampler.h"
+#include "Support/Signals.h"
+
+namespace {
+
+// Amplitude in dB of the component at cycles-per-sample `f` of x[from..].
+double ComponentDb(const float* x, std::size_t length, double f) {
+    double re = 0.0, im = 0.0;
+    for (std::size_t n = 0; n < length; ++n) {
+        re += x[n] * std::cos(2.0 * zentest::kPi * f * static_cast<double>(n));
+        im -= x[n] * std::sin(2.0 * zentest::kPi * f * static_cast<double>(n));
+    }
+    return zentest::ToDb(2.0 * std::hypot(re, im) / static_cast<double>(length));
+}
+
+}  // namespace
+
+TEST(Oversampler, RoundTripIsFlatAcrossTheBandAndDelayedByTheLatency) {
+    for (std::size_t factor : {2, 4, 8}) {
+        Oversampler over(factor);
+        over.SetChannelCount(1);
+        over.Prepare(48000.0f, 4096);
+        std::vector<float> h = zentest::Impulse(4096);
+        float* channels[] = {h.data()};
+        ASSERT_TRUE(over.Process(channels, h.size()));
+        EXPECT_EQ(zentest::ArgPeak(h), over.GetLatency()) << factor;
+        EXPECT_EQ(over.GetLatency(), Oversampler::TapsPerPhase() - 1);
+        for (double f : {20.0, 1000.0, 10000.0, 18000.0, 20000.0})
+            EXPECT_NEAR(zentest::MagnitudeDb(h, f, 48000.0), 0.0, 0.002) << factor << "x at " << f << " Hz";
+    }
+}
+
+TEST(Oversampler, ImagesAndAliasesStayBelowTheStopBand) {
+    constexpr std::size_t kFactor = 4, kFrames = 2400;
+    Oversampler over(kFactor);
+    over.SetChannelCount(1);
+    over.Prepare(48000.0f, kFrames);
+    // A 19 kHz tone: its images sit at 29, 67 and 77 kHz of the 192 kHz stream.
+    const std::vector<float> tone = zentest::Sine(19000.0, 48000.0, kFrames);
+    const float* high = over.Up(0, tone.data(), kFrames);
+    // Whole periods of 1 kHz (192 samples) after the filter has filled.
+    const std::size_t skip = (kFactor * Oversampler::TapsPerPhase() / 192 + 1) * 192;
+    const std::size_t length = kFrames * kFactor - skip;
+    EXPECT_NEAR(ComponentDb(high + skip, length, 19000.0 / 192000.0), 0.0, 0.01);
+    for (double image : {29000.0, 67000.0, 77000.0})
+        EXPECT_LT(ComponentDb(high + skip, length, image / 192000.0), -Oversampler::kStopbandDb + 2.0) << image;
+
+    // What the stage leaves above the host's Nyquist is gone after Down.
+    for (double f : {24000.0, 25000.0, 31000.0, 47000.0, 72000.0, 95000.0}) {
+        over.Reset();
+        std::vector<float> out(kFrames);
+        float* buffer = over.Up(0, out.data(), kFrames);
+        for (std::size_t n = 0; n < kFrames * kFactor; ++n)
+            buffer[n] = static_cast<float>(std::sin(2.0 * zentest::kPi * f * static_cast<double>(n) / 192000.0));
+        over.Down(0, out.data(), kFrames);
+        EXPECT_LT(zentest::ToDb(zentest::Peak(out, 2 * Oversampler::TapsPerPhase())), -Oversampler::kStopbandDb + 2.0)
+            << f << " Hz";
+    }
+}
+
+TEST(Oversampler, AHalfSampleStageKeepsTheRoundTripOnWholeSamples) {
+    Oversampler over(4, true);
+    over.SetChannelCount(2);
+    over.Prepare(48000.0f, 512);
+    std::vector<float> h = zentest::Impulse(512, 10);
+    float* high = over.Up(1, h.data(), h.size());
+    // The mean of each sample and the one before: half a sample late.
+    float previous = 0.0f;
+    for (std::size_t n = 0; n < 4 * h.size(); ++n) {
+        const float x = high[n];
+        high[n] = 0.5f * (x + previous);
+        previous = x;
+    }
+    over.Down(1, h.data(), h.size());
+    const std::size_t peak = zentest::ArgPeak(h);
+    EXPECT_EQ(peak, 10 + over.GetLatency());
+    EXPECT_NEAR(h[peak - 1], h[peak + 1], 1e-6f);
+    EXPECT_NEAR(h[peak - 7], h[peak + 7], 1e-6f);
+}
