@@ -39,12 +39,12 @@ public:
     // to the channels as they are, so 1 leaves them bit for bit.
     static void Widen(float& left, float& right, float w) noexcept {
         if (w < 1.0f) {
-            const float mid = (left + right) * 0.5f;
-            const float side = (left - right) * 0.5f * w;
+            const float mid = left * 0.5f + right * 0.5f;
+            const float side = (left * 0.5f - right * 0.5f) * w;
             left = mid + side;
             right = mid - side;
         } else {
-            const float extra = (left - right) * 0.5f * (w - 1.0f);
+            const float extra = (left * 0.5f - right * 0.5f) * (w - 1.0f);
             left += extra;
             right -= extra;
         }
