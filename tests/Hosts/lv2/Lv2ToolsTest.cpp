@@ -97,6 +97,7 @@ TEST(Lv2Tools, Lv2applyProcessesAWavFileAsZenfxDoes) {
             const zenlv2::Variant& variant = variants[v];
             const bool widest = v + 1 == variants.size() || variants[v + 1].key != variant.key;
             if (!widest || !done.insert(variant.key).second) continue;
+            if (variant.inputs == 0) continue;  // a source: lv2apply takes no file into it
             SCOPED_TRACE(variant.uri);
             constexpr std::size_t kFrames = 2000;
             std::vector<std::vector<float>> channels;

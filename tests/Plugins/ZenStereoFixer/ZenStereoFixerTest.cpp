@@ -69,8 +69,8 @@ TEST(ZenStereoFixer, OffsetInversionAndImbalanceComeOutAlignedCorrelatedAndBalan
         EXPECT_GT(Correlation(io, from), 0.95) << direction;
         EXPECT_NEAR(zentest::ToDb(zentest::Rms(io[1], from) / zentest::Rms(io[0], from)), 0.0, 0.1) << direction;
         EXPECT_NEAR(plugin.Meter("Offset"), direction * lag / 48.0, 1e-3) << direction;
-        EXPECT_GT(plugin.Meter("Correlation"), 0.95f);
-        EXPECT_NEAR(plugin.Meter("Balance"), 0.0f, 0.1f);
+        EXPECT_GT(plugin.Meter("Output Correlation"), 0.95f);
+        EXPECT_NEAR(plugin.Meter("Output Balance"), 0.0f, 0.1f);
     }
 }
 
@@ -115,7 +115,7 @@ TEST(ZenStereoFixer, FoldsDownADeadOrInvertedChannelAndLeavesHealthyStereo) {
             EXPECT_EQ(std::vector<float>(io[0].begin() + from, io[0].end()),
                       std::vector<float>(io[1].begin() + from, io[1].end())) << "case " << i;
             EXPECT_GT(zentest::Rms(io[0], from), 0.1) << "case " << i;  // nothing cancelled
-            EXPECT_EQ(plugin.Meter("Mono Fold-Down"), 1.0f);
+            EXPECT_EQ(plugin.Meter("Folded"), 1.0f);
         } else {
             // Healthy stereo passes as it came, delayed by the latency.
             for (int c = 0; c < 2; ++c)

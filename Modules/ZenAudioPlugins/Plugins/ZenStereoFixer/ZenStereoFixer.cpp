@@ -59,9 +59,10 @@ const zen::MeterTableDefinition& ZenStereoFixer::Meters() {
         "ZenStereoFixer",
         {
             ValueMeter("OFFSET", QT_TRANSLATE_NOOP("ZenStereoFixer", "Offset"), "ms", -10.0f, 10.0f),
-            ValueMeter("CORRELATION", QT_TRANSLATE_NOOP("ZenStereoFixer", "Correlation"), "", -1.0f, 1.0f),
-            ValueMeter("BALANCE", QT_TRANSLATE_NOOP("ZenStereoFixer", "Balance"), "dB", -24.0f, 24.0f),
-            ValueMeter("FOLDED", QT_TRANSLATE_NOOP("ZenStereoFixer", "Mono Fold-Down"), "", 0.0f, 1.0f),
+            ValueMeter("OUTPUT_CORRELATION", QT_TRANSLATE_NOOP("ZenStereoFixer", "Output Correlation"), "", -1.0f,
+                       1.0f),
+            ValueMeter("OUTPUT_BALANCE", QT_TRANSLATE_NOOP("ZenStereoFixer", "Output Balance"), "dB", -24.0f, 24.0f),
+            ValueMeter("FOLDED", QT_TRANSLATE_NOOP("ZenStereoFixer", "Folded"), "", 0.0f, 1.0f),
         });
     return table;
 }

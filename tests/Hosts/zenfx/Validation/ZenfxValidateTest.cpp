@@ -69,6 +69,8 @@ TEST(ZenfxValidate, EveryRegisteredPluginPasses) {
         EXPECT_TRUE(plugin["passed"].get<bool>()) << plugin["name"];
         // The checks every plug-in with audio input gets, whatever it declares.
         const std::set<std::string> passed = WithStatus(plugin, "pass");
+        const nlohmann::json* sourceOnly = FindCheck(plugin, "latency.bypass");
+        if (sourceOnly != nullptr && (*sourceOnly)["reason"] == "no audio input") continue;
         for (const char* id : {"lifecycle.channel-layouts", "lifecycle.sample-rates", "parameters.set-get",
                                "parameters.state", "blocks.lengths", "signals.non-finite", "latency.bypass",
                                "threads.parameters", "realtime.allocation", "realtime.locks"})
