@@ -29,7 +29,9 @@ void RunPlugin(benchmark::State& state, const std::string& name, std::uint32_t c
         return;
     }
     if (setup) setup(*audio);
-    if (!audio->ConfigureChannels(channels, channels) || !audio->Prepare(static_cast<float>(sampleRate), kBlock)) {
+    // A source (no audio input) takes the channels as outputs only.
+    const bool configured = audio->ConfigureChannels(channels, channels) || audio->ConfigureChannels(0, channels);
+    if (!configured || !audio->Prepare(static_cast<float>(sampleRate), kBlock)) {
         state.SkipWithError("layout or preparation refused");
         return;
     }
