@@ -48,28 +48,6 @@ inline Float4 Princarg4(Float4 phase) {
 }
 inline float Princarg1(float phase) { return Princarg4(Splat(phase))[0]; }
 
-// atan2(y, x) within 3e-7 rad for finite parts; (0, 0) gives 0. The atan of
-// the smaller part over the larger, taken to within pi/8 of 0 or pi/4 (one
-// division), by a polynomial of degree 9 fitted there (2.3e-8), then placed
-// in its octant.
-inline Float4 Atan2(Float4 y, Float4 x) {
-    const Float4 ax = Abs4(x);
-    const Float4 ay = Abs4(y);
-    const Int4 xLarger = ax >= ay;
-    const Float4 big = Select4(xLarger, ax, ay);
-    const Float4 small = Select4(xLarger, ay, ax);
-    const Int4 upper = small > big * 0.41421356f;  // beyond tan(pi/8)
-    const Float4 num = Select4(upper, small - big, small);
-    const Float4 den = Select4(upper, small + big, big);
-    const Float4 t = num / Select4(den > 0.0f, den, Splat(1.0f));
-    const Float4 z = t * t;
-    const Float4 p = ((7.905837083e-2f * z - 1.382563673e-1f) * z + 1.997201490e-1f) * z - 3.333276141e-1f;
-    Float4 angle = t + t * z * p + Select4(upper, Splat(0.78539816f), Splat(0.0f));
-    angle = Select4(xLarger, angle, 1.57079633f - angle);
-    angle = Select4(x < 0.0f, 3.14159265f - angle, angle);
-    return Select4(y < 0.0f, -angle, angle);
-}
-
 // sin and cos within 1.2e-7 for |phase| < 8000: reduced by quarter turns
 // (pi/2 in three parts, the first two short enough to be multiplied
 // exactly), polynomials fitted on [-pi/4, pi/4].

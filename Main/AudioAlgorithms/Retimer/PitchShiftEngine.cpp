@@ -11,6 +11,10 @@ double Engine::Ratio(std::int32_t coarse, float fine) {
 double Engine::MinRatio() { return std::pow(2.0, -kMaxCents / 1200.0); }
 double Engine::MaxRatio() { return std::pow(2.0, kMaxCents / 1200.0); }
 
+std::size_t Engine::LatencyFor(const EngineParam& param) {
+    return static_cast<std::size_t>(retimer::Engine::LatencyFor(param.m_stretch, param.m_rateControl, MinRatio()));
+}
+
 Engine::Engine(EngineParam& param)
     : m_param(param), m_retimer(param.m_stretch, param.m_interp, param.m_rateControl) {}
 

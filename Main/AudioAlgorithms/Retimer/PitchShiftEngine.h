@@ -37,6 +37,9 @@ public:
     static double MinRatio();
     static double MaxRatio();
 
+    // The latency of an engine built from `param`, with or without one.
+    static std::size_t LatencyFor(const EngineParam& param);
+
     explicit Engine(EngineParam& param);
     Engine(const Engine&) = delete;
     Engine& operator=(const Engine&) = delete;

@@ -13,11 +13,15 @@ std::int64_t rate_control::LeastLatency(std::size_t frameLength, double minRatio
     return static_cast<std::int64_t>(half + std::ceil((half + static_cast<double>(lookahead)) / minRatio)) + kMargin;
 }
 
+std::int64_t rate_control::Latency(const Param& param, std::int64_t least) {
+    return std::max(least + param.m_ExtraLatency, param.m_LatencyOverride);
+}
+
 void rate_control::Configure(const Param& param, std::int64_t latency, double minRatio, double maxRatio) {
     m_glide = param.m_Immediate != 0 ? 1.0 : std::clamp(static_cast<double>(param.m_Glide), 1e-6, 1.0);
     m_minRatio = minRatio;
     m_maxRatio = maxRatio;
-    m_latency = std::max(latency + param.m_ExtraLatency, param.m_LatencyOverride);
+    m_latency = Latency(param, latency);
     m_origin = param.m_Origin;
     m_rate = m_target = std::clamp(static_cast<double>(param.m_Rate), minRatio, maxRatio);
 }

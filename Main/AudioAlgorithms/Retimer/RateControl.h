@@ -33,6 +33,8 @@ public:
     // The least latency for frames of `frameLength` read at `minRatio` or
     // above with `lookahead` samples of interpolation look-ahead.
     static std::int64_t LeastLatency(std::size_t frameLength, double minRatio, std::size_t lookahead);
+    // The latency `param` makes of the least one.
+    static std::int64_t Latency(const Param& param, std::int64_t least);
 
     void Configure(const Param& param, std::int64_t latency, double minRatio, double maxRatio);
     void Reset(double ratio) noexcept;

@@ -15,6 +15,11 @@ Engine::Engine(const fft::stretch::pv::EngineParam& stretchParam, const interp::
     system::Trace("ora::retimer::Engine::Engine(%p);", static_cast<void*>(this));
 }
 
+std::int64_t Engine::LatencyFor(const fft::stretch::pv::EngineParam& stretchParam,
+                                const rate_control::Param& rateParam, double minRatio) {
+    return rate_control::Latency(rateParam, rate_control::LeastLatency(stretchParam.FrameLength(), minRatio, kLookahead));
+}
+
 bool Engine::Configure(std::size_t channels, double minRatio, double maxRatio, fft::Backend backend) {
     m_configured = false;
     // The real-time re-timer keeps the duration: one input sample per output sample.
@@ -22,8 +27,7 @@ bool Engine::Configure(std::size_t channels, double minRatio, double maxRatio, f
         return false;
     m_Upsampler.SetInvRate(m_interpParam.GetUpsamplerInvRate());
     const std::size_t frame = m_stretch.FrameLength();
-    const std::int64_t latency = rate_control::LeastLatency(frame, minRatio, kLookahead);
-    m_rate.Configure(m_rateParam, latency, minRatio, maxRatio);
+    m_rate.Configure(m_rateParam, rate_control::LeastLatency(frame, minRatio, kLookahead), minRatio, maxRatio);
     // Input history: the oldest analysis frame starts half a frame before
     // the oldest dry sample (latency back), plus a chunk being written.
     const auto history = static_cast<std::size_t>(m_rate.Latency()) + frame + 2 * kChunk;

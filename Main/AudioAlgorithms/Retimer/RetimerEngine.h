@@ -45,6 +45,10 @@ public:
     Engine(const Engine&) = delete;
     Engine& operator=(const Engine&) = delete;
 
+    // The latency Configure gives for ratios down to `minRatio`.
+    static std::int64_t LatencyFor(const fft::stretch::pv::EngineParam& stretchParam,
+                                   const rate_control::Param& rateParam, double minRatio);
+
     // For `channels` and ratios within [minRatio, maxRatio].
     bool Configure(std::size_t channels, double minRatio, double maxRatio,
                    fft::Backend backend = fft::FFT::DefaultBackend());

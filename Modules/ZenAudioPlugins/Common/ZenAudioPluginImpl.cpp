@@ -244,7 +244,8 @@ bool ZenAudioPluginImpl::Process(float* const* channels, std::uint64_t frames) n
 void ZenAudioPluginImpl::ProcessChunk(float* const* io, std::uint32_t channelCount, std::uint32_t frames) noexcept {
     const float target = IsBypassed() ? 1.0f : 0.0f;
     const bool settled = m_bypassMix == target;
-    if (settled && target == 0.0f && m_bypassDelay.GetDelay() == 0) {
+    m_dryFilled = !(settled && target == 0.0f && m_bypassDelay.GetDelay() == 0);
+    if (!m_dryFilled) {
         ProcessBlock(io, channelCount, frames);
         return;
     }

@@ -181,6 +181,15 @@ protected:
     // Reports the latency; call from PrepareProcessing.
     void SetLatency(std::uint32_t samples) { m_latency.store(samples, std::memory_order_release); }
 
+    // Inside ProcessBlock: the block's input delayed by the latency, what
+    // bypass plays. For a plug-in that cannot process a block and must still
+    // keep the stream's timing. Null when the latency is zero and bypass is
+    // settled off: the block as it stands is that path then.
+    const float* BypassPath(std::uint32_t channel) const noexcept {
+        return m_dryFilled ? m_dry.data() + static_cast<std::size_t>(channel) * static_cast<std::size_t>(m_blockSize)
+                           : nullptr;
+    }
+
 private:
     // SetParameter once index and value are checked: store (counted for the
     // editors), then SetTarget of the working value or the hand-over.
@@ -216,5 +225,6 @@ private:
     float m_bypassFadeStep = 1.0f;
     zen::Delay m_bypassDelay;
     std::vector<float> m_dry;  // channel-major scratch, kMaxChannels x block size at most
+    bool m_dryFilled = false;  // m_dry holds this block's delayed input; audio thread
 };
 

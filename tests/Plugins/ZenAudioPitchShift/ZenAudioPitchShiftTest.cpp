@@ -1,11 +1,14 @@
 // "Pitch" through the host interface: near transparency at no shift after
-// its latency, the dry path, stereo in joint mode, the
-// channel layouts it takes and its life cycle.
+// its latency, the dry path, stereo in joint mode, the channel layouts it
+// takes, its life cycle and the blocks that cannot have the engine.
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cmath>
 #include <complex>
+#include <future>
 #include <limits>
+#include <thread>
 
 #include "Plugins/ZenAudioPitchShift/ZenAudioPitchShift.h"
 #include "Support/AssertionRecorder.h"
@@ -42,6 +45,51 @@ std::vector<float> Difference(const std::vector<float>& y, const std::vector<flo
     std::vector<float> d(y.size(), 0.0f);
     for (std::size_t i = delay; i < y.size(); ++i) d[i] = y[i] - x[i - delay];
     return d;
+}
+
+// Holds the plug-in's engine lock on a thread of its own from construction
+// until Release, exclusively (no engine for the audio thread) or shared (no
+// upgrade to apply settings).
+class LockHolder {
+public:
+    LockHolder(ZenAudioPitchShift& plugin, bool exclusive)
+        : m_releaseSignal(m_release.get_future()),
+          m_thread([this, &plugin, exclusive] {
+              if (exclusive) {
+                  boost::unique_lock<boost::upgrade_mutex> lock(plugin.EngineLock());
+                  Hold();
+              } else {
+                  boost::shared_lock<boost::upgrade_mutex> lock(plugin.EngineLock());
+                  Hold();
+              }
+          }) {
+        m_held.get_future().wait();
+    }
+    ~LockHolder() { Release(); }
+    void Release() {
+        if (!m_thread.joinable()) return;
+        m_release.set_value();
+        m_thread.join();
+    }
+
+private:
+    void Hold() {
+        m_held.set_value();
+        m_releaseSignal.wait();
+    }
+    std::promise<void> m_held;
+    std::promise<void> m_release;
+    std::future<void> m_releaseSignal;
+    std::thread m_thread;
+};
+
+// Processes x[from, to) of a mono stream in blocks of 512 into y.
+void ProcessSpan(PluginHarness& plugin, const std::vector<float>& x, std::vector<float>& y, std::size_t from,
+                 std::size_t to) {
+    zentest::Channels io = {std::vector<float>(x.begin() + static_cast<std::ptrdiff_t>(from),
+                                               x.begin() + static_cast<std::ptrdiff_t>(to))};
+    plugin.Process(io, 512);
+    std::copy(io[0].begin(), io[0].end(), y.begin() + static_cast<std::ptrdiff_t>(from));
 }
 
 }  // namespace
@@ -125,11 +173,23 @@ TEST(ZenAudioPitchShift, LifeCycleAndResetKeepTheHostsSettings) {
     plugin.Process(io, 256);
     EXPECT_GT(zentest::Peak(Difference(io[0], x, kLatency), x.size() - 2000), 0.05f);
 
+    // Without an engine the stream keeps its timing: the input comes out
+    // delayed by the latency it reports.
     instance->ShutdownPlugin();
     EXPECT_FALSE(instance->HasEngine());
+    EXPECT_EQ(plugin.Audio().GetLatency(), kLatency);
     io = {x};
-    plugin.Process(io, 256);  // without an engine the block passes unchanged
-    EXPECT_EQ(io[0], x);
+    plugin.Process(io, 256);
+    for (std::size_t i = kLatency; i < x.size(); ++i) ASSERT_EQ(io[0][i], x[i - kLatency]) << i;
+
+    // Back after a gap longer than the backlog keeps: the engine starts
+    // again and the shifted signal returns without a click.
+    ASSERT_TRUE(instance->InitializePlugin());
+    const auto tone = Tone(300.0, 3 * kLatency, 0.0);
+    io = {tone};
+    plugin.Process(io, 256);
+    EXPECT_GT(zentest::Peak(Difference(io[0], tone, kLatency), io[0].size() - 2000), 0.05f);
+    EXPECT_LT(zentest::LargestStep(std::vector<float>(io[0].begin() + kLatency, io[0].end())), 0.1f);
 }
 
 TEST(ZenAudioPitchShift, NonFiniteInputIsSilenceAndTheTailFollowsTheRatio) {
@@ -172,4 +232,52 @@ TEST(ZenAudioPitchShift, HugeFiniteSamplesComeOutFinite) {
         plugin.Process(io, 512);
         for (std::size_t i = 0; i < io[0].size(); ++i) ASSERT_TRUE(std::isfinite(io[0][i])) << level << " at " << i;
     }
+}
+
+TEST(ZenAudioPitchShift, ALockedEngineDelaysTheInputThenFadesBackWithoutAGapInItsStream) {
+    // An uninterrupted instance is the reference for the engine's stream.
+    const auto x = Tone(220.0, 24576, 0.0);
+    PluginHarness reference = zentest::Prepared("Pitch", {{"Semitones", 5.0f}}, 1);
+    std::vector<float> expected(x.size());
+    ProcessSpan(reference, x, expected, 0, x.size());
+
+    PluginHarness plugin = zentest::Prepared("Pitch", {{"Semitones", 5.0f}}, 1);
+    auto& instance = dynamic_cast<ZenAudioPitchShift&>(plugin.Instance());
+    const std::size_t lockedFrom = 8192, lockedTo = 10240;
+    std::vector<float> y(x.size());
+    ProcessSpan(plugin, x, y, 0, lockedFrom);
+    {
+        LockHolder holder(instance, true);
+        ProcessSpan(plugin, x, y, lockedFrom, lockedTo);
+    }
+    ProcessSpan(plugin, x, y, lockedTo, x.size());
+
+    for (std::size_t i = 0; i < lockedFrom; ++i) ASSERT_EQ(y[i], expected[i]) << i;
+    for (std::size_t i = lockedFrom; i < lockedTo; ++i) ASSERT_EQ(y[i], x[i - kLatency]) << i;
+    // Caught up on the missed input and faded in: the reference's stream.
+    for (std::size_t i = x.size() - 4096; i < x.size(); ++i) ASSERT_NEAR(y[i], expected[i], 1e-4f) << i;
+    // The way back is a fade, not a jump between the two signals (the way
+    // in cannot be: the engine's output is not there to fade from).
+    std::vector<float> delayed(kLatency, 0.0f);
+    delayed.insert(delayed.end(), x.begin(), x.end() - kLatency);
+    const float steepest = std::max(zentest::LargestStep(expected), zentest::LargestStep(delayed));
+    EXPECT_LT(zentest::LargestStep(std::vector<float>(y.begin() + lockedTo, y.end())), steepest * 1.1f);
+}
+
+TEST(ZenAudioPitchShift, ASharedHolderDelaysAChangeOfSettingsButNotTheAudio) {
+    const auto x = zentest::Noise(3 * kLatency, 0.5, 7);
+    PluginHarness plugin = zentest::Prepared("Pitch", {{"Semitones", 5.0f}, {"Dry/Wet", 0.0f}}, 1);
+    auto& instance = dynamic_cast<ZenAudioPitchShift&>(plugin.Instance());
+    std::vector<float> y(x.size());
+    const std::size_t changeAt = kLatency + 1024, releaseAt = 2 * kLatency;
+    ProcessSpan(plugin, x, y, 0, changeAt);
+    {
+        LockHolder holder(instance, false);
+        plugin.Set("Dry/Wet", 100.0f);
+        ProcessSpan(plugin, x, y, changeAt, releaseAt);
+    }
+    // The engine kept running dry: nothing but the delayed input so far.
+    for (std::size_t i = kLatency; i < releaseAt; ++i) ASSERT_EQ(y[i], x[i - kLatency]) << i;
+    ProcessSpan(plugin, x, y, releaseAt, x.size());
+    EXPECT_GT(zentest::Peak(Difference(y, x, kLatency), x.size() - 2000), 0.05f);
 }

@@ -6,26 +6,10 @@
 
 namespace ora::fft {
 
-namespace {
-
-// Magnitude and phase of n bins whose powers are given, the phase turned
-// by `turn` per bin; four at a time, the last few as lanes of their own.
-void Polar(const Complex* x, const float* power, float* mag, float* phase, std::size_t n, float turn) noexcept {
-    const Float4 lane = {0.0f, 1.0f, 2.0f, 3.0f};
-    std::size_t k = 0;
-    for (; k + 4 <= n; k += 4) {
-        const Float4 re = {x[k].real(), x[k + 1].real(), x[k + 2].real(), x[k + 3].real()};
-        const Float4 im = {x[k].imag(), x[k + 1].imag(), x[k + 2].imag(), x[k + 3].imag()};
-        Store4(phase + k, Atan2(im, re) + (lane + static_cast<float>(k)) * turn);
-        for (std::size_t i = 0; i < 4; ++i) mag[k + i] = std::sqrt(power[k + i]);
-    }
-    for (; k < n; ++k) {
-        phase[k] = Atan2(Splat(x[k].imag()), Splat(x[k].real()))[0] + static_cast<float>(k) * turn;
-        mag[k] = std::sqrt(power[k]);
-    }
+void Rect2Polar::Polar(const Complex* x, float* mag, float* phase, std::size_t n, float turn) const noexcept {
+    m_polar.Process(reinterpret_cast<const float*>(x), mag, phase, n);
+    for (std::size_t k = 0; k < n; ++k) phase[k] += static_cast<float>(k) * turn;
 }
-
-}  // namespace
 
 bool Rect2Polar::Configure(Frame& frame, const Context& context) {
     m_reference.Resize(context.bins);
@@ -49,14 +33,16 @@ void Rect2Polar::Process(Frame& frame, Context& context) noexcept {
         const std::size_t r = context.channels * bins;
         Complex* reference = m_reference.data();
         for (std::size_t k = 0; k < bins; ++k) reference[k] = SharedReference(fsig, context.channels, bins, k, mag2[r + k]);
-        Polar(reference, mag2 + r, mag + r, phase + r, bins, turn);
+        Polar(reference, mag + r, phase + r, bins, turn);
+        // The shared row's magnitude is the channels' total, not its sum's.
+        m_func.Sqrt(mag2 + r, mag + r, bins);
         return;
     }
     for (std::size_t c = 0; c < context.channels; ++c) {
         const Complex* x = fsig + c * bins;
         const std::size_t row = c * bins;
         for (std::size_t k = 0; k < bins; ++k) mag2[row + k] = x[k].real() * x[k].real() + x[k].imag() * x[k].imag();
-        Polar(x, mag2 + row, mag + row, phase + row, bins, turn);
+        Polar(x, mag + row, phase + row, bins, turn);
     }
 }
 

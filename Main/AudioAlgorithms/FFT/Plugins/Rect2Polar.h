@@ -6,6 +6,8 @@
 // channel's bins by the shared row's change of phase).
 #pragma once
 
+#include "Algorithms/Func.h"
+#include "Algorithms/Rect2Polar.h"
 #include "FFT/Plugin.h"
 
 namespace ora::fft {
@@ -37,6 +39,11 @@ public:
     }
 
 private:
+    // Magnitude and phase of n bins, the phase turned by `turn` per bin.
+    void Polar(const Complex* x, float* mag, float* phase, std::size_t n, float turn) const noexcept;
+
+    ora::numeric::Rect2Polar m_polar;
+    ora::numeric::Func m_func;
     AlignedBuffer<Complex> m_reference;  // the shared row's bins
 };
 

@@ -79,6 +79,7 @@ bool ZenAudioPitchShift::BuildEngine() {
         return false;
     }
     ApplyTuning();
+    m_settle = true;
     return true;
 }
 
@@ -94,14 +95,19 @@ bool ZenAudioPitchShift::AcceptsChannelConfiguration(std::uint32_t inputs, std::
     return inputs == outputs && inputs >= 1;
 }
 
-void ZenAudioPitchShift::PrepareProcessing(float, std::uint32_t) {
+void ZenAudioPitchShift::PrepareProcessing(float sampleRate, std::uint32_t maxBlockSize) {
     boost::unique_lock<boost::upgrade_mutex> lock(m_engineLock);
     if (!m_pEngine || m_pEngine->Channels() != GetProcessChannelCount()) BuildEngine();
-    if (m_pEngine) {
-        m_pEngine->Reset();
-        SetLatency(static_cast<std::uint32_t>(m_pEngine->Latency()));
-    }
+    if (m_pEngine) m_pEngine->Reset();
     m_settle = true;
+    m_restart.store(true, std::memory_order_release);
+    // The same latency with or without an engine: the bypass path keeps it.
+    const std::size_t latency = ora::pitchshift::Engine::LatencyFor(*m_param);
+    SetLatency(static_cast<std::uint32_t>(latency));
+    // A restarted engine is warm after the latency and a frame more.
+    m_warmUp = latency + kFrameLength;
+    m_backlog.Allocate(GetProcessChannelCount(), m_warmUp + maxBlockSize);
+    m_fadeStep = static_cast<float>(1.0 / std::max(1.0, kBypassFadeSeconds * sampleRate));
 }
 
 std::uint32_t ZenAudioPitchShift::GetTailLength() const {
@@ -132,64 +138,132 @@ void ZenAudioPitchShift::UpdateProcessingParameter(std::uint32_t index, float va
     }
 }
 
-void ZenAudioPitchShift::ApplyChanges(boost::upgrade_lock<boost::upgrade_mutex>& lock) noexcept {
-    const std::uint32_t bits = m_pEngine->Changes(m_wanted);
-    const bool tuning = m_wantedTuning != m_tuning;
-    if (bits == 0 && m_pEngine->Pending() == 0 && !tuning && !m_settle) return;
+bool ZenAudioPitchShift::EngineReady(std::uint32_t channelCount) const noexcept {
+    return m_pEngine && !m_inWork.empty() && !m_outWork.empty() && m_pEngine->Channels() == channelCount &&
+           m_backlog.Capacity() > 0;
+}
 
-    boost::upgrade_to_unique_lock<boost::upgrade_mutex> exclusive(lock);
-    m_pEngine->Apply(m_wanted, bits);
-    if (m_settle) {
-        m_pEngine->Reset();  // nothing was processed since the last reset
-        m_settle = false;
+bool ZenAudioPitchShift::ApplyChanges(boost::upgrade_lock<boost::upgrade_mutex>& lock) noexcept {
+    const bool tuning = m_wantedTuning != m_tuning;
+    if (!m_settle && !m_forget && !tuning && m_pEngine->Pending() == 0 && m_pEngine->Changes(m_wanted) == 0)
+        return true;
+
+    boost::unique_lock<boost::upgrade_mutex> exclusive(std::move(lock), boost::try_to_lock);
+    if (!exclusive.owns_lock()) return !m_settle && !m_forget;  // `lock` keeps the upgrade
+    if (m_forget) {
+        // Back to the construction values; what the host set differs and is applied below.
+        m_pEngine->ForgetSettings();
+        m_tuning.maxPeak = Tuning{}.maxPeak;
+        m_tuning.log10Tol = Tuning{}.log10Tol;
+        m_pEngine->SetMaxPeak(m_tuning.maxPeak);
+        m_pEngine->SetLog10Tol(m_tuning.log10Tol);
+        m_forget = false;
+        m_settle = true;
     }
-    if (tuning) {
+    m_pEngine->Apply(m_wanted, m_pEngine->Changes(m_wanted));
+    if (m_tuning != m_wantedTuning) {
         m_tuning = m_wantedTuning;
         ApplyTuning();
     }
+    if (m_settle) {
+        m_pEngine->Reset();  // nothing was processed since the restart
+        m_settle = false;
+    }
+    lock = boost::upgrade_lock<boost::upgrade_mutex>(std::move(exclusive));
+    return true;
 }
 
-void ZenAudioPitchShift::ProcessBlock(float* const* channels, std::uint32_t channelCount,
-                                      std::uint32_t frames) noexcept {
-    boost::upgrade_lock<boost::upgrade_mutex> lock(m_engineLock, boost::try_to_lock);
-    if (!lock.owns_lock() || !m_pEngine || m_inWork.empty() || m_outWork.empty() ||
-        m_pEngine->Channels() != channelCount)
-        return;
-    ApplyChanges(lock);
-
+void ZenAudioPitchShift::RunEngine(float* const* io, std::uint32_t channelCount, std::size_t count,
+                                   std::size_t keepFrom, bool fromBacklog) noexcept {
     float* in[kMaxChannels];
     float* out[kMaxChannels];
     for (std::uint32_t c = 0; c < channelCount; ++c) {
         in[c] = m_inWork.data() + static_cast<std::size_t>(c) * kWorkFrames;
         out[c] = m_outWork.data() + static_cast<std::size_t>(c) * kWorkFrames;
     }
-    for (std::uint32_t done = 0; done < frames;) {
-        const std::uint32_t count = std::min(frames - done, kWorkFrames);
-        // Non-finite input becomes silence: one NaN would otherwise stay in
-        // the spectra and the phases for good.
-        for (std::uint32_t c = 0; c < channelCount; ++c)
-            for (std::uint32_t i = 0; i < count; ++i) {
-                const float x = channels[c][done + i];
-                in[c][i] = std::isfinite(x) ? x : 0.0f;
-            }
-        m_pEngine->Process(in, out, count);
-        for (std::uint32_t c = 0; c < channelCount; ++c) std::copy_n(out[c], count, channels[c] + done);
-        done += count;
+    for (std::size_t done = 0; done < count;) {
+        const std::size_t n = std::min<std::size_t>(count - done, kWorkFrames);
+        if (fromBacklog) {
+            m_backlog.Pop(in, channelCount, n);
+        } else {
+            // Non-finite input becomes silence: one NaN would otherwise stay
+            // in the spectra and the phases for good.
+            for (std::uint32_t c = 0; c < channelCount; ++c)
+                for (std::size_t i = 0; i < n; ++i) {
+                    const float x = io[c][done + i];
+                    in[c][i] = std::isfinite(x) ? x : 0.0f;
+                }
+        }
+        m_pEngine->Process(in, out, n);
+        const std::size_t from = std::max(done, keepFrom);
+        if (from < done + n)
+            for (std::uint32_t c = 0; c < channelCount; ++c)
+                std::copy(out[c] + (from - done), out[c] + n, io[c] + (from - keepFrom));
+        done += n;
     }
 }
 
+void ZenAudioPitchShift::PlayBypassPath(float* const* io, std::uint32_t channelCount, std::uint32_t frames) noexcept {
+    m_backlog.Push(io, channelCount, frames);
+    for (std::uint32_t c = 0; c < channelCount; ++c)
+        if (const float* delayed = BypassPath(c)) std::copy_n(delayed, frames, io[c]);
+    m_pathMix = 1.0f;
+}
+
+void ZenAudioPitchShift::FadeIn(float* const* io, std::uint32_t channelCount, std::uint32_t frames) noexcept {
+    float mix = m_pathMix;
+    for (std::uint32_t c = 0; c < channelCount; ++c) {
+        const float* delayed = BypassPath(c);
+        if (delayed == nullptr) break;
+        mix = m_pathMix;
+        for (std::uint32_t i = 0; i < frames && mix > 0.0f; ++i) {
+            mix = std::max(mix - m_fadeStep, 0.0f);
+            io[c][i] += (delayed[i] - io[c][i]) * mix;
+        }
+    }
+    m_pathMix = BypassPath(0) != nullptr ? mix : 0.0f;
+}
+
+void ZenAudioPitchShift::ProcessBlock(float* const* channels, std::uint32_t channelCount,
+                                      std::uint32_t frames) noexcept {
+    if (m_restart.exchange(false, std::memory_order_acq_rel)) {
+        m_backlog.Clear();
+        m_pathMix = 0.0f;
+        m_forget = true;
+    }
+    boost::upgrade_lock<boost::upgrade_mutex> lock(m_engineLock, boost::try_to_lock);
+    if (!lock.owns_lock() || !EngineReady(channelCount) || !ApplyChanges(lock)) {
+        PlayBypassPath(channels, channelCount, frames);
+        return;
+    }
+
+    if (m_backlog.Empty()) {
+        RunEngine(channels, channelCount, frames, 0, false);
+    } else {
+        // The engine's stream goes on where it stopped; after a gap too long
+        // to keep, it starts again from enough input to be warm by now.
+        m_backlog.Push(channels, channelCount, frames);
+        if (m_backlog.Overflowed()) {
+            m_backlog.Keep(m_warmUp + frames);
+            m_pEngine->Reset();
+        }
+        const std::size_t owed = m_backlog.Size();
+        const std::size_t count = std::min<std::size_t>(owed, std::size_t{kCatchUpSpeed} * frames);
+        if (count < owed) {
+            RunEngine(channels, channelCount, count, count, true);
+            for (std::uint32_t c = 0; c < channelCount; ++c)
+                if (const float* delayed = BypassPath(c)) std::copy_n(delayed, frames, channels[c]);
+            return;
+        }
+        RunEngine(channels, channelCount, count, count - frames, true);
+    }
+    if (m_pathMix > 0.0f) FadeIn(channels, channelCount, frames);
+}
+
 void ZenAudioPitchShift::ResetProcessing() {
-    boost::unique_lock<boost::upgrade_mutex> lock(m_engineLock);
-    // Back to the construction values; the next block compares the host's
-    // settings with them and applies whatever differs.
-    m_tuning.maxPeak = Tuning{}.maxPeak;
-    m_tuning.log10Tol = Tuning{}.log10Tol;
-    m_settle = true;
-    if (!m_pEngine) return;
-    m_pEngine->ForgetSettings();
-    m_pEngine->SetMaxPeak(m_tuning.maxPeak);
-    m_pEngine->SetLog10Tol(m_tuning.log10Tol);
-    m_pEngine->Reset();
+    // Also called on the audio thread (bypass settling): the audio thread
+    // restarts the engine at its next block, with the lock it has there.
+    m_restart.store(true, std::memory_order_release);
 }
 
 template class ZenAudioPlugin<ZenAudioPitchShift>;
