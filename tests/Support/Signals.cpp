@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <complex>
 
 namespace zentest {
 
@@ -55,6 +56,28 @@ std::size_t ArgPeak(const std::vector<float>& x) {
     for (std::size_t n = 1; n < x.size(); ++n)
         if (std::fabs(x[n]) > std::fabs(x[best])) best = n;
     return best;
+}
+
+namespace {
+
+std::complex<double> Component(const std::vector<float>& x, double sampleRate, double frequency, std::size_t from,
+                               std::size_t to) {
+    std::complex<double> sum = 0.0;
+    const double w = 2.0 * kPi * frequency / sampleRate;
+    for (std::size_t n = from; n < std::min(to, x.size()); ++n)
+        sum += static_cast<double>(x[n]) * std::polar(1.0, -w * static_cast<double>(n));
+    return sum;
+}
+
+}  // namespace
+
+double ResponseDb(const std::vector<float>& x, double sampleRate, double frequency) {
+    return ToDb(std::abs(Component(x, sampleRate, frequency, 0, x.size())));
+}
+
+double Amplitude(const std::vector<float>& x, double sampleRate, double frequency, std::size_t from, std::size_t to) {
+    to = std::min(to, x.size());
+    return 2.0 * std::abs(Component(x, sampleRate, frequency, from, to)) / static_cast<double>(to - from);
 }
 
 }  // namespace zentest

@@ -21,5 +21,11 @@ double ToDb(double gain);
 float LargestStep(const std::vector<float>& x);
 // Index of the largest magnitude.
 std::size_t ArgPeak(const std::vector<float>& x);
+// |sum of x[n] e^(-j w n)| in dB at `frequency`: the response of a filter
+// whose impulse response is x.
+double ResponseDb(const std::vector<float>& x, double sampleRate, double frequency);
+// Amplitude of the component at `frequency` in x[from, to), which should
+// hold a whole number of its periods.
+double Amplitude(const std::vector<float>& x, double sampleRate, double frequency, std::size_t from, std::size_t to);
 
 }  // namespace zentest
