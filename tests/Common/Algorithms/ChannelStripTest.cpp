@@ -75,7 +75,7 @@ TEST(ChannelStrip, HandsControlsOnAtTheSameSamplesWhateverTheSplit) {
     EXPECT_EQ(run(7, false, pieces).first, reference);
     EXPECT_EQ(pieces, whole);
     for (std::size_t k = 0; k < whole.size(); ++k) ASSERT_EQ(whole[k], k * zen::ChannelStrip::kControlInterval);
-    EXPECT_EQ(calls, 63);  // one run per grid cell
+    EXPECT_EQ(calls, 125);  // one run per grid cell
     // Nothing moving: one run per block, and the same output.
     const auto [same, steadyCalls] = run(512, true, steady);
     EXPECT_EQ(same, reference);

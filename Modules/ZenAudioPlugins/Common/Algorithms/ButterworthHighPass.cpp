@@ -8,15 +8,14 @@ namespace {
 constexpr double kPi = 3.141592653589793;
 constexpr float kOn = 1.0f;
 
-ora::numeric::BiquadSection Section(const BiQuad& biquad) {
-    const BiQuad::Coefficients& c = biquad.GetCoefficients();
-    return {c.c0, c.c1, c.c2, c.c3, c.g};
-}
-
 }  // namespace
 
 ButterworthHighPass::ButterworthHighPass() : ZenAudioAlgorithm(Definitions()) {
-    for (BiQuad& section : m_sections) section.SetParameter(BiQuad::kShape, BiQuad::kHighPass);
+    for (BiQuad& design : m_designs) {
+        design.SetParameter(BiQuad::kShape, BiQuad::kHighPass);
+        design.SetParameter(BiQuad::kIn, kOn);
+    }
+    SetChannelCount(1);
     Design();
 }
 
@@ -35,10 +34,15 @@ const zen::ParameterTableDefinition& ButterworthHighPass::Definitions() {
 }
 
 bool ButterworthHighPass::Prepare(float sampleRate, std::uint32_t maxBlock) {
-    for (BiQuad& section : m_sections) section.Prepare(sampleRate, maxBlock);
+    for (BiQuad& design : m_designs) design.Prepare(sampleRate, maxBlock);
     ZenAudioAlgorithm::Prepare(sampleRate, maxBlock);
     Reset();
     return true;
+}
+
+void ButterworthHighPass::SetChannelCount(std::uint64_t channels) {
+    ZenAudioAlgorithm::SetChannelCount(channels);
+    for (zen::SvfSection& section : m_sections) section.SetChannelCount(channels);
 }
 
 bool ButterworthHighPass::SetParameter(std::uint64_t index, float value) {
@@ -48,31 +52,22 @@ bool ButterworthHighPass::SetParameter(std::uint64_t index, float value) {
 }
 
 void ButterworthHighPass::Design() {
-    const bool fourth = std::lround(GetParameter(kSlope)) == kTwentyFourDb;
-    const float frequency = GetParameter(kFrequency);
+    m_fourthOrder = std::lround(GetParameter(kSlope)) == kTwentyFourDb;
     for (int s = 0; s < 2; ++s) {
-        BiQuad& section = m_sections[s];
-        const double q = fourth ? kFourthOrderQ[s] : kSecondOrderQ;
-        section.SetParameter(BiQuad::kFreq, frequency);
-        section.SetParameter(BiQuad::kQ, static_cast<float>(q));
-        // At order 2 the second section is a wire.
-        section.SetParameter(BiQuad::kIn, fourth || s == 0 ? kOn : 0.0f);
+        BiQuad& design = m_designs[s];
+        design.SetParameter(BiQuad::kFreq, GetParameter(kFrequency));
+        design.SetParameter(BiQuad::kQ, static_cast<float>(m_fourthOrder ? kFourthOrderQ[s] : kSecondOrderQ));
+        m_sections[s].Set(design.GetCoefficients());
     }
 }
 
-void ButterworthHighPass::Reset() { m_state = {}; }
+void ButterworthHighPass::Reset() {
+    for (zen::SvfSection& section : m_sections) section.Reset();
+}
 
 bool ButterworthHighPass::Process(float* const* channels, std::uint64_t count) {
-    const std::uint64_t channelCount = GetChannelCount();
-    if (channelCount == 0) return true;
-    if (channelCount > kMaxChannels) return false;
-    const ora::numeric::BiquadSection sections[2] = {Section(m_sections[0]), Section(m_sections[1])};
-    m_pair.Process(sections, m_state, channels, channelCount, count);
-    // A non-finite input would otherwise ring in the state for ever.
-    for (std::size_t s = 0; s < 2; ++s)
-        for (std::uint64_t c = 0; c < channelCount; ++c)
-            if (!std::isfinite(m_state.w1[s][c]) || !std::isfinite(m_state.w2[s][c]))
-                m_state.w1[s][c] = m_state.w2[s][c] = 0.0;
+    m_sections[0].Process(channels, count);
+    if (m_fourthOrder) m_sections[1].Process(channels, count);
     return true;
 }
 

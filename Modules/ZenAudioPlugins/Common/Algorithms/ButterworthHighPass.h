@@ -1,14 +1,15 @@
 // Butterworth high-pass of order 2 or 4 (12 or 24 dB per octave) for the low
-// end of a strip: rumble, handling noise, proximity boom. Two BiQuad
-// sections in series (the second a wire at order 2), run on every channel
-// at once on the BiquadPair kernel. Up to 16 channels; no latency.
+// end of a strip: rumble, handling noise, proximity boom. BiQuad designs the
+// sections; they run as state-variable sections, so the corner can glide
+// under automation without steps in the output. Any number of channels; no
+// latency.
 #pragma once
 
 #include <cstdint>
 
 #include "../ZenAudioAlgorithm.h"
-#include "Algorithms/BiquadPair.h"
 #include "BiQuad.h"
+#include "SvfSection.h"
 
 class ButterworthHighPass : public ZenAudioAlgorithm {
     Q_OBJECT
@@ -17,7 +18,6 @@ public:
     enum Parameter : std::uint64_t { kFrequency, kSlope };
     // Values of "Slope".
     enum Slope { kTwelveDb, kTwentyFourDb };
-    static constexpr std::uint64_t kMaxChannels = ora::numeric::BiquadPairState::kMaxLanes;
     // Quality of the sections: 1 / (2 cos(pi/4)) for order 2, and
     // 1 / (2 cos(pi/8)), 1 / (2 cos(3 pi/8)) for order 4.
     static constexpr double kSecondOrderQ = 0.70710678118654752;
@@ -29,9 +29,9 @@ public:
 
     // Defaults at the new rate, state cleared.
     bool Prepare(float sampleRate, std::uint32_t maxBlock) override;
+    void SetChannelCount(std::uint64_t channels) override;
     bool SetParameter(std::uint64_t index, float value) override;
     void Reset() override;
-    // False, buffers untouched, for more than kMaxChannels channels.
     bool Process(float* const* channels, std::uint64_t count) override;
 
     // Seconds for the filter's ringing to fall by `decayDb` (its slowest
@@ -41,7 +41,7 @@ public:
 private:
     void Design();
 
-    BiQuad m_sections[2];
-    ora::numeric::BiquadPair m_pair;
-    ora::numeric::BiquadPairState m_state;
+    BiQuad m_designs[2];
+    zen::SvfSection m_sections[2];
+    bool m_fourthOrder = true;
 };

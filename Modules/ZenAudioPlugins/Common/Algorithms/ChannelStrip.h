@@ -18,7 +18,7 @@ namespace zen {
 
 class ChannelStrip {
 public:
-    static constexpr std::uint32_t kControlInterval = 32;
+    static constexpr std::uint32_t kControlInterval = 16;
 
     // Appends a stage, switched by `fade`; both must outlive the strip.
     void Add(StripStage& stage, const SmoothedRamp& fade);

@@ -7,17 +7,17 @@ namespace {
 
 constexpr double kPi = 3.141592653589793;
 constexpr float kOn = 1.0f;
-constexpr float kOff = 0.0f;
 enum Band { kLow, kMid, kHigh };
 
 }  // namespace
 
 ThreeBandEq::ThreeBandEq() : ZenAudioAlgorithm(Definitions()) {
-    m_bands[kLow].SetParameter(BiQuad::kShape, BiQuad::kLowShelf);
-    m_bands[kMid].SetParameter(BiQuad::kShape, BiQuad::kBell);
-    m_bands[kHigh].SetParameter(BiQuad::kShape, BiQuad::kHighShelf);
-    m_bands[kLow].SetParameter(BiQuad::kQ, kShelfQ);
-    m_bands[kHigh].SetParameter(BiQuad::kQ, kShelfQ);
+    m_designs[kLow].SetParameter(BiQuad::kShape, BiQuad::kLowShelf);
+    m_designs[kMid].SetParameter(BiQuad::kShape, BiQuad::kBell);
+    m_designs[kHigh].SetParameter(BiQuad::kShape, BiQuad::kHighShelf);
+    m_designs[kLow].SetParameter(BiQuad::kQ, kShelfQ);
+    m_designs[kHigh].SetParameter(BiQuad::kQ, kShelfQ);
+    for (BiQuad& design : m_designs) design.SetParameter(BiQuad::kIn, kOn);
     SetChannelCount(1);
     for (std::uint64_t i = 0; i < GetParameterCount(); ++i) SetParameter(i, GetParameter(i));
 }
@@ -44,7 +44,7 @@ const zen::ParameterTableDefinition& ThreeBandEq::Definitions() {
 }
 
 bool ThreeBandEq::Prepare(float sampleRate, std::uint32_t maxBlock) {
-    for (BiQuad& band : m_bands) band.Prepare(sampleRate, maxBlock);
+    for (BiQuad& design : m_designs) design.Prepare(sampleRate, maxBlock);
     ZenAudioAlgorithm::Prepare(sampleRate, maxBlock);
     Reset();
     return true;
@@ -52,37 +52,35 @@ bool ThreeBandEq::Prepare(float sampleRate, std::uint32_t maxBlock) {
 
 void ThreeBandEq::SetChannelCount(std::uint64_t channels) {
     ZenAudioAlgorithm::SetChannelCount(channels);
-    for (BiQuad& band : m_bands) band.SetChannelCount(channels);
+    for (zen::SvfSection& band : m_bands) band.SetChannelCount(channels);
 }
 
 bool ThreeBandEq::SetParameter(std::uint64_t index, float value) {
     if (!ZenAudioAlgorithm::SetParameter(index, value)) return false;
-    switch (index) {
-        case kLowGain:
-        case kMidGain:
-        case kHighGain: {
-            BiQuad& band = m_bands[index == kLowGain ? kLow : index == kMidGain ? kMid : kHigh];
-            band.SetParameter(BiQuad::kGain, value);
-            // Switching "In" clears the band's state.
-            band.SetParameter(BiQuad::kIn, value != 0.0f ? kOn : kOff);
-            break;
-        }
-        case kLowFrequency: m_bands[kLow].SetParameter(BiQuad::kFreq, value); break;
-        case kMidFrequency: m_bands[kMid].SetParameter(BiQuad::kFreq, value); break;
-        case kMidQ: m_bands[kMid].SetParameter(BiQuad::kQ, value); break;
-        case kHighFrequency: m_bands[kHigh].SetParameter(BiQuad::kFreq, value); break;
-        default: break;
+    // The band and BiQuad parameter of each of ours, in our index order.
+    static constexpr struct {
+        int band;
+        std::uint64_t parameter;
+    } kTargets[] = {{kLow, BiQuad::kGain},  {kLow, BiQuad::kFreq},  {kMid, BiQuad::kGain}, {kMid, BiQuad::kFreq},
+                    {kMid, BiQuad::kQ},     {kHigh, BiQuad::kGain}, {kHigh, BiQuad::kFreq}};
+    const auto [band, parameter] = kTargets[index];
+    m_designs[band].SetParameter(parameter, value);
+    if (parameter == BiQuad::kGain) {
+        const bool enabled = value != 0.0f;
+        if (enabled && !m_enabled[band]) m_bands[band].Reset();
+        m_enabled[band] = enabled;
     }
+    m_bands[band].Set(m_designs[band].GetCoefficients());
     return true;
 }
 
 void ThreeBandEq::Reset() {
-    for (BiQuad& band : m_bands) band.Reset();
+    for (zen::SvfSection& band : m_bands) band.Reset();
 }
 
 bool ThreeBandEq::Process(float* const* channels, std::uint64_t count) {
-    for (BiQuad& band : m_bands)
-        if (band.IsEnabled()) band.Process(channels, count);
+    for (int band = 0; band < 3; ++band)
+        if (m_enabled[band]) m_bands[band].Process(channels, count);
     return true;
 }
 

@@ -1,13 +1,16 @@
 // Three-band equaliser of a channel strip: a low shelf, a bell and a high
-// shelf, each a BiQuad over every channel. A band at 0 dB is switched out
-// (an exact wire, and no work); it starts from cleared state when its gain
-// leaves 0 dB, where it is itself close to a wire, so nothing clicks.
+// shelf, each designed by a BiQuad and run as a state-variable section, so
+// that gains and frequencies glide under automation without steps. A band
+// at 0 dB is switched out (an exact wire, and no work); it starts from
+// cleared state when its gain leaves 0 dB, where it is itself close to a
+// wire, so nothing clicks.
 #pragma once
 
 #include <cstdint>
 
 #include "../ZenAudioAlgorithm.h"
 #include "BiQuad.h"
+#include "SvfSection.h"
 
 class ThreeBandEq : public ZenAudioAlgorithm {
     Q_OBJECT
@@ -34,5 +37,7 @@ public:
     static double RingSeconds(double gainDb, double frequency, double q, double decayDb);
 
 private:
-    BiQuad m_bands[3];
+    BiQuad m_designs[3];
+    zen::SvfSection m_bands[3];
+    bool m_enabled[3] = {};
 };
