@@ -22,19 +22,16 @@ public:
         float offset = 0.0f;
     };
 
-    // `ramps`, one per control of the owner, must outlive the map.
-    explicit ControlMap(SmoothedRamp* ramps) : m_ramps(ramps) {}
-
     // Construction only: allocates.
     void Add(const Link& link) { m_links.push_back(link); }
 
-    // The controls that moved, at sample i of the block. Audio thread.
-    void Apply(std::uint32_t i) noexcept;
+    // The controls that moved, at sample i of the block; `ramps` holds one
+    // per control of the owner. Audio thread.
+    void Apply(SmoothedRamp* ramps, std::uint32_t i) noexcept;
     // No control has anything new to hand on this block.
-    bool Settled() const noexcept;
+    bool Settled(const SmoothedRamp* ramps) const noexcept;
 
 private:
-    SmoothedRamp* m_ramps;
     std::vector<Link> m_links;
 };
 

@@ -40,6 +40,7 @@ public:
     void Process(float* const* channels, std::uint32_t channelCount, std::uint32_t offset, std::uint32_t count,
                  const SmoothedRamp& fade) noexcept;
 
+    ZenAudioAlgorithm& Algorithm() { return m_algorithm; }
     // Whether the last segment ran through the stage.
     bool IsRunning() const { return m_running; }
     // The peak measured since the last call: of |output - input| or of the

@@ -23,12 +23,13 @@ constexpr float kReductionFloorDb = -40.0f;
 ZenDialogProcessor::ZenDialogProcessor() {
     InitParameters(Definitions());
     InitMeters(Meters());
-    m_strip.Add(m_rumbleStage, m_ramps[kRumbleFilter]);
-    m_strip.Add(m_dePopStage, m_ramps[kDePop]);
-    m_strip.Add(m_deEssStage, m_ramps[kDeEss]);
-    m_strip.Add(m_expanderStage, m_ramps[kExpander]);
-    m_strip.Add(m_compressorStage, m_ramps[kCompressor]);
-    m_strip.Add(m_exciterStage, m_ramps[kExciter]);
+    InitStrip({kOutputGain, kInputPeakMeter, kOutputPeakMeter});
+    AddStage(m_rumbleStage, kRumbleFilter);
+    AddStage(m_dePopStage, kDePop);
+    AddStage(m_deEssStage, kDeEss);
+    AddStage(m_expanderStage, kExpander);
+    AddStage(m_compressorStage, kCompressor);
+    AddStage(m_exciterStage, kExciter);
 
     // What the controls set, at every control point where they moved.
     for (const zen::ControlMap::Link& link : std::initializer_list<zen::ControlMap::Link>{
@@ -43,7 +44,7 @@ ZenDialogProcessor::ZenDialogProcessor() {
              {kCompressorAmount, &m_compressor, RmsCompressor::kRatio, kCompressorRatioSpan, kCompressorRatioAtZero},
              {kExciterAmount, &m_exciter, Exciter::kMix, kExciterMixPercentAtOne},
          })
-        m_controls.Add(link);
+        AddControl(link);
 }
 
 const zen::ParameterTableDefinition& ZenDialogProcessor::Definitions() {
@@ -146,14 +147,8 @@ void ZenDialogProcessor::UpdateProcessingParameter(std::uint32_t index, float va
     if (index == kExpanderSpeed) m_expander.SetParameter(Expander::kRelease, kExpanderReleasePerSpeed * value);
 }
 
-void ZenDialogProcessor::PrepareProcessing(float sampleRate, std::uint32_t maxBlockSize) {
-    const std::uint32_t channels = GetProcessChannelCount();
-    for (ZenAudioAlgorithm* algorithm : std::initializer_list<ZenAudioAlgorithm*>{
-             &m_rumble, &m_dePop, &m_deEsser, &m_expander, &m_compressor, &m_exciter}) {
-        algorithm->SetChannelCount(channels);
-        algorithm->Prepare(sampleRate, maxBlockSize);
-    }
-    // What the amounts do not set.
+void ZenDialogProcessor::ConfigureStages() {
+    // What the amounts do not set; prepared, the algorithms are at their defaults.
     m_rumble.SetParameter(ButterworthHighPass::kSlope, ButterworthHighPass::kTwentyFourDb);
     m_deEsser.SetParameter(Deesser::kMode, Deesser::kNarrow);
     m_expander.SetParameter(Expander::kRatio, kExpanderRatio);
@@ -168,45 +163,9 @@ void ZenDialogProcessor::PrepareProcessing(float sampleRate, std::uint32_t maxBl
     m_exciter.SetParameter(Exciter::kFrequency, kExciterFrequency);
     m_exciter.SetParameter(Exciter::kDrive, kExciterDriveDb);
     m_exciter.SetParameter(Exciter::kEven, kExciterEvenPercent);
-
-    // Every control reaches the freshly prepared algorithms at the first grid point.
-    for (zen::SmoothedRamp& ramp : m_ramps) ramp.Prepare(maxBlockSize);
-    m_strip.Prepare(channels, maxBlockSize);
-    SetLatency(0);
-    ResetProcessing();
 }
 
-void ZenDialogProcessor::ResetProcessing() {
-    for (ZenAudioAlgorithm* algorithm : std::initializer_list<ZenAudioAlgorithm*>{
-             &m_rumble, &m_dePop, &m_deEsser, &m_expander, &m_compressor, &m_exciter})
-        algorithm->Reset();
-    m_strip.Reset();
-}
-
-void ZenDialogProcessor::ProcessBlock(float* const* channels, std::uint32_t channelCount,
-                                      std::uint32_t frames) noexcept {
-    for (std::uint32_t p = 0; p < kParameterCount; ++p)
-        if (p != kExpanderSpeed) m_ramps[p].Read(Smoothed(p), frames);
-
-    for (std::uint32_t c = 0; c < channelCount; ++c) {
-        float peak = 0.0f;
-        for (std::uint32_t i = 0; i < frames; ++i) peak = std::max(peak, std::fabs(channels[c][i]));
-        PublishMeter(kInputPeakMeter, c, peak);
-    }
-
-    m_strip.Process(channels, channelCount, frames, m_controls.Settled(),
-                    [this](std::uint32_t i) { m_controls.Apply(i); });
-
-    const zen::SmoothedRamp& output = m_ramps[kOutputGain];
-    for (std::uint32_t c = 0; c < channelCount; ++c) {
-        float* y = channels[c];
-        if (!output.IsConstant() || output[0] != 1.0f)
-            for (std::uint32_t i = 0; i < frames; ++i) y[i] *= output[i];
-        float peak = 0.0f;
-        for (std::uint32_t i = 0; i < frames; ++i) peak = std::max(peak, std::fabs(y[i]));
-        PublishMeter(kOutputPeakMeter, c, peak);
-    }
-
+void ZenDialogProcessor::PublishStageMeters() noexcept {
     PublishMeter(kRumbleMeter, m_rumbleStage.TakePeak());
     PublishMeter(kDePopMeter, m_dePopStage.IsRunning() ? m_dePop.GetMeter(DePop::kGainReductionMeter) : 0.0f);
     PublishMeter(kDeEssMeter, m_deEssStage.IsRunning() ? m_deEsser.GetMeter(Deesser::kReductionMeter) : 0.0f);

@@ -13,22 +13,18 @@
 // stereo (linked); no latency.
 #pragma once
 
-#include <array>
 #include <cstdint>
 
 #include "Common/Algorithms/ButterworthHighPass.h"
-#include "Common/Algorithms/ChannelStrip.h"
 #include "Common/Algorithms/DePop.h"
 #include "Common/Algorithms/Deesser.h"
 #include "Common/Algorithms/Exciter.h"
 #include "Common/Algorithms/Expander.h"
 #include "Common/Algorithms/RmsCompressor.h"
 #include "Common/Algorithms/StripStage.h"
-#include "Common/ControlMap.h"
-#include "Common/SmoothedRamp.h"
-#include "Common/ZenAudioPluginImpl.h"
+#include "Common/ZenStripPlugin.h"
 
-class ZenDialogProcessor : public ZenAudioPluginImpl {
+class ZenDialogProcessor : public ZenStripPlugin {
     Q_OBJECT
 
 public:
@@ -50,8 +46,7 @@ public:
         kCompressorAmount,
         kExciter,
         kExciterAmount,
-        kOutputGain,
-        kParameterCount
+        kOutputGain
     };
     // Rows of the meter table: each channel's input peak; what the rumble
     // filter removes (peak); the gain change of de-pop, de-esser, expander
@@ -113,9 +108,8 @@ public:
 
 protected:
     void UpdateProcessingParameter(std::uint32_t index, float value) override;
-    void PrepareProcessing(float sampleRate, std::uint32_t maxBlockSize) override;
-    void ProcessBlock(float* const* channels, std::uint32_t channelCount, std::uint32_t frames) noexcept override;
-    void ResetProcessing() override;
+    void ConfigureStages() override;
+    void PublishStageMeters() noexcept override;
 
 private:
     ButterworthHighPass m_rumble;
@@ -131,8 +125,4 @@ private:
     zen::StripStage m_expanderStage{m_expander};
     zen::StripStage m_compressorStage{m_compressor};
     zen::StripStage m_exciterStage{m_exciter, zen::StripStage::Measure::kChange};
-    zen::ChannelStrip m_strip;
-
-    std::array<zen::SmoothedRamp, kParameterCount> m_ramps;  // smoothed parameters, per block
-    zen::ControlMap m_controls{m_ramps.data()};
 };

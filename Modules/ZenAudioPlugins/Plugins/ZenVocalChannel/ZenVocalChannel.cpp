@@ -24,12 +24,12 @@ constexpr float kGateFloorDb = -80.0f;
 ZenVocalChannel::ZenVocalChannel() {
     InitParameters(Definitions());
     InitMeters(Meters());
-    m_alwaysOn.Hold(kOn);
-    m_strip.Add(m_lowCutStage, m_ramps[kLowCut]);
-    m_strip.Add(m_gateStage, m_ramps[kGate]);
-    m_strip.Add(m_eqStage, m_alwaysOn);
-    m_strip.Add(m_compressorStage, m_ramps[kCompressor]);
-    m_strip.Add(m_deEssStage, m_ramps[kDeEss]);
+    InitStrip({kOutputGain, kInputPeakMeter, kOutputPeakMeter});
+    AddStage(m_lowCutStage, kLowCut);
+    AddStage(m_gateStage, kGate);
+    AddStage(m_eqStage, kAlwaysOn);  // bands at 0 dB are wires
+    AddStage(m_compressorStage, kCompressor);
+    AddStage(m_deEssStage, kDeEss);
 
     // What the controls set, at every control point where they moved.
     for (const zen::ControlMap::Link& link : std::initializer_list<zen::ControlMap::Link>{
@@ -49,7 +49,7 @@ ZenVocalChannel::ZenVocalChannel() {
              {kDeEssFrequency, &m_deEsser, Deesser::kRange},
              {kDeEssAmount, &m_deEsser, Deesser::kAmount},
          })
-        m_controls.Add(link);
+        AddControl(link);
 }
 
 const zen::ParameterTableDefinition& ZenVocalChannel::Definitions() {
@@ -171,55 +171,14 @@ void ZenVocalChannel::UpdateProcessingParameter(std::uint32_t index, float value
     }
 }
 
-void ZenVocalChannel::PrepareProcessing(float sampleRate, std::uint32_t maxBlockSize) {
-    const std::uint32_t channels = GetProcessChannelCount();
-    for (ZenAudioAlgorithm* algorithm :
-         std::initializer_list<ZenAudioAlgorithm*>{&m_lowCut, &m_gate, &m_eq, &m_compressor, &m_deEsser}) {
-        algorithm->SetChannelCount(channels);
-        algorithm->Prepare(sampleRate, maxBlockSize);
-    }
-    // What the parameters do not set.
+void ZenVocalChannel::ConfigureStages() {
+    // What the parameters do not set; prepared, the algorithms are at their defaults.
     m_compressor.SetParameter(RmsCompressor::kKnee, kCompressorKneeDb);
     m_compressor.SetParameter(RmsCompressor::kRmsSpeed, kCompressorRmsMs);
     m_deEsser.SetParameter(Deesser::kMode, Deesser::kNarrow);
-
-    // Every control reaches the freshly prepared algorithms at the first grid point.
-    for (zen::SmoothedRamp& ramp : m_ramps) ramp.Prepare(maxBlockSize);
-    m_strip.Prepare(channels, maxBlockSize);
-    SetLatency(0);
-    ResetProcessing();
 }
 
-void ZenVocalChannel::ResetProcessing() {
-    for (ZenAudioAlgorithm* algorithm :
-         std::initializer_list<ZenAudioAlgorithm*>{&m_lowCut, &m_gate, &m_eq, &m_compressor, &m_deEsser})
-        algorithm->Reset();
-    m_strip.Reset();
-}
-
-void ZenVocalChannel::ProcessBlock(float* const* channels, std::uint32_t channelCount, std::uint32_t frames) noexcept {
-    for (std::uint32_t p = 0; p < kParameterCount; ++p)
-        if (Definitions()[p].IsSmoothed()) m_ramps[p].Read(Smoothed(p), frames);
-
-    for (std::uint32_t c = 0; c < channelCount; ++c) {
-        float peak = 0.0f;
-        for (std::uint32_t i = 0; i < frames; ++i) peak = std::max(peak, std::fabs(channels[c][i]));
-        PublishMeter(kInputPeakMeter, c, peak);
-    }
-
-    m_strip.Process(channels, channelCount, frames, m_controls.Settled(),
-                    [this](std::uint32_t i) { m_controls.Apply(i); });
-
-    const zen::SmoothedRamp& output = m_ramps[kOutputGain];
-    for (std::uint32_t c = 0; c < channelCount; ++c) {
-        float* y = channels[c];
-        if (!output.IsConstant() || output[0] != 1.0f)
-            for (std::uint32_t i = 0; i < frames; ++i) y[i] *= output[i];
-        float peak = 0.0f;
-        for (std::uint32_t i = 0; i < frames; ++i) peak = std::max(peak, std::fabs(y[i]));
-        PublishMeter(kOutputPeakMeter, c, peak);
-    }
-
+void ZenVocalChannel::PublishStageMeters() noexcept {
     PublishMeter(kLowCutMeter, m_lowCutStage.TakePeak());
     PublishMeter(kGateMeter, m_gateStage.IsRunning() ? m_gate.GetMeter(NoiseGate::kGainMeter) : 0.0f);
     PublishMeter(kEqMeter, m_eqStage.TakePeak());

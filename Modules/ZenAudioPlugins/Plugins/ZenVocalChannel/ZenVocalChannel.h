@@ -9,21 +9,17 @@
 // thresholds glide. Mono or stereo (linked); no latency.
 #pragma once
 
-#include <array>
 #include <cstdint>
 
 #include "Common/Algorithms/ButterworthHighPass.h"
-#include "Common/Algorithms/ChannelStrip.h"
 #include "Common/Algorithms/Deesser.h"
 #include "Common/Algorithms/NoiseGate.h"
 #include "Common/Algorithms/RmsCompressor.h"
 #include "Common/Algorithms/StripStage.h"
 #include "Common/Algorithms/ThreeBandEq.h"
-#include "Common/ControlMap.h"
-#include "Common/SmoothedRamp.h"
-#include "Common/ZenAudioPluginImpl.h"
+#include "Common/ZenStripPlugin.h"
 
-class ZenVocalChannel : public ZenAudioPluginImpl {
+class ZenVocalChannel : public ZenStripPlugin {
     Q_OBJECT
 
 public:
@@ -54,8 +50,7 @@ public:
         kDeEss,
         kDeEssFrequency,
         kDeEssAmount,
-        kOutputGain,
-        kParameterCount
+        kOutputGain
     };
     // Rows of the meter table: each channel's input peak; what the low cut
     // removes (peak); the gate's gain (dB); the peak after the EQ; the gain
@@ -86,9 +81,8 @@ public:
 
 protected:
     void UpdateProcessingParameter(std::uint32_t index, float value) override;
-    void PrepareProcessing(float sampleRate, std::uint32_t maxBlockSize) override;
-    void ProcessBlock(float* const* channels, std::uint32_t channelCount, std::uint32_t frames) noexcept override;
-    void ResetProcessing() override;
+    void ConfigureStages() override;
+    void PublishStageMeters() noexcept override;
 
 private:
     ButterworthHighPass m_lowCut;
@@ -102,9 +96,4 @@ private:
     zen::StripStage m_eqStage{m_eq, zen::StripStage::Measure::kOutput};
     zen::StripStage m_compressorStage{m_compressor};
     zen::StripStage m_deEssStage{m_deEsser};
-    zen::ChannelStrip m_strip;
-
-    std::array<zen::SmoothedRamp, kParameterCount> m_ramps;  // smoothed parameters, per block
-    zen::SmoothedRamp m_alwaysOn;                            // the EQ has no switch
-    zen::ControlMap m_controls{m_ramps.data()};
 };
