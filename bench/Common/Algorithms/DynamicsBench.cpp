@@ -7,6 +7,7 @@
 #include "Common/Algorithms/ButterworthHighPass.h"
 #include "Common/Algorithms/Exciter.h"
 #include "Common/Algorithms/Limiter.h"
+#include "Common/Algorithms/LinkwitzRileyCrossover.h"
 #include "Common/Algorithms/NoiseGate.h"
 #include "Common/Algorithms/RmsCompressor.h"
 #include "Support/NoiseSource.h"
@@ -107,3 +108,18 @@ static void BM_Exciter_Stereo48k(benchmark::State& state) {
     zenbench::ReportRealtime(state, zenbench::kBlock);
 }
 BENCHMARK(BM_Exciter_Stereo48k);
+
+// A stereo five-band split and its sum, the crossover alone.
+static void BM_LinkwitzRileyCrossover_FiveBands_Stereo48k(benchmark::State& state) {
+    LinkwitzRileyCrossover crossover;
+    crossover.SetChannelCount(2);
+    crossover.Prepare(static_cast<float>(zenbench::kSampleRate), zenbench::kBlock);
+    crossover.SetParameter(LinkwitzRileyCrossover::kBands, 5.0f);
+    NoiseSource input(2);
+    for (auto _ : state) {
+        crossover.Process(input.Next(), zenbench::kBlock);
+        benchmark::ClobberMemory();
+    }
+    zenbench::ReportRealtime(state, zenbench::kBlock);
+}
+BENCHMARK(BM_LinkwitzRileyCrossover_FiveBands_Stereo48k);

@@ -41,9 +41,9 @@ TEST(ThreeBandEq, FlatIsExactAndEachBandReachesItsGain) {
                                                   {ThreeBandEq::kMidFrequency, 2000.0f},
                                                   {ThreeBandEq::kHighGain, 4.0f},
                                                   {ThreeBandEq::kHighFrequency, 16000.0f}});
-    EXPECT_NEAR(zentest::ResponseDb(h, kRate, 0.0), 6.0, 0.02);    // low shelf at DC
-    EXPECT_NEAR(zentest::ResponseDb(h, kRate, 2000.0), -9.0, 0.1);  // the bell, the shelves' skirts beside it
-    EXPECT_NEAR(zentest::ResponseDb(h, kRate, kRate / 2), 4.0, 0.02);  // high shelf at Nyquist
+    EXPECT_NEAR(zentest::MagnitudeDb(h, 0.0, kRate), 6.0, 0.02);    // low shelf at DC
+    EXPECT_NEAR(zentest::MagnitudeDb(h, 2000.0, kRate), -9.0, 0.1);  // the bell, the shelves' skirts beside it
+    EXPECT_NEAR(zentest::MagnitudeDb(h, kRate / 2, kRate), 4.0, 0.02);  // high shelf at Nyquist
 }
 
 TEST(ThreeBandEq, RingsNoLongerThanItsBoundSays) {
