@@ -11,3 +11,9 @@ static void BM_VocalChannel_AllStages_Stereo48k(benchmark::State& state) {
     });
 }
 BENCHMARK(BM_VocalChannel_AllStages_Stereo48k);
+
+// The defaults: low cut, compressor and de-esser; the EQ flat.
+static void BM_VocalChannel_Defaults_Stereo48k(benchmark::State& state) {
+    zenbench::RunPlugin(state, "Vocal Channel", 2);
+}
+BENCHMARK(BM_VocalChannel_Defaults_Stereo48k);

@@ -68,7 +68,7 @@ public:
     // squeeze a deep voice's fundamental along with the pops.
     static constexpr float kDePopThresholdAtZeroDb = -10.0f;
     static constexpr float kDePopThresholdSpanDb = 14.0f;
-    // De-esser: its "Amount" 0..100 %, a band boost of up to 16.7 dB, in the "Wide" band.
+    // De-esser: its "Amount" 0..100 %, a band boost of up to 16.7 dB, in the "Narrow" band.
     static constexpr float kDeEssPercentAtOne = 100.0f;
     // Expander: the range, 0 to 40 dB, at a ratio of 3.
     static constexpr float kExpanderRangeAtOneDb = 40.0f;
