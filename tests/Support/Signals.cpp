@@ -80,6 +80,15 @@ std::size_t ArgPeak(const std::vector<float>& x) {
 
 namespace {
 
+std::complex<double> Component(const std::vector<float>& x, double sampleRate, double frequency, std::size_t from,
+                               std::size_t to) {
+    std::complex<double> sum = 0.0;
+    const double w = 2.0 * kPi * frequency / sampleRate;
+    for (std::size_t n = from; n < std::min(to, x.size()); ++n)
+        sum += static_cast<double>(x[n]) * std::polar(1.0, -w * static_cast<double>(n));
+    return sum;
+}
+
 std::vector<double> Envelope(const std::vector<float>& x, int smoothing) {
     std::vector<double> weights(static_cast<std::size_t>(2 * smoothing + 1));
     for (int j = -smoothing; j <= smoothing; ++j)
@@ -96,6 +105,11 @@ std::vector<double> Envelope(const std::vector<float>& x, int smoothing) {
 }
 
 }  // namespace
+
+double Amplitude(const std::vector<float>& x, double sampleRate, double frequency, std::size_t from, std::size_t to) {
+    to = std::min(to, x.size());
+    return 2.0 * std::abs(Component(x, sampleRate, frequency, from, to)) / static_cast<double>(to - from);
+}
 
 double EnvelopeLag(const std::vector<float>& reference, const std::vector<float>& test, int maxLag, int smoothing) {
     const std::vector<double> a = Envelope(reference, smoothing);

@@ -24,6 +24,9 @@ double ToDb(double gain);
 float LargestStep(const std::vector<float>& x);
 // Index of the largest magnitude.
 std::size_t ArgPeak(const std::vector<float>& x);
+// Amplitude of the component at `frequency` in x[from, to), which should
+// hold a whole number of its periods.
+double Amplitude(const std::vector<float>& x, double sampleRate, double frequency, std::size_t from, std::size_t to);
 // Magnitude in dB at `frequency` of an impulse response (its DFT there).
 double MagnitudeDb(const std::vector<float>& impulseResponse, double frequency, double sampleRate);
 

@@ -104,16 +104,15 @@ SpeechLike MakeSpeechLike(double sampleRate, int syllables, unsigned seed) {
 }
 
 double BandEnergy(const std::vector<float>& x, double sampleRate, double low, double high,
-                  const std::vector<Region>& regions) {
-    constexpr std::size_t kFrame = 1024;
-    const auto first = static_cast<std::size_t>(std::ceil(low * kFrame / sampleRate));
-    const auto last = std::min(kFrame / 2, static_cast<std::size_t>(std::floor(high * kFrame / sampleRate)));
+                  const std::vector<Region>& regions, std::size_t frame) {
+    const auto first = static_cast<std::size_t>(std::ceil(low * frame / sampleRate));
+    const auto last = std::min(frame / 2, static_cast<std::size_t>(std::floor(high * frame / sampleRate)));
     double energy = 0;
-    std::vector<std::complex<double>> bins(kFrame);
+    std::vector<std::complex<double>> bins(frame);
     for (const Region& region : regions)
-        for (std::size_t start = region.first; start + kFrame <= std::min(region.second, x.size()); start += kFrame / 2) {
-            for (std::size_t n = 0; n < kFrame; ++n)
-                bins[n] = (0.5 - 0.5 * std::cos(2 * kPi * static_cast<double>(n) / kFrame)) * x[start + n];
+        for (std::size_t start = region.first; start + frame <= std::min(region.second, x.size()); start += frame / 2) {
+            for (std::size_t n = 0; n < frame; ++n)
+                bins[n] = (0.5 - 0.5 * std::cos(2 * kPi * static_cast<double>(n) / frame)) * x[start + n];
             Fft(bins);
             for (std::size_t k = first; k <= last; ++k) energy += std::norm(bins[k]);
         }

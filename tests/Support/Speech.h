@@ -22,9 +22,9 @@ struct SpeechLike {
 SpeechLike MakeSpeechLike(double sampleRate, int syllables = 6, unsigned seed = 7);
 
 // Energy between `low` and `high` Hz inside the regions, from Hann-windowed
-// frames of 1024 samples with half overlap (frames straddling a region's end
-// are left out).
+// frames of `frame` samples (a power of two) with half overlap (frames
+// straddling a region's end are left out).
 double BandEnergy(const std::vector<float>& x, double sampleRate, double low, double high,
-                  const std::vector<Region>& regions);
+                  const std::vector<Region>& regions, std::size_t frame = 1024);
 
 }  // namespace zentest

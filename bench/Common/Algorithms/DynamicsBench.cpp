@@ -4,8 +4,11 @@
 #include <vector>
 
 #include "Common/Algorithms/BiQuad.h"
+#include "Common/Algorithms/ButterworthHighPass.h"
+#include "Common/Algorithms/Exciter.h"
 #include "Common/Algorithms/Limiter.h"
 #include "Common/Algorithms/LinkwitzRileyCrossover.h"
+#include "Common/Algorithms/NoiseGate.h"
 #include "Common/Algorithms/RmsCompressor.h"
 #include "Support/NoiseSource.h"
 #include "Support/Realtime.h"
@@ -59,6 +62,52 @@ static void BM_LimiterAlgorithm_Stereo48k(benchmark::State& state) {
     zenbench::ReportRealtime(state, zenbench::kBlock);
 }
 BENCHMARK(BM_LimiterAlgorithm_Stereo48k);
+
+// Stereo, 24 dB per octave at 80 Hz.
+static void BM_ButterworthHighPass_Stereo48k(benchmark::State& state) {
+    ButterworthHighPass filter;
+    filter.SetChannelCount(2);
+    filter.Prepare(static_cast<float>(zenbench::kSampleRate), zenbench::kBlock);
+    NoiseSource input(2);
+    for (auto _ : state) {
+        filter.Process(input.Next(), zenbench::kBlock);
+        benchmark::ClobberMemory();
+    }
+    zenbench::ReportRealtime(state, zenbench::kBlock);
+}
+BENCHMARK(BM_ButterworthHighPass_Stereo48k);
+
+// Stereo noise hovering around the threshold: the gate opens and closes.
+static void BM_NoiseGate_Stereo48k(benchmark::State& state) {
+    NoiseGate gate;
+    gate.SetChannelCount(2);
+    gate.Prepare(static_cast<float>(zenbench::kSampleRate), zenbench::kBlock);
+    gate.SetParameter(NoiseGate::kThreshold, -1.0f);
+    gate.SetParameter(NoiseGate::kHold, 0.0f);
+    gate.SetParameter(NoiseGate::kRelease, 5.0f);
+    NoiseSource input(2);
+    for (auto _ : state) {
+        gate.Process(input.Next(), zenbench::kBlock);
+        benchmark::ClobberMemory();
+    }
+    zenbench::ReportRealtime(state, zenbench::kBlock);
+}
+BENCHMARK(BM_NoiseGate_Stereo48k);
+
+// Stereo full-scale noise driven hard into the curve.
+static void BM_Exciter_Stereo48k(benchmark::State& state) {
+    Exciter exciter;
+    exciter.SetChannelCount(2);
+    exciter.Prepare(static_cast<float>(zenbench::kSampleRate), zenbench::kBlock);
+    exciter.SetParameter(Exciter::kDrive, 24.0f);
+    NoiseSource input(2);
+    for (auto _ : state) {
+        exciter.Process(input.Next(), zenbench::kBlock);
+        benchmark::ClobberMemory();
+    }
+    zenbench::ReportRealtime(state, zenbench::kBlock);
+}
+BENCHMARK(BM_Exciter_Stereo48k);
 
 // A stereo five-band split and its sum, the crossover alone.
 static void BM_LinkwitzRileyCrossover_FiveBands_Stereo48k(benchmark::State& state) {

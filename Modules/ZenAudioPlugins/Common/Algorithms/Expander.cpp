@@ -73,6 +73,9 @@ bool Expander::Process(float* const* channels, std::uint64_t count) {
     const std::uint64_t channelCount = GetChannelCount();
     if (channelCount == 0) return true;
     float gain = m_lastGain.load(std::memory_order_relaxed);
+    // Open (or resting at the floor) the gain repeats: one power for the run.
+    float linearOf = gain;
+    float linear = zen::LogUnitsToGain(gain);
     for (std::uint64_t n = 0; n < count; ++n) {
         float peak = kSilence;
         for (std::uint64_t c = 0; c < channelCount; ++c) peak = std::max(peak, std::fabs(channels[c][n]));
@@ -90,7 +93,10 @@ bool Expander::Process(float* const* channels, std::uint64_t count) {
             m_envelope = m_release.Step(m_envelope, level);
         }
         gain = (m_envelope - m_threshold) * m_slope;
-        const float linear = zen::LogUnitsToGain(gain);
+        if (gain != linearOf) {
+            linear = zen::LogUnitsToGain(gain);
+            linearOf = gain;
+        }
         for (std::uint64_t c = 0; c < channelCount; ++c) channels[c][n] *= linear;
     }
     m_lastGain.store(gain, std::memory_order_relaxed);
