@@ -1,0 +1,147 @@
+#include "ZenChorus.h"
+
+#include <QCoreApplication>
+#include <algorithm>
+#include <cmath>
+
+#include "Common/Algorithms/NoteValue.h"
+#include "Common/ZenAudioPlugin.h"
+
+const zen::PluginDescriptor ZenChorus::kDescriptor = {
+    "Chorus", 1.0, zen::kPluginStateOffered, zen::MakePluginCode('Z', 'e', 'n', 'y'),
+    2, 2, "ZenChorus", 0, 0, -1, nullptr};
+
+namespace {
+
+float Percent(float value) { return value / 100.0f; }
+
+}  // namespace
+
+ZenChorus::ZenChorus() {
+    InitParameters(Definitions());
+    InitMeters(Meters());
+}
+
+const zen::ParameterTableDefinition& ZenChorus::Definitions() {
+    using namespace zen;
+#define ZC(text) QT_TRANSLATE_NOOP("ZenChorus", text)
+    static const ParameterTableDefinition table = MakeParameterTable(
+        "ZenChorus",
+        {
+            ListParameter("VOICES", ZC("Voices"), {"1", "2", "3", "4"}, 1.0f),
+            LogarithmicParameter("RATE", ZC("Rate"), 0.05f, 5.0f, 0.8f, 0.01f, "Hz"),
+            NoteValueParameter("SYNC", ZC("Sync"), 0.0f),
+            ContinuousParameter("TEMPO", ZC("Tempo"), 40.0f, 300.0f, 120.0f, 0.01f, "BPM"),
+            ContinuousParameter("DELAY", ZC("Delay"), 6.0f, static_cast<float>(kMaxDelayMs), 12.0f, 0.01f, "ms")
+                .Smoothed(working::Identity),
+            ContinuousParameter("DEPTH", ZC("Depth"), 0.0f, static_cast<float>(kMaxDepthMs), 2.0f, 0.01f, "ms")
+                .Smoothed(working::Identity),
+            ListParameter("SHAPE", ZC("Shape"), {ZC("Sine"), ZC("Triangle"), ZC("Random")}, 0.0f),
+            ContinuousParameter("SPREAD", ZC("Spread"), 0.0f, 100.0f, 70.0f, 0.1f, "%"),
+            ContinuousParameter("MIX", ZC("Mix"), 0.0f, 100.0f, 50.0f, 0.1f, "%").Smoothed(Percent),
+        });
+#undef ZC
+    return table;
+}
+
+const zen::MeterTableDefinition& ZenChorus::Meters() {
+    static const zen::MeterTableDefinition table = zen::MakeMeterTable(
+        "ZenChorus", {
+                         zen::LevelMeter("OUTPUT_PEAK", QT_TRANSLATE_NOOP("ZenChorus", "Output Peak"), "dBFS", -60.0f,
+                                         6.0f)
+                             .PerChannel(),
+                     });
+    return table;
+}
+
+double ZenChorus::VoicePhase(std::uint32_t channel, std::uint32_t voice, std::uint32_t voices, float spread) {
+    return static_cast<double>(voice) / voices + 0.5 * channel * spread / 100.0;
+}
+
+std::uint32_t ZenChorus::GetTailLength() const {
+    const zen::ParameterTable& p = Parameters();
+    const double ms = p[kDelay].GetValue() + p[kDepth].GetValue();
+    return static_cast<std::uint32_t>(std::ceil(ms * GetSampleRate() / 1000.0)) + 4;
+}
+
+bool ZenChorus::ApplyNeutralSetting() {
+    ZenAudioPluginImpl::ApplyNeutralSetting();
+    return SetParameter(kMix, 0.0f);
+}
+
+void ZenChorus::UpdateRate() noexcept {
+    const double rate = m_sync > 0 ? Lfo::SyncedRate(m_tempo, zen::NoteValueBeats(m_sync)) : m_rate;
+    for (auto& voices : m_lfos)
+        for (Lfo& lfo : voices) lfo.SetRate(rate);
+}
+
+void ZenChorus::UpdatePhases() noexcept {
+    for (std::uint32_t c = 0; c < kMaxChannels; ++c)
+        for (std::uint32_t v = 0; v < kMaxVoices; ++v) {
+            m_lfos[c][v].SetPhase(VoicePhase(c, v, m_voices, m_spread));
+            m_lfos[c][v].Reset();
+        }
+}
+
+void ZenChorus::UpdateProcessingParameter(std::uint32_t index, float value) {
+    switch (index) {
+        case kVoices:
+            m_voices = static_cast<std::uint32_t>(std::lround(value)) + 1;
+            UpdatePhases();
+            break;
+        case kSpread:
+            m_spread = value;
+            UpdatePhases();
+            break;
+        case kShape:
+            for (auto& voices : m_lfos)
+                for (Lfo& lfo : voices) lfo.SetShape(static_cast<Lfo::Shape>(std::lround(value)));
+            break;
+        case kRate: m_rate = value; UpdateRate(); break;
+        case kSync: m_sync = static_cast<int>(std::lround(value)); UpdateRate(); break;
+        case kTempo: m_tempo = value; UpdateRate(); break;
+        default: break;
+    }
+}
+
+void ZenChorus::PrepareProcessing(float sampleRate, std::uint32_t maxBlockSize) {
+    (void)maxBlockSize;
+    for (ModulatedDelayLine& line : m_lines) line.Resize((kMaxDelayMs + kMaxDepthMs) * sampleRate / 1000.0 + 1.0);
+    for (auto& voices : m_lfos)
+        for (Lfo& lfo : voices) lfo.SetSampleRate(sampleRate);
+    SetLatency(0);
+    ResetProcessing();
+}
+
+void ZenChorus::ResetProcessing() {
+    for (ModulatedDelayLine& line : m_lines) line.Clear();
+    UpdatePhases();
+}
+
+void ZenChorus::ProcessBlock(float* const* channels, std::uint32_t channelCount, std::uint32_t frames) noexcept {
+    const double samplesPerMs = GetSampleRate() / 1000.0;
+    const float voiceGain = 1.0f / static_cast<float>(m_voices);
+    for (std::uint32_t c = 0; c < channelCount && c < kMaxChannels; ++c) {
+        auto delay = Smoothed(kDelay).Track(c);
+        auto depth = Smoothed(kDepth).Track(c);
+        auto mix = Smoothed(kMix).Track(c);
+        ModulatedDelayLine& line = m_lines[c];
+        std::array<Lfo, kMaxVoices>& lfos = m_lfos[c];
+        float* samples = channels[c];
+        float peak = 0.0f;
+        for (std::uint32_t i = 0; i < frames; ++i) {
+            const double centre = delay.Next() * samplesPerMs;
+            const double swing = depth.Next() * samplesPerMs;
+            const auto m = static_cast<float>(mix.Next());
+            float wet = 0.0f;
+            for (std::uint32_t v = 0; v < m_voices; ++v) wet += line.Read(centre + swing * lfos[v].Next());
+            const float x = samples[i];
+            line.Push(x);
+            samples[i] = (1.0f - m) * x + m * voiceGain * wet;
+            peak = std::max(peak, std::fabs(samples[i]));
+        }
+        PublishMeter(kOutputPeak, c, peak);
+    }
+}
+
+template class ZenAudioPlugin<ZenChorus>;
