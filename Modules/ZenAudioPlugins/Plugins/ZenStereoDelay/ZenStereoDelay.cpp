@@ -4,6 +4,7 @@
 #include <algorithm>
 #include <cmath>
 
+#include "Common/Algorithms/EchoMix.h"
 #include "Common/Algorithms/NoteValue.h"
 #include "Common/ZenAudioPlugin.h"
 
@@ -136,7 +137,7 @@ void ZenStereoDelay::ProcessBlock(float* const* channels, std::uint32_t channelC
     for (std::uint32_t i = 0; i < frames; ++i) {
         const auto g = static_cast<float>(feedback.Next());
         const auto m = static_cast<float>(mix.Next());
-        const float dry = DryGain(m), wet = WetGain(m);
+        const float dry = zen::EchoDryGain(m), wet = zen::EchoWetGain(m);
         const float xl = left[i];
         const float yl = m_lines[0].Read(m_glides[0].Next());
         const float fl = g * m_feedbackPath.Process(0, yl);

@@ -48,9 +48,6 @@ public:
     // A side's time in ms: the note value at the tempo when synced, else the
     // time, at most kMaxTimeMs.
     static double SideTimeMs(float time, float sync, float tempo);
-    // Dry and wet gains of a mix in 0..1: the dry signal stays whole up to half.
-    static float DryGain(float mix) { return std::min(1.0f, 2.0f * (1.0f - mix)); }
-    static float WetGain(float mix) { return std::min(1.0f, 2.0f * mix); }
 
     std::uint32_t GetTailLength() const override;
     bool ApplyNeutralSetting() override;
