@@ -4,6 +4,7 @@
 // type: one per channel or voice, real-time safe throughout.
 #pragma once
 
+#include <cmath>
 #include <cstdint>
 
 class Lfo {
@@ -49,3 +50,34 @@ private:
     float m_from = 0.0f;  // the random walk runs from here to m_to over a cycle
     float m_to = 0.0f;
 };
+
+inline float Lfo::Sine(double phase) noexcept {
+    // Fold to a quarter cycle around zero, then an odd Taylor polynomial.
+    // Nearest whole cycle by truncation (no library call), corrected below zero.
+    auto nearest = static_cast<double>(static_cast<long long>(phase + 0.5));
+    if (nearest > phase + 0.5) nearest -= 1.0;
+    double q = phase - nearest;
+    if (q > 0.25) q = 0.5 - q;
+    if (q < -0.25) q = -0.5 - q;
+    const double x = 6.283185307179586 * q;
+    const double x2 = x * x;
+    const double p = 1.0 + x2 * (-1.0 / 6.0 + x2 * (1.0 / 120.0 + x2 * (-1.0 / 5040.0 + x2 * (1.0 / 362880.0 - x2 / 39916800.0))));
+    return static_cast<float>(x * p);
+}
+
+inline float Lfo::Value() const noexcept {
+    switch (m_shape) {
+        case kTriangle: {
+            double p = m_phase + 0.25;
+            if (p >= 1.0) p -= 1.0;
+            return static_cast<float>(1.0 - 4.0 * std::fabs(p - 0.5));
+        }
+        case kRandom: {
+            // A raised-cosine step from one random value to the next: smooth, no corners.
+            const float s = Sine(0.25 * m_phase);
+            return m_from + (m_to - m_from) * s * s;
+        }
+        case kSine:
+        default: return Sine(m_phase);
+    }
+}

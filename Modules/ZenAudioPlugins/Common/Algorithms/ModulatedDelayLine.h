@@ -29,10 +29,11 @@ public:
     float Read(double delay) const noexcept {
         delay = delay > kMinDelay ? delay : kMinDelay;
         delay = delay < m_maxDelay ? delay : m_maxDelay;
-        const double whole = std::floor(delay);
+        // Positive, so truncation is the floor (and no library call).
+        const auto whole = static_cast<std::uint32_t>(delay);
         const auto f = static_cast<float>(delay - whole);
         // Newest of the four taps, one sample nearer than `whole`.
-        const std::uint32_t i = (m_write - static_cast<std::uint32_t>(whole) + 1u) & m_mask;
+        const std::uint32_t i = (m_write - whole + 1u) & m_mask;
         const float x0 = m_line[i];
         const float x1 = m_line[(i - 1u) & m_mask];
         const float x2 = m_line[(i - 2u) & m_mask];

@@ -105,8 +105,13 @@ void ZenChorus::UpdateProcessingParameter(std::uint32_t index, float value) {
 }
 
 void ZenChorus::PrepareProcessing(float sampleRate, std::uint32_t maxBlockSize) {
-    (void)maxBlockSize;
-    for (ModulatedDelayLine& line : m_lines) line.Resize((kMaxDelayMs + kMaxDepthMs) * sampleRate / 1000.0 + 1.0);
+    // Reads reach back over the block already written, too.
+    for (ModulatedDelayLine& line : m_lines)
+        line.Resize((kMaxDelayMs + kMaxDepthMs) * sampleRate / 1000.0 + 1.0 + maxBlockSize);
+    m_centre.assign(maxBlockSize, 0.0);
+    m_swing.assign(maxBlockSize, 0.0);
+    m_mix.assign(maxBlockSize, 0.0f);
+    m_wet.assign(maxBlockSize, 0.0f);
     for (auto& voices : m_lfos)
         for (Lfo& lfo : voices) lfo.SetSampleRate(sampleRate);
     SetLatency(0);
@@ -125,19 +130,26 @@ void ZenChorus::ProcessBlock(float* const* channels, std::uint32_t channelCount,
         auto delay = Smoothed(kDelay).Track(c);
         auto depth = Smoothed(kDepth).Track(c);
         auto mix = Smoothed(kMix).Track(c);
+        for (std::uint32_t i = 0; i < frames; ++i) {
+            m_centre[i] = delay.Next() * samplesPerMs;
+            m_swing[i] = depth.Next() * samplesPerMs;
+            m_mix[i] = static_cast<float>(mix.Next());
+            m_wet[i] = 0.0f;
+        }
+        // The shortest delay (6 - 5 ms) is longer than two samples, so every
+        // read of frame i, frames - i samples behind the head, is of input
+        // that arrived by then.
         ModulatedDelayLine& line = m_lines[c];
-        std::array<Lfo, kMaxVoices>& lfos = m_lfos[c];
         float* samples = channels[c];
+        for (std::uint32_t i = 0; i < frames; ++i) line.Push(samples[i]);
+        for (std::uint32_t v = 0; v < m_voices; ++v) {
+            Lfo& lfo = m_lfos[c][v];
+            for (std::uint32_t i = 0; i < frames; ++i)
+                m_wet[i] += line.Read(m_centre[i] + m_swing[i] * lfo.Next() + static_cast<double>(frames - i));
+        }
         float peak = 0.0f;
         for (std::uint32_t i = 0; i < frames; ++i) {
-            const double centre = delay.Next() * samplesPerMs;
-            const double swing = depth.Next() * samplesPerMs;
-            const auto m = static_cast<float>(mix.Next());
-            float wet = 0.0f;
-            for (std::uint32_t v = 0; v < m_voices; ++v) wet += line.Read(centre + swing * lfos[v].Next());
-            const float x = samples[i];
-            line.Push(x);
-            samples[i] = (1.0f - m) * x + m * voiceGain * wet;
+            samples[i] = (1.0f - m_mix[i]) * samples[i] + m_mix[i] * voiceGain * m_wet[i];
             peak = std::max(peak, std::fabs(samples[i]));
         }
         PublishMeter(kOutputPeak, c, peak);

@@ -6,6 +6,7 @@
 #pragma once
 
 #include <array>
+#include <vector>
 
 #include "Common/Algorithms/Lfo.h"
 #include "Common/Algorithms/ModulatedDelayLine.h"
@@ -48,6 +49,12 @@ private:
 
     std::array<ModulatedDelayLine, kMaxChannels> m_lines;
     std::array<std::array<Lfo, kMaxVoices>, kMaxChannels> m_lfos;
+    // Per-frame scratch of one block (the prepared size): the voices are
+    // read one at a time over the whole block, once the block is in the line.
+    std::vector<double> m_centre;
+    std::vector<double> m_swing;
+    std::vector<float> m_mix;
+    std::vector<float> m_wet;
 
     // Audio thread.
     std::uint32_t m_voices = 2;

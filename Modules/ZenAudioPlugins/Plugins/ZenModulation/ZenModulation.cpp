@@ -134,6 +134,7 @@ void ZenModulation::PrepareProcessing(float sampleRate, std::uint32_t maxBlockSi
 void ZenModulation::ResetProcessing() {
     for (ModulatedDelayLine& line : m_lines) line.Clear();
     std::fill(m_phasers.begin(), m_phasers.end(), Phaser{});
+    m_position = 0;
     UpdatePhases();
 }
 
@@ -146,8 +147,11 @@ void ZenModulation::RunPhaser(std::uint32_t c, float* samples, std::uint32_t fra
     Lfo& lfo = m_lfos[c];
     const double nyquistGuard = 0.45 * GetSampleRate();
     for (std::uint32_t i = 0; i < frames; ++i) {
-        const double f = std::min(frequency.Next() * std::exp2(kPhaserOctaves * depth.Next() * lfo.Next()), nyquistGuard);
-        const double a = AllpassCoefficient(f, GetSampleRate());
+        const double centre = frequency.Next();
+        const double swing = kPhaserOctaves * depth.Next() * lfo.Next();
+        if ((m_position + i) % kRetuneStep == 0)
+            p.a = AllpassCoefficient(std::min(centre * std::exp2(swing), nyquistGuard), GetSampleRate());
+        const double a = p.a;
         const float x = samples[i];
         // Bad samples enter the chain as silence, huge ones clamped, so its state stays finite.
         const float clean = std::isfinite(x) ? std::clamp(x, -ModulatedDelayLine::kCeiling, ModulatedDelayLine::kCeiling) : 0.0f;
@@ -217,6 +221,7 @@ void ZenModulation::ProcessBlock(float* const* channels, std::uint32_t channelCo
                 break;
         }
     }
+    m_position += frames;
     for (std::uint32_t c = 0; c < count; ++c) {
         float peak = 0.0f;
         for (std::uint32_t i = 0; i < frames; ++i) peak = std::max(peak, std::fabs(channels[c][i]));

@@ -47,6 +47,9 @@ public:
     static constexpr double kVibratoMs = 2.0;      // swing at full depth, either way
     static constexpr double kVibratoCentreMs = 3.0;
     static constexpr double kTailDb = 110.0;
+    // The phaser's sections are retuned on this grid of samples (counted
+    // from Prepare, so the host's block size does not matter).
+    static constexpr std::uint32_t kRetuneStep = 16;
 
     ZenModulation();
 
@@ -70,6 +73,7 @@ private:
     struct Phaser {
         std::array<double, kMaxStages> state{};
         double last = 0.0;  // the chain's previous output, fed back
+        double a = 0.0;     // the sections' coefficient since the last grid point
     };
 
     void UpdateRate() noexcept;
@@ -91,4 +95,5 @@ private:
     float m_tempo = 120.0f;
     float m_spread = 0.0f;
     std::uint32_t m_channelCount = 2;
+    std::uint64_t m_position = 0;  // samples since Prepare
 };
