@@ -22,5 +22,8 @@ inline float DbToGain(float db) { return zen::DbToGain(db); }
 // 10^(dB/20), never below the smallest normal float.
 inline float DbToGainFloored(float db) { return zen::DbToGainFloored(db); }
 
+// A percentage as a fraction: 50 % is 0.5.
+inline float Percent(float percent) { return percent / 100.0f; }
+
 }  // namespace working
 }  // namespace zen

@@ -58,7 +58,8 @@ TEST(ZenModulation, TremoloAndAutoPanFollowTheirGainLaws) {
     // 5 Hz: a sine of 0.5 * 0.8 / 2 around its mean.
     EXPECT_NEAR(std::abs(zentest::Tone(t, 5.0, kRate, 0, 19200)), 0.2, 1e-3);
 
-    PluginHarness pan = zentest::Prepared(kName, {{"Mode", 3.0f}, {"Depth", 100.0f}, {"Rate", 5.0f}, {"Mix", 100.0f}}, 3);
+    PluginHarness pan =
+        zentest::Prepared(kName, {{"Mode", 3.0f}, {"Depth", 100.0f}, {"Rate", 5.0f}, {"Mix", 100.0f}}, 3);
     zentest::Channels io = {dc, dc, dc};
     pan.Process(io, 512);
     for (std::size_t n = 0; n < dc.size(); ++n) {
@@ -84,7 +85,8 @@ TEST(ZenModulation, VibratoMakesTheSidebandsOfItsDepthAndSpreadSpacesTheChannels
     const zentest::Channels t = spread.Run(std::vector<float>(9600, 1.0f), 4, 512);
     const double first = std::arg(zentest::Tone(t[0], 5.0, kRate, 0, 9600));
     for (std::size_t c = 1; c < 4; ++c) {
-        const double lag = std::remainder(first - std::arg(zentest::Tone(t[c], 5.0, kRate, 0, 9600)), 2.0 * zentest::kPi);
+        const double lag =
+            std::remainder(first - std::arg(zentest::Tone(t[c], 5.0, kRate, 0, 9600)), 2.0 * zentest::kPi);
         EXPECT_NEAR(std::fabs(lag), c == 2 ? zentest::kPi : zentest::kPi / 2.0, 1e-3) << c;
     }
 }

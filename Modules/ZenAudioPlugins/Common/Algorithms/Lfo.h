@@ -22,7 +22,9 @@ public:
     // Where the cycle starts after Reset, in cycles (0.25 is a quarter ahead).
     // The random walk's seed follows it, so voices with different phases
     // wander differently.
-    void SetPhase(double cycles) noexcept { m_startPhase = cycles - static_cast<double>(static_cast<long long>(cycles)); }
+    void SetPhase(double cycles) noexcept {
+        m_startPhase = cycles - static_cast<double>(static_cast<long long>(cycles));
+    }
     void Reset() noexcept;
 
     float Next() noexcept {
@@ -61,7 +63,8 @@ inline float Lfo::Sine(double phase) noexcept {
     if (q < -0.25) q = -0.5 - q;
     const double x = 6.283185307179586 * q;
     const double x2 = x * x;
-    const double p = 1.0 + x2 * (-1.0 / 6.0 + x2 * (1.0 / 120.0 + x2 * (-1.0 / 5040.0 + x2 * (1.0 / 362880.0 - x2 / 39916800.0))));
+    const double p =
+        1.0 + x2 * (-1.0 / 6.0 + x2 * (1.0 / 120.0 + x2 * (-1.0 / 5040.0 + x2 * (1.0 / 362880.0 - x2 / 39916800.0))));
     return static_cast<float>(x * p);
 }
 

@@ -11,12 +11,6 @@ const zen::PluginDescriptor ZenChorus::kDescriptor = {
     "Chorus", 1.0, zen::kPluginStateOffered, zen::MakePluginCode('Z', 'e', 'n', 'y'),
     2, 2, "ZenChorus", 0, 0, -1, nullptr};
 
-namespace {
-
-float Percent(float value) { return value / 100.0f; }
-
-}  // namespace
-
 ZenChorus::ZenChorus() {
     InitParameters(Definitions());
     InitMeters(Meters());
@@ -38,7 +32,7 @@ const zen::ParameterTableDefinition& ZenChorus::Definitions() {
                 .Smoothed(working::Identity),
             ListParameter("SHAPE", ZC("Shape"), {ZC("Sine"), ZC("Triangle"), ZC("Random")}, 0.0f),
             ContinuousParameter("SPREAD", ZC("Spread"), 0.0f, 100.0f, 70.0f, 0.1f, "%"),
-            ContinuousParameter("MIX", ZC("Mix"), 0.0f, 100.0f, 50.0f, 0.1f, "%").Smoothed(Percent),
+            ContinuousParameter("MIX", ZC("Mix"), 0.0f, 100.0f, 50.0f, 0.1f, "%").Smoothed(working::Percent),
         });
 #undef ZC
     return table;
@@ -70,7 +64,7 @@ bool ZenChorus::ApplyNeutralSetting() {
 }
 
 void ZenChorus::UpdateRate() noexcept {
-    const double rate = m_sync > 0 ? Lfo::SyncedRate(m_tempo, zen::NoteValueBeats(m_sync)) : m_rate;
+    const double rate = m_rate.Hertz();
     for (auto& voices : m_lfos)
         for (Lfo& lfo : voices) lfo.SetRate(rate);
 }
@@ -85,21 +79,28 @@ void ZenChorus::UpdatePhases() noexcept {
 
 void ZenChorus::UpdateProcessingParameter(std::uint32_t index, float value) {
     switch (index) {
-        case kVoices:
-            m_voices = static_cast<std::uint32_t>(std::lround(value)) + 1;
-            UpdatePhases();
+        // The voices restart their cycles only when their spacing really changes.
+        case kVoices: {
+            const auto voices = static_cast<std::uint32_t>(std::lround(value)) + 1;
+            if (voices != m_voices) {
+                m_voices = voices;
+                UpdatePhases();
+            }
             break;
+        }
         case kSpread:
-            m_spread = value;
-            UpdatePhases();
+            if (value != m_spread) {
+                m_spread = value;
+                UpdatePhases();
+            }
             break;
         case kShape:
             for (auto& voices : m_lfos)
                 for (Lfo& lfo : voices) lfo.SetShape(static_cast<Lfo::Shape>(std::lround(value)));
             break;
-        case kRate: m_rate = value; UpdateRate(); break;
-        case kSync: m_sync = static_cast<int>(std::lround(value)); UpdateRate(); break;
-        case kTempo: m_tempo = value; UpdateRate(); break;
+        case kRate: m_rate.SetHertz(value); UpdateRate(); break;
+        case kSync: m_rate.SetSync(value); UpdateRate(); break;
+        case kTempo: m_rate.SetTempo(value); UpdateRate(); break;
         default: break;
     }
 }

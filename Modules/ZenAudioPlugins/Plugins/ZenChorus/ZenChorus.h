@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "Common/Algorithms/Lfo.h"
+#include "Common/Algorithms/LfoRate.h"
 #include "Common/Algorithms/ModulatedDelayLine.h"
 #include "Common/ZenAudioPluginImpl.h"
 
@@ -58,8 +59,6 @@ private:
 
     // Audio thread.
     std::uint32_t m_voices = 2;
-    float m_rate = 1.0f;
-    int m_sync = 0;
-    float m_tempo = 120.0f;
+    LfoRate m_rate;
     float m_spread = 0.0f;
 };

@@ -11,12 +11,6 @@ const zen::PluginDescriptor ZenFlanger::kDescriptor = {
     "Flanger", 1.0, zen::kPluginStateOffered, zen::MakePluginCode('Z', 'e', 'n', 'y'),
     2, 2, "ZenFlanger", 0x80, 0, -1, nullptr};
 
-namespace {
-
-float Percent(float value) { return value / 100.0f; }
-
-}  // namespace
-
 ZenFlanger::ZenFlanger() {
     InitParameters(Definitions());
     InitMeters(Meters());
@@ -37,10 +31,10 @@ const zen::ParameterTableDefinition& ZenFlanger::Definitions() {
             ContinuousParameter("TEMPO", ZF("Tempo"), 40.0f, 300.0f, 120.0f, 0.01f, "BPM"),
             ContinuousParameter("FEEDBACK", ZF("Feedback"), static_cast<float>(-kMaxFeedback),
                                 static_cast<float>(kMaxFeedback), 50.0f, 0.1f, "%")
-                .Smoothed(Percent),
+                .Smoothed(working::Percent),
             ListParameter("SHAPE", ZF("Shape"), {ZF("Sine"), ZF("Triangle"), ZF("Random")}, 1.0f),
             ContinuousParameter("SPREAD", ZF("Spread"), 0.0f, 100.0f, 25.0f, 0.1f, "%"),
-            ContinuousParameter("MIX", ZF("Mix"), 0.0f, 100.0f, 50.0f, 0.1f, "%").Smoothed(Percent),
+            ContinuousParameter("MIX", ZF("Mix"), 0.0f, 100.0f, 50.0f, 0.1f, "%").Smoothed(working::Percent),
         });
 #undef ZF
     return table;
@@ -74,7 +68,7 @@ bool ZenFlanger::ApplyNeutralSetting() {
 }
 
 void ZenFlanger::UpdateRate() noexcept {
-    const double rate = m_sync > 0 ? Lfo::SyncedRate(m_tempo, zen::NoteValueBeats(m_sync)) : m_rate;
+    const double rate = m_rate.Hertz();
     for (Lfo& lfo : m_lfos) lfo.SetRate(rate);
 }
 
@@ -88,15 +82,17 @@ void ZenFlanger::UpdatePhases() noexcept {
 void ZenFlanger::UpdateProcessingParameter(std::uint32_t index, float value) {
     switch (index) {
         case kSpread:
-            m_spread = value;
-            UpdatePhases();
+            if (value != m_spread) {  // the sweeps restart only on a real change
+                m_spread = value;
+                UpdatePhases();
+            }
             break;
         case kShape:
             for (Lfo& lfo : m_lfos) lfo.SetShape(static_cast<Lfo::Shape>(std::lround(value)));
             break;
-        case kRate: m_rate = value; UpdateRate(); break;
-        case kSync: m_sync = static_cast<int>(std::lround(value)); UpdateRate(); break;
-        case kTempo: m_tempo = value; UpdateRate(); break;
+        case kRate: m_rate.SetHertz(value); UpdateRate(); break;
+        case kSync: m_rate.SetSync(value); UpdateRate(); break;
+        case kTempo: m_rate.SetTempo(value); UpdateRate(); break;
         default: break;
     }
 }

@@ -10,6 +10,7 @@
 
 #include "Common/Algorithms/FeedbackPath.h"
 #include "Common/Algorithms/Lfo.h"
+#include "Common/Algorithms/LfoRate.h"
 #include "Common/Algorithms/ModulatedDelayLine.h"
 #include "Common/ZenAudioPluginImpl.h"
 
@@ -53,8 +54,6 @@ private:
     FeedbackPath m_feedbackPath;
 
     // Audio thread.
-    float m_rate = 0.25f;
-    int m_sync = 0;
-    float m_tempo = 120.0f;
+    LfoRate m_rate;
     float m_spread = 0.0f;
 };

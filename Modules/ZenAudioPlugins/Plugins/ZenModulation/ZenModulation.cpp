@@ -15,8 +15,6 @@ namespace {
 
 constexpr double kPi = 3.141592653589793;
 
-float Percent(float value) { return value / 100.0f; }
-
 }  // namespace
 
 ZenModulation::ZenModulation() {
@@ -34,14 +32,14 @@ const zen::ParameterTableDefinition& ZenModulation::Definitions() {
             LogarithmicParameter("RATE", ZM("Rate"), 0.02f, 20.0f, 0.5f, 0.01f, "Hz"),
             NoteValueParameter("SYNC", ZM("Sync"), 0.0f),
             ContinuousParameter("TEMPO", ZM("Tempo"), 40.0f, 300.0f, 120.0f, 0.01f, "BPM"),
-            ContinuousParameter("DEPTH", ZM("Depth"), 0.0f, 100.0f, 50.0f, 0.1f, "%").Smoothed(Percent),
+            ContinuousParameter("DEPTH", ZM("Depth"), 0.0f, 100.0f, 50.0f, 0.1f, "%").Smoothed(working::Percent),
             ListParameter("SHAPE", ZM("Shape"), {ZM("Sine"), ZM("Triangle"), ZM("Random")}, 0.0f),
             ContinuousParameter("SPREAD", ZM("Spread"), 0.0f, 100.0f, 50.0f, 0.1f, "%"),
             LogarithmicParameter("FREQUENCY", ZM("Frequency"), 100.0f, 4000.0f, 800.0f, 1.0f, "Hz")
                 .Smoothed(working::Identity),
             ListParameter("STAGES", ZM("Stages"), {"2", "4", "6", "8", "12"}, 1.0f),
-            ContinuousParameter("FEEDBACK", ZM("Feedback"), -90.0f, 90.0f, 40.0f, 0.1f, "%").Smoothed(Percent),
-            ContinuousParameter("MIX", ZM("Mix"), 0.0f, 100.0f, 50.0f, 0.1f, "%").Smoothed(Percent),
+            ContinuousParameter("FEEDBACK", ZM("Feedback"), -90.0f, 90.0f, 40.0f, 0.1f, "%").Smoothed(working::Percent),
+            ContinuousParameter("MIX", ZM("Mix"), 0.0f, 100.0f, 50.0f, 0.1f, "%").Smoothed(working::Percent),
         });
 #undef ZM
     return table;
@@ -49,11 +47,11 @@ const zen::ParameterTableDefinition& ZenModulation::Definitions() {
 
 const zen::MeterTableDefinition& ZenModulation::Meters() {
     static const zen::MeterTableDefinition table = zen::MakeMeterTable(
-        "ZenModulation", {
-                             zen::LevelMeter("OUTPUT_PEAK", QT_TRANSLATE_NOOP("ZenModulation", "Output Peak"), "dBFS",
-                                             -60.0f, 6.0f)
-                                 .PerChannel(),
-                         });
+        "ZenModulation",
+        {
+            zen::LevelMeter("OUTPUT_PEAK", QT_TRANSLATE_NOOP("ZenModulation", "Output Peak"), "dBFS", -60.0f, 6.0f)
+                .PerChannel(),
+        });
     return table;
 }
 
@@ -77,7 +75,8 @@ std::uint32_t ZenModulation::GetTailLength() const {
             const double seconds = (nepers + 2.0 * loops) * stages / (2.0 * kPi * lowest);
             return static_cast<std::uint32_t>(std::ceil(seconds * rate));
         }
-        case kVibrato: return static_cast<std::uint32_t>(std::ceil((kVibratoCentreMs + kVibratoMs) * rate / 1000.0)) + 4;
+        case kVibrato:
+            return static_cast<std::uint32_t>(std::ceil((kVibratoCentreMs + kVibratoMs) * rate / 1000.0)) + 4;
         default: return 0;
     }
 }
@@ -88,7 +87,7 @@ bool ZenModulation::ApplyNeutralSetting() {
 }
 
 void ZenModulation::UpdateRate() noexcept {
-    const double rate = m_sync > 0 ? Lfo::SyncedRate(m_tempo, zen::NoteValueBeats(m_sync)) : m_rate;
+    const double rate = m_rate.Hertz();
     for (Lfo& lfo : m_lfos) lfo.SetRate(rate);
 }
 
@@ -103,21 +102,37 @@ void ZenModulation::UpdatePhases() noexcept {
 
 void ZenModulation::UpdateProcessingParameter(std::uint32_t index, float value) {
     switch (index) {
-        case kMode:
-            m_mode = static_cast<Mode>(std::lround(value));
-            UpdatePhases();
+        // The LFOs restart their cycles only when their spacing really changes.
+        case kMode: {
+            const auto mode = static_cast<Mode>(std::lround(value));
+            if (mode != m_mode) {
+                m_mode = mode;
+                UpdatePhases();
+            }
             break;
+        }
         case kStages: m_stages = kStageCounts[std::min<long>(std::lround(value), 4)]; break;
         case kSpread:
-            m_spread = value;
-            UpdatePhases();
+            if (value != m_spread) {
+                m_spread = value;
+                UpdatePhases();
+            }
             break;
         case kShape:
             for (Lfo& lfo : m_lfos) lfo.SetShape(static_cast<Lfo::Shape>(std::lround(value)));
             break;
-        case kRate: m_rate = value; UpdateRate(); break;
-        case kSync: m_sync = static_cast<int>(std::lround(value)); UpdateRate(); break;
-        case kTempo: m_tempo = value; UpdateRate(); break;
+        case kRate:
+            m_rate.SetHertz(value);
+            UpdateRate();
+            break;
+        case kSync:
+            m_rate.SetSync(value);
+            UpdateRate();
+            break;
+        case kTempo:
+            m_rate.SetTempo(value);
+            UpdateRate();
+            break;
         default: break;
     }
 }
@@ -154,7 +169,8 @@ void ZenModulation::RunPhaser(std::uint32_t c, float* samples, std::uint32_t fra
         const double a = p.a;
         const float x = samples[i];
         // Bad samples enter the chain as silence, huge ones clamped, so its state stays finite.
-        const float clean = std::isfinite(x) ? std::clamp(x, -ModulatedDelayLine::kCeiling, ModulatedDelayLine::kCeiling) : 0.0f;
+        const float clean =
+            std::isfinite(x) ? std::clamp(x, -ModulatedDelayLine::kCeiling, ModulatedDelayLine::kCeiling) : 0.0f;
         double u = clean + feedback.Next() * p.last;
         for (std::uint32_t s = 0; s < m_stages; ++s) {
             const double y = a * u + p.state[s];

@@ -15,6 +15,7 @@
 #include <array>
 
 #include "Common/Algorithms/Lfo.h"
+#include "Common/Algorithms/LfoRate.h"
 #include "Common/Algorithms/ModulatedDelayLine.h"
 #include "Common/ZenAudioPluginImpl.h"
 
@@ -90,9 +91,7 @@ private:
     // Audio thread.
     Mode m_mode = kPhaser;
     std::uint32_t m_stages = 4;
-    float m_rate = 0.5f;
-    int m_sync = 0;
-    float m_tempo = 120.0f;
+    LfoRate m_rate;
     float m_spread = 0.0f;
     std::uint32_t m_channelCount = 2;
     std::uint64_t m_position = 0;  // samples since Prepare

@@ -12,12 +12,6 @@ const zen::PluginDescriptor ZenStereoDelay::kDescriptor = {
     "Delay", 1.0, zen::kPluginStateOffered, zen::MakePluginCode('Z', 'e', 'n', 'y'),
     2, 2, "ZenStereoDelay", 0, 0, -1, nullptr};
 
-namespace {
-
-float Percent(float value) { return value / 100.0f; }
-
-}  // namespace
-
 ZenStereoDelay::ZenStereoDelay() {
     InitParameters(Definitions());
     InitMeters(Meters());
@@ -35,11 +29,12 @@ const zen::ParameterTableDefinition& ZenStereoDelay::Definitions() {
             NoteValueParameter("SYNC_L", ZD("Sync L"), 0.0f),
             NoteValueParameter("SYNC_R", ZD("Sync R"), 0.0f),
             ContinuousParameter("TEMPO", ZD("Tempo"), 40.0f, 300.0f, 120.0f, 0.01f, "BPM"),
-            ContinuousParameter("FEEDBACK", ZD("Feedback"), 0.0f, 100.0f, 35.0f, 0.1f, "%").SmoothedSingle(Percent),
+            ContinuousParameter("FEEDBACK", ZD("Feedback"), 0.0f, 100.0f, 35.0f, 0.1f, "%")
+                .SmoothedSingle(working::Percent),
             SwitchParameter("PING_PONG", ZD("Ping-Pong"), 0.0f),
             LogarithmicParameter("LOW_CUT", ZD("Low Cut"), 20.0f, 2000.0f, 80.0f, 1.0f, "Hz"),
             LogarithmicParameter("HIGH_CUT", ZD("High Cut"), 1000.0f, 20000.0f, 12000.0f, 1.0f, "Hz"),
-            ContinuousParameter("MIX", ZD("Mix"), 0.0f, 100.0f, 30.0f, 0.1f, "%").SmoothedSingle(Percent),
+            ContinuousParameter("MIX", ZD("Mix"), 0.0f, 100.0f, 30.0f, 0.1f, "%").SmoothedSingle(working::Percent),
         });
 #undef ZD
     return table;

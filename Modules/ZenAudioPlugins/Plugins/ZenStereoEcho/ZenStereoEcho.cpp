@@ -15,8 +15,6 @@ const zen::PluginDescriptor ZenStereoEcho::kDescriptor = {
 
 namespace {
 
-float Percent(float value) { return value / 100.0f; }
-
 double TimeMs(float time, int sync, float tempo) {
     const double ms = sync > 0 ? zen::NoteValueMs(sync, tempo) : time;
     return std::min(std::max(ms, ZenStereoEcho::kMinTimeMs), ZenStereoEcho::kMaxTimeMs);
@@ -39,12 +37,14 @@ const zen::ParameterTableDefinition& ZenStereoEcho::Definitions() {
                                  350.0f, 0.01f, "ms"),
             NoteValueParameter("SYNC", ZE("Sync"), 0.0f),
             ContinuousParameter("TEMPO", ZE("Tempo"), 40.0f, 300.0f, 120.0f, 0.01f, "BPM"),
-            ContinuousParameter("FEEDBACK", ZE("Feedback"), 0.0f, 110.0f, 45.0f, 0.1f, "%").SmoothedSingle(Percent),
+            ContinuousParameter("FEEDBACK", ZE("Feedback"), 0.0f, 110.0f, 45.0f, 0.1f, "%")
+                .SmoothedSingle(working::Percent),
             ContinuousParameter("DRIVE", ZE("Drive"), 0.0f, 24.0f, 3.0f, 0.1f, "dB").SmoothedSingle(working::DbToGain),
             LogarithmicParameter("TONE", ZE("Tone"), 1000.0f, 12000.0f, 3500.0f, 1.0f, "Hz"),
-            ContinuousParameter("WOW", ZE("Wow"), 0.0f, 100.0f, 25.0f, 0.1f, "%").SmoothedSingle(Percent),
-            ContinuousParameter("FLUTTER", ZE("Flutter"), 0.0f, 100.0f, 15.0f, 0.1f, "%").SmoothedSingle(Percent),
-            ContinuousParameter("MIX", ZE("Mix"), 0.0f, 100.0f, 30.0f, 0.1f, "%").SmoothedSingle(Percent),
+            ContinuousParameter("WOW", ZE("Wow"), 0.0f, 100.0f, 25.0f, 0.1f, "%").SmoothedSingle(working::Percent),
+            ContinuousParameter("FLUTTER", ZE("Flutter"), 0.0f, 100.0f, 15.0f, 0.1f, "%")
+                .SmoothedSingle(working::Percent),
+            ContinuousParameter("MIX", ZE("Mix"), 0.0f, 100.0f, 30.0f, 0.1f, "%").SmoothedSingle(working::Percent),
         });
 #undef ZE
     return table;
@@ -52,26 +52,26 @@ const zen::ParameterTableDefinition& ZenStereoEcho::Definitions() {
 
 const zen::MeterTableDefinition& ZenStereoEcho::Meters() {
     static const zen::MeterTableDefinition table = zen::MakeMeterTable(
-        "ZenStereoEcho", {
-                             zen::LevelMeter("OUTPUT_PEAK", QT_TRANSLATE_NOOP("ZenStereoEcho", "Output Peak"), "dBFS",
-                                             -60.0f, 6.0f)
-                                 .PerChannel(),
-                         });
+        "ZenStereoEcho",
+        {
+            zen::LevelMeter("OUTPUT_PEAK", QT_TRANSLATE_NOOP("ZenStereoEcho", "Output Peak"), "dBFS", -60.0f, 6.0f)
+                .PerChannel(),
+        });
     return table;
 }
 
 std::uint32_t ZenStereoEcho::GetTailLength() const {
     const zen::ParameterTable& p = Parameters();
-    const double ms = TimeMs(p[kTime].GetValue(), static_cast<int>(std::lround(p[kSync].GetValue())),
-                             p[kTempo].GetValue()) +
-                      kWowMs + kFlutterMs;
+    const double ms =
+        TimeMs(p[kTime].GetValue(), static_cast<int>(std::lround(p[kSync].GetValue())), p[kTempo].GetValue()) + kWowMs +
+        kFlutterMs;
     const double feedback = p[kFeedback].GetValue() / 100.0;
     double seconds = kLongestTailSeconds;
     if (feedback < 1.0) {
         // Saturation and the cuts only take away from the feedback's own decay.
         const double repeats = feedback > 0.0 ? std::ceil(kTailDb / (-20.0 * std::log10(feedback))) : 1.0;
-        const double ringing = kTailDb * std::log(10.0) / 20.0 * 2.0 * FeedbackPath::kButterworthQ /
-                               (2.0 * 3.141592653589793 * kLowCut);
+        const double ringing =
+            kTailDb * std::log(10.0) / 20.0 * 2.0 * FeedbackPath::kButterworthQ / (2.0 * 3.141592653589793 * kLowCut);
         seconds = std::min(repeats * ms / 1000.0 + ringing, kLongestTailSeconds);
     }
     return static_cast<std::uint32_t>(std::ceil(seconds * GetSampleRate()));
@@ -82,13 +82,24 @@ bool ZenStereoEcho::ApplyNeutralSetting() {
     return SetParameter(kMix, 0.0f);
 }
 
-void ZenStereoEcho::UpdateTime() noexcept { m_glide.SetTarget(TimeMs(m_time, m_sync, m_tempo) * GetSampleRate() / 1000.0); }
+void ZenStereoEcho::UpdateTime() noexcept {
+    m_glide.SetTarget(TimeMs(m_time, m_sync, m_tempo) * GetSampleRate() / 1000.0);
+}
 
 void ZenStereoEcho::UpdateProcessingParameter(std::uint32_t index, float value) {
     switch (index) {
-        case kTime: m_time = value; UpdateTime(); break;
-        case kSync: m_sync = static_cast<int>(std::lround(value)); UpdateTime(); break;
-        case kTempo: m_tempo = value; UpdateTime(); break;
+        case kTime:
+            m_time = value;
+            UpdateTime();
+            break;
+        case kSync:
+            m_sync = static_cast<int>(std::lround(value));
+            UpdateTime();
+            break;
+        case kTempo:
+            m_tempo = value;
+            UpdateTime();
+            break;
         case kTone: m_feedbackPath.SetCuts(kLowCut, value); break;
         default: break;
     }
