@@ -22,8 +22,8 @@ inline float DbToGain(float db) { return zen::DbToGain(db); }
 // 10^(dB/20), never below the smallest normal float.
 inline float DbToGainFloored(float db) { return zen::DbToGainFloored(db); }
 
-// A share in % as a fraction.
-inline float PercentToFraction(float percent) { return 0.01f * percent; }
+// A percentage as a fraction: 50 % is 0.5.
+inline float PercentToFraction(float percent) { return percent / 100.0f; }
 
 }  // namespace working
 }  // namespace zen
