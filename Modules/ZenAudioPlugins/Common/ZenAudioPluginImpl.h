@@ -33,6 +33,7 @@
 #include "PendingBits.h"
 #include "SmoothedValueGroup.h"
 #include "Algorithms/Delay.h"
+#include "Algorithms/Vec.h"
 #include "zen/AudioPlugin.h"
 #include "zen/PluginInstance.h"
 #include "zen/ZenControlValueHost.h"
@@ -53,6 +54,10 @@ public:
     static constexpr std::uint32_t kMaxBlockSize = 1u << 20;
     // Length of the cross-fade when bypass is switched.
     static constexpr double kBypassFadeSeconds = 0.010;
+    // Input samples are held within +-kInputLimit (+200 dBFS) and NaN and
+    // infinities become 0 before any plug-in sees them: far beyond real audio,
+    // and low enough that squares and sums inside every plug-in stay finite.
+    static constexpr float kInputLimit = 1e10f;
 
     ~ZenAudioPluginImpl() override;
 
@@ -209,5 +214,7 @@ private:
     float m_bypassFadeStep = 1.0f;
     zen::Delay m_bypassDelay;
     std::vector<float> m_dry;  // channel-major scratch, kMaxChannels x block size at most
+
+    ora::numeric::Vec m_vec;
 };
 

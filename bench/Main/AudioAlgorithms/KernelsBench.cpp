@@ -148,6 +148,11 @@ std::vector<Family> Families() {
                             return std::function<void()>(
                                 [=] { f->Clamp(a->data(), -0.5f, 0.5f, out->data(), kFrames); });
                         }});
+    families.push_back({"Vec/Sanitize", false, false, [=] {
+                            auto f = std::make_shared<Vec>();
+                            return std::function<void()>(
+                                [=] { f->Sanitize(a->data(), 0.5f, out->data(), kFrames); });
+                        }});
     families.push_back({"Blas1/Dot", false, false, [=] {
                             auto f = std::make_shared<Blas1>();
                             return std::function<void()>(

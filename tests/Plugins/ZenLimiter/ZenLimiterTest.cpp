@@ -414,6 +414,22 @@ TEST(ZenLimiter, SoftShapesOnlyBlocksOverTheCeilingWithItsKnee) {
     EXPECT_NEAR(ratios.front() * knee / 0.7615942 * std::tanh(2.0 / knee), knee, 0.01);
 }
 
+// NaN and infinities arrive as silence and huge values at +200 dBFS: the
+// output stays finite and under the ceiling through all of them.
+TEST(ZenLimiter, NonFiniteAndHugeInputStayUnderTheCeiling) {
+    std::vector<float> input = zentest::Noise(9600, 0.5, 7);
+    input[1000] = NAN;
+    input[2000] = INFINITY;
+    input[3000] = -INFINITY;
+    std::fill(input.begin() + 4000, input.begin() + 4100, 1e19f);
+    std::fill(input.begin() + 6000, input.begin() + 6100, -3e38f);
+    const std::vector<float> output = Limit(input, {});
+    for (std::size_t n = 0; n < output.size(); ++n) {
+        ASSERT_TRUE(std::isfinite(output[n])) << n;
+        ASSERT_LE(std::fabs(output[n]), 1.0f) << n;
+    }
+}
+
 TEST(ZenLimiter, AnyBlockSplitGivesTheSameOutputAndResetReproduces) {
     Settings settings;
     settings.ceilingDb = -3.0f;

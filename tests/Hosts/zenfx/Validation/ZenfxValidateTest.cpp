@@ -70,7 +70,7 @@ TEST(ZenfxValidate, EveryRegisteredPluginPasses) {
         // The checks every plug-in with audio input gets, whatever it declares.
         const std::set<std::string> passed = WithStatus(plugin, "pass");
         for (const char* id : {"lifecycle.channel-layouts", "lifecycle.sample-rates", "parameters.set-get",
-                               "parameters.state", "blocks.lengths", "signals.non-finite", "latency.bypass",
+                               "parameters.state", "blocks.lengths", "signals.non-finite", "signals.huge", "latency.bypass",
                                "threads.parameters", "realtime.allocation", "realtime.locks"})
             EXPECT_EQ(passed.count(id), 1u) << plugin["name"] << " " << id;
     }
@@ -119,7 +119,14 @@ INSTANTIATE_TEST_SUITE_P(
                           {"parameters.set-get", "parameters.state", "threads.parameters"},
                           "'Gain' (index 0): set to -24, read back 0"},
                     Fault{"Test Wrong Latency", {"latency.impulse"}, "latency of 40 samples but an impulse comes out"},
-                    Fault{"Test NaN State", {"signals.non-finite"}, "still non-finite"},
+                    Fault{"Test NaN State",
+                          {"signals.non-finite"},
+                          "after one sample of NaN on channel 1 at frame 2148 with the defaults at 48000 Hz: NaN at "
+                          "frame 2148 on channel 1"},
+                    Fault{"Test Overflow",
+                          {"signals.huge"},
+                          "after one sample of 1e+18 on channel 1 at frame 2148 with the defaults at 48000 Hz: +Inf at "
+                          "frame 2148 on channel 1 (1 non-finite sample in all)"},
                     Fault{"Test Locking", {"realtime.locks"}, "does not declare LocksAudioPath"},
                     Fault{"Test Block Peak", {"blocks.split-invariance"}, "does not declare itself block-based"}),
     [](const testing::TestParamInfo<Fault>& param) {

@@ -51,8 +51,29 @@ void Clamp(const float* a, float lo, float hi, float* out, std::size_t n) {
     }
 }
 
+// The ordered comparisons are false for NaN, as in the reference form.
+void Sanitize(const float* a, float limit, float* out, std::size_t n) {
+    const __m128 sign = _mm_set1_ps(-0.0f);
+    const __m128 bound = _mm_set1_ps(limit);
+    const __m128 largest = _mm_set1_ps(__FLT_MAX__);
+    std::size_t i = 0;
+    for (; i + 4 <= n; i += 4) {
+        const __m128 x = _mm_loadu_ps(a + i);
+        const __m128 magnitude = _mm_andnot_ps(sign, x);
+        const __m128 within = _mm_cmple_ps(magnitude, bound);
+        const __m128 finite = _mm_cmple_ps(magnitude, largest);
+        const __m128 held = _mm_and_ps(finite, _mm_or_ps(_mm_and_ps(sign, x), bound));
+        _mm_storeu_ps(out + i, _mm_or_ps(_mm_and_ps(within, x), _mm_andnot_ps(within, held)));
+    }
+    for (; i < n; ++i) {
+        const float magnitude = __builtin_fabsf(a[i]);
+        if (magnitude <= limit) out[i] = a[i];
+        else out[i] = magnitude <= __FLT_MAX__ ? __builtin_copysignf(limit, a[i]) : 0.0f;
+    }
+}
+
 }  // namespace
 
-const VecKernels kVec_m128 = {Add, Subtract, Multiply, Scale, Abs, Clamp};
+const VecKernels kVec_m128 = {Add, Subtract, Multiply, Scale, Abs, Clamp, Sanitize};
 
 }  // namespace ora::numeric::kernels

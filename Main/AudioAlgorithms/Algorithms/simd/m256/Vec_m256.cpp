@@ -52,8 +52,29 @@ void Clamp(const float* a, float lo, float hi, float* out, std::size_t n) {
     }
 }
 
+// The ordered comparisons are false for NaN, as in the reference form.
+void Sanitize(const float* a, float limit, float* out, std::size_t n) {
+    const __m256 sign = _mm256_set1_ps(-0.0f);
+    const __m256 bound = _mm256_set1_ps(limit);
+    const __m256 largest = _mm256_set1_ps(__FLT_MAX__);
+    std::size_t i = 0;
+    for (; i + 8 <= n; i += 8) {
+        const __m256 x = _mm256_loadu_ps(a + i);
+        const __m256 magnitude = _mm256_andnot_ps(sign, x);
+        const __m256 within = _mm256_cmp_ps(magnitude, bound, _CMP_LE_OQ);
+        const __m256 finite = _mm256_cmp_ps(magnitude, largest, _CMP_LE_OQ);
+        const __m256 held = _mm256_and_ps(finite, _mm256_or_ps(_mm256_and_ps(sign, x), bound));
+        _mm256_storeu_ps(out + i, _mm256_or_ps(_mm256_and_ps(within, x), _mm256_andnot_ps(within, held)));
+    }
+    for (; i < n; ++i) {
+        const float magnitude = __builtin_fabsf(a[i]);
+        if (magnitude <= limit) out[i] = a[i];
+        else out[i] = magnitude <= __FLT_MAX__ ? __builtin_copysignf(limit, a[i]) : 0.0f;
+    }
+}
+
 }  // namespace
 
-const VecKernels kVec_m256 = {Add, Subtract, Multiply, Scale, Abs, Clamp};
+const VecKernels kVec_m256 = {Add, Subtract, Multiply, Scale, Abs, Clamp, Sanitize};
 
 }  // namespace ora::numeric::kernels
