@@ -170,6 +170,17 @@ TEST(ZenfxValidate, UsageMistakesAreOneLineErrors) {
         EXPECT_EQ(result.exitCode, 2) << args.back();
         EXPECT_EQ(std::count(result.err.begin(), result.err.end(), '\n'), 1) << result.err;
     }
+    // A --check that matches nothing would pass by checking nothing.
+    for (const char* check : {"nonexistent", "signal.huge"}) {
+        const auto none = RunZenfx({"validate", "--all", "--check", "lifecycle", "--check", check});
+        EXPECT_EQ(none.exitCode, 2) << none.out;
+        EXPECT_EQ(std::count(none.err.begin(), none.err.end(), '\n'), 1) << none.err;
+        EXPECT_NE(none.err.find(std::string("no check matches --check '") + check + "'"), std::string::npos)
+            << none.err;
+        EXPECT_TRUE(none.out.empty()) << none.out;
+    }
+    EXPECT_NE(RunZenfx({"validate", "--all", "--check", "signal.huge"}).err.find("did you mean 'signals.huge'"),
+              std::string::npos);
     const auto unknown = RunZenfx({"validate", "Soft Clipr"});
     EXPECT_EQ(unknown.exitCode, 1);
     EXPECT_NE(unknown.err.find("did you mean 'Soft Clipper'"), std::string::npos) << unknown.err;
