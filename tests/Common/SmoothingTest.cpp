@@ -94,3 +94,38 @@ TEST(SmoothedValueGroup, SettlesExactlyOnItsTarget) {
     // No creeping toward denormals: the value lands on the target.
     EXPECT_EQ(group[0].current.load(), 0.0);
 }
+
+TEST(SmoothedValueGroup, ASettledCursorsValueIsEveryValueOfItsBlockBitForBit) {
+    // Ramps up, down and back, block after block, past the fixed point: the
+    // cursor says it settled only there, and from then on its Value() is
+    // what the plain recursion gives for every sample of the block.
+    zen::OnePoleSmoother::RefreshAll(44100.0);
+    const double a = zen::GlobalSmoothing::SharedSmoother().GetA(), b = zen::GlobalSmoothing::SharedSmoother().GetB();
+    std::atomic<bool> processing{true};
+    zen::SmoothedValueGroup group(1, 1.0f);
+    group.SetRampingFlag(&processing);
+    double expected = 1.0;
+    for (float target : {2.818383f, 0.0617f, 1.0f}) {
+        zen::GlobalSmoothing::EnterProcessing();
+        group.SetTarget(target);
+        zen::GlobalSmoothing::LeaveProcessing();
+        int settledBlocks = 0;
+        for (int block = 0; block < 200; ++block) {
+            auto cursor = group.Track(0);
+            const bool fixedPoint = a * expected + b * target == expected;
+            ASSERT_EQ(cursor.IsSettled(), fixedPoint) << target << " block " << block;
+            settledBlocks += fixedPoint;
+            const double constant = cursor.Value();
+            for (int i = 0; i < 509; ++i) {
+                expected = a * expected + b * target;
+                ASSERT_EQ(cursor.Next(), expected) << target << " block " << block << " sample " << i;
+                if (fixedPoint) {
+                    ASSERT_EQ(constant, expected) << target << " block " << block << " sample " << i;
+                }
+            }
+        }
+        EXPECT_GT(settledBlocks, 50) << target;  // about a second in
+        EXPECT_EQ(static_cast<float>(expected), target);
+    }
+    zen::OnePoleSmoother::RefreshAll(48000.0);
+}

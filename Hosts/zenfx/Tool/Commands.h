@@ -2,6 +2,7 @@
 #pragma once
 
 #include <cstdint>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -49,11 +50,18 @@ struct ControlOptions {
     bool json = false;
 };
 
+struct AnalyzeOptions {
+    std::vector<std::string> files;
+    bool json = false;
+    std::optional<double> target;  // LUFS: report the gain that reaches it
+};
+
 int RunList(PluginLibrary& library, bool json);
 int RunInfo(PluginLibrary& library, const InfoOptions& options);
 int RunProcess(PluginLibrary& library, const ProcessOptions& options);
 int RunValidate(PluginLibrary& library, const ValidateOptions& options);
 int RunControl(PluginLibrary& library, const ControlOptions& options);
+int RunAnalyze(PluginLibrary& library, const AnalyzeOptions& options);
 int RunDemo(const std::string& output, const std::string& format);
 
 }  // namespace zenfx

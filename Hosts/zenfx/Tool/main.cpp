@@ -114,6 +114,16 @@ int main(int argc, char** argv) {
     for (CLI::App* sub : {controlList, controlShow, controlSet, controlRun})
         sub->add_option("--config-dir", control.configFolder, "Folder of the settings documents");
 
+    zenfx::AnalyzeOptions analyze;
+    double analyzeTarget = 0.0;
+    CLI::App* analyzeCommand =
+        app.add_subcommand("analyze", "Loudness (EBU R 128), true peak and RMS of audio files");
+    analyzeCommand->add_option("FILE", analyze.files, "Audio files (WAV, FLAC, AIFF, ...)")->required();
+    analyzeCommand->add_flag("--json", analyze.json, "Print JSON");
+    CLI::Option* targetOption = analyzeCommand->add_option("--target", analyzeTarget,
+                                                           "Loudness to reach (LUFS): report the gain it takes")
+                                    ->check(CLI::Range(-70.0, 0.0));
+
     std::string demoOutput, demoFormat;
     CLI::App* demo = app.add_subcommand("demo", "Write the built-in demo material to a file");
     demo->add_option("-o,--output", demoOutput, "Output file")->required();
@@ -135,6 +145,10 @@ int main(int argc, char** argv) {
         if (*list) return zenfx::RunList(library, listJson);
         if (*infoCommand) return zenfx::RunInfo(library, info);
         if (*validateCommand) return zenfx::RunValidate(library, validate);
+        if (*analyzeCommand) {
+            if (*targetOption) analyze.target = analyzeTarget;
+            return zenfx::RunAnalyze(library, analyze);
+        }
         if (*controlCommand) {
             for (CLI::App* sub : controlCommand->get_subcommands()) control.action = sub->get_name();
             return zenfx::RunControl(library, control);

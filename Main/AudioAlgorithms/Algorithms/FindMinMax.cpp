@@ -27,12 +27,11 @@ using system::KernelForm;
 
 constexpr float kNone = std::numeric_limits<float>::infinity();
 
-kernels::FindMinMaxKernel FormKernel(KernelForm form, int channels) {
-    const bool wide = form == KernelForm::M256;
-    switch (channels) {
-        case 1: return wide ? kernels::FindMinMax_c1_m256 : kernels::FindMinMax_c1_m128;
-        case 2: return wide ? kernels::FindMinMax_c2_m256 : kernels::FindMinMax_c2_m128;
-        default: return wide ? kernels::FindMinMax_c4_m256 : kernels::FindMinMax_c4_m128;
+kernels::FindMinMaxKernel FormKernel(KernelForm form) {
+    switch (form) {
+        case KernelForm::M256: return kernels::FindMinMax_m256;
+        case KernelForm::M128: return kernels::FindMinMax_m128;
+        default: return kernels::FindMinMax_ref;
     }
 }
 
@@ -50,18 +49,13 @@ public:
     };
 
     FindMinMaxImpl(KernelForm form, int channels, State state)
-        : m_kernel(form == KernelForm::Ref ? nullptr : FormKernel(form, channels)),
-          m_channels(channels),
-          m_state(std::move(state)) {
+        : m_kernel(FormKernel(form)), m_channels(channels), m_state(std::move(state)) {
         m_state.mn.resize(static_cast<std::size_t>(channels), kNone);
         m_state.mx.resize(static_cast<std::size_t>(channels), -kNone);
     }
 
     void Process(const float* x, std::size_t frames) noexcept {
-        if (m_kernel != nullptr)
-            m_kernel(x, frames, m_state.mn.data(), m_state.mx.data());
-        else
-            kernels::FindMinMax_ref(x, frames, m_channels, m_state.mn.data(), m_state.mx.data());
+        m_kernel(x, frames, m_channels, m_state.mn.data(), m_state.mx.data());
     }
 
     void Reset() noexcept {
@@ -74,7 +68,7 @@ public:
     State TakeState() { return std::move(m_state); }
 
 private:
-    kernels::FindMinMaxKernel m_kernel;  // null: the reference loop
+    kernels::FindMinMaxKernel m_kernel;
     int m_channels;
     State m_state;
 };

@@ -1,6 +1,7 @@
 #include "FFT/Buffer.h"
 
 #include <algorithm>
+#include <cmath>
 #include <cstring>
 
 namespace ora::fft {
@@ -24,8 +25,29 @@ void Buffer::Clear() noexcept {
 
 void Buffer::Write(const float* samples, std::size_t count) noexcept {
     if (m_data.empty()) return;
-    for (std::size_t i = 0; i < count; ++i) m_data[static_cast<std::size_t>(m_written + static_cast<std::int64_t>(i)) & m_mask] = samples[i];
-    m_written += static_cast<std::int64_t>(count);
+    for (std::size_t done = 0; done < count;) {
+        const std::size_t at = static_cast<std::size_t>(m_written) & m_mask;
+        const std::size_t n = std::min(count - done, m_data.size() - at);
+        std::memcpy(m_data.data() + at, samples + done, n * sizeof(float));
+        done += n;
+        m_written += static_cast<std::int64_t>(n);
+    }
+}
+
+void Buffer::WriteLimited(const float* samples, std::size_t count, float limit) noexcept {
+    if (m_data.empty()) return;
+    for (std::size_t done = 0; done < count;) {
+        const std::size_t at = static_cast<std::size_t>(m_written) & m_mask;
+        const std::size_t n = std::min(count - done, m_data.size() - at);
+        float* to = m_data.data() + at;
+        const float* from = samples + done;
+        for (std::size_t i = 0; i < n; ++i) {
+            const float x = from[i];
+            to[i] = std::isfinite(x) ? std::min(std::max(x, -limit), limit) : 0.0f;
+        }
+        done += n;
+        m_written += static_cast<std::int64_t>(n);
+    }
 }
 
 float Buffer::At(std::int64_t position) const noexcept {
@@ -36,10 +58,16 @@ float Buffer::At(std::int64_t position) const noexcept {
 
 void Buffer::Read(std::int64_t start, float* out, std::size_t count) const noexcept {
     const auto capacity = static_cast<std::int64_t>(m_data.size());
-    const std::int64_t oldest = std::max<std::int64_t>(0, m_written - capacity);
-    for (std::size_t i = 0; i < count; ++i) {
-        const std::int64_t p = start + static_cast<std::int64_t>(i);
-        out[i] = (p >= oldest && p < m_written) ? m_data[static_cast<std::size_t>(p) & m_mask] : 0.0f;
+    const std::int64_t end = start + static_cast<std::int64_t>(count);
+    const std::int64_t from = std::min(std::max({start, m_written - capacity, std::int64_t{0}}), end);
+    const std::int64_t to = std::max(std::min(end, m_written), from);
+    std::fill(out, out + (from - start), 0.0f);
+    std::fill(out + (to - start), out + count, 0.0f);
+    for (std::int64_t p = from; p < to;) {
+        const std::size_t at = static_cast<std::size_t>(p) & m_mask;
+        const auto n = static_cast<std::size_t>(std::min<std::int64_t>(to - p, capacity - static_cast<std::int64_t>(at)));
+        std::memcpy(out + (p - start), m_data.data() + at, n * sizeof(float));
+        p += static_cast<std::int64_t>(n);
     }
 }
 

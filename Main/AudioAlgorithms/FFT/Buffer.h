@@ -26,11 +26,15 @@ public:
 
     // Ring: appends samples at the write position.
     void Write(const float* samples, std::size_t count) noexcept;
+    // Ring: appends samples limited to +-limit, non-finite ones as zero.
+    void WriteLimited(const float* samples, std::size_t count, float limit) noexcept;
     std::int64_t Written() const { return m_written; }
     // Ring: samples [start, start + count); positions never written or
     // already overwritten read as zero.
     void Read(std::int64_t start, float* out, std::size_t count) const noexcept;
     float At(std::int64_t position) const noexcept;
+    // Ring: a position the caller knows to be held (written, not yet overwritten).
+    float Held(std::int64_t position) const noexcept { return m_data[static_cast<std::size_t>(position) & m_mask]; }
 
     // Linear: drops the first `count` samples and zero-fills the end.
     void Shift(std::size_t count) noexcept;

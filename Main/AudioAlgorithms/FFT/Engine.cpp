@@ -1,6 +1,7 @@
 #include "FFT/Engine.h"
 
 #include <algorithm>
+#include <cmath>
 #include <new>
 #include <stdexcept>
 
@@ -62,12 +63,13 @@ bool Engine::Configure(const EngineConfig& config) {
     m_context.fftLength = config.fftLength;
     m_context.bins = config.fftLength / 2 + 1;
     m_context.synthesisHop = config.hop;
-    m_context.analysisHop = config.hop;
+    m_context.analysisHop = static_cast<double>(config.hop);
     m_context.gain = config.gain;
     m_context.fft = m_fft.get();
     m_context.window = &m_window;
     m_context.in = &m_in;
     m_context.out = &m_out;
+    m_inputLimit = config.inputLimit;
     for (Plugin* p : m_pipeline)
         if (!p->Configure(*m_frame, m_context)) return false;
     m_configured = true;
@@ -81,27 +83,41 @@ void Engine::Reset() noexcept {
     for (auto& b : m_pushOut) b.Clear();
     for (Plugin* p : m_pipeline) p->Reset();
     m_context.frameIndex = 0;
-    m_context.analysisHop = m_context.synthesisHop;
-    m_lastStart = 0;
+    m_context.analysisHop = static_cast<double>(m_context.synthesisHop);
+    m_context.analysisOffset = 0.0;
+    m_lastCentre = 0.0;
     m_pushNextStart = static_cast<std::int64_t>(m_context.synthesisHop) - static_cast<std::int64_t>(m_context.frameLength);
 }
 
 void Engine::Write(const float* const* in, std::size_t frames) noexcept {
-    for (std::size_t c = 0; c < m_in.size(); ++c) m_in[c].Write(in[c], frames);
+    for (std::size_t c = 0; c < m_in.size(); ++c) {
+        if (m_inputLimit > 0.0f)
+            m_in[c].WriteLimited(in[c], frames, m_inputLimit);
+        else
+            m_in[c].Write(in[c], frames);
+    }
 }
 
 std::int64_t Engine::Written() const { return m_in.empty() ? 0 : m_in[0].Written(); }
 
-void Engine::RunFrame(std::int64_t analysisStart) noexcept {
+void Engine::RunFrameAt(double centre, double analysisHop, const TimeMap* map) noexcept {
     if (!m_configured) return;
-    if (m_context.frameIndex > 0) {
-        for (auto& b : m_out) b.Shift(m_context.synthesisHop);
-        m_context.analysisHop = static_cast<std::size_t>(std::max<std::int64_t>(1, analysisStart - m_lastStart));
-    }
-    m_context.analysisStart = analysisStart;
+    if (m_context.frameIndex > 0) for (auto& b : m_out) b.Shift(m_context.synthesisHop);
+    const double half = static_cast<double>(m_context.frameLength / 2);
+    const double start = std::floor(centre - half + 0.5);
+    m_context.analysisStart = static_cast<std::int64_t>(start);
+    m_context.analysisOffset = centre - (start + half);
+    m_context.analysisHop = std::max(analysisHop, 1.0);
+    m_context.timeMap = map;
     for (Plugin* p : m_pipeline) p->Process(*m_frame, m_context);
-    m_lastStart = analysisStart;
+    m_context.timeMap = nullptr;
+    m_lastCentre = centre;
     ++m_context.frameIndex;
+}
+
+void Engine::RunFrame(std::int64_t analysisStart) noexcept {
+    const double centre = static_cast<double>(analysisStart) + static_cast<double>(m_context.frameLength / 2);
+    RunFrameAt(centre, m_context.frameIndex > 0 ? centre - m_lastCentre : static_cast<double>(m_context.synthesisHop));
 }
 
 std::size_t Engine::Push(const float* const* in, float* const* out, std::size_t frames) noexcept {

@@ -7,8 +7,8 @@
 //     of a stream; the output is the input's timeline delayed by
 //     PushLatency().
 //   - Write + RunFrame: the caller picks each frame's analysis position (a
-//     time-stretch does); after each frame the next synthesis hop of output
-//     is final and readable through Emitted().
+//     time-stretch does), to a fraction of a sample; after each frame the
+//     next synthesis hop of output is final and readable through Emitted().
 // Configure allocates; everything else is real-time safe.
 #pragma once
 
@@ -36,6 +36,9 @@ struct EngineConfig {
     std::size_t inputCapacity = 0;    // input history per channel; 0: four frames
     Backend backend = FFT::DefaultBackend();
     float gain = 1.0f;
+    // Input beyond +-inputLimit is limited to it and non-finite input taken
+    // as silence, so the transforms' sums and squares stay finite; 0: as is.
+    float inputLimit = 0.0f;
     std::vector<Plugin*> pipeline;    // not owned; must end in an OUTPUT plug-in
 };
 
@@ -56,8 +59,15 @@ public:
 
     void Write(const float* const* in, std::size_t frames) noexcept;
     std::int64_t Written() const;
-    // Runs one frame whose first sample is input position `analysisStart`
-    // (earlier positions and those not yet written read as silence).
+    // Runs one frame centred on input position `centre`, `analysisHop`
+    // after the previous frame's centre (for the first frame: the hop the
+    // frames will keep), its content placed in the synthesis by `map` (null:
+    // a uniform stretch by the hops' ratio). The samples read are the whole
+    // ones nearest the centre; earlier positions and those not yet written
+    // read as silence.
+    void RunFrameAt(double centre, double analysisHop, const TimeMap* map = nullptr) noexcept;
+    // Runs one frame whose first sample is input position `analysisStart`,
+    // a whole hop after the previous one (the synthesis hop for the first).
     void RunFrame(std::int64_t analysisStart) noexcept;
     // The synthesis hop of output that the last frame completed.
     const float* Emitted(std::size_t channel) const { return m_out[channel].data(); }
@@ -83,8 +93,9 @@ private:
     std::vector<Buffer> m_pushOut;  // Push: emitted output in emission order
     std::vector<Plugin*> m_pipeline;
     Context m_context;
-    std::int64_t m_lastStart = 0;
+    double m_lastCentre = 0.0;
     std::int64_t m_pushNextStart = 0;
+    float m_inputLimit = 0.0f;
     bool m_configured = false;
 };
 

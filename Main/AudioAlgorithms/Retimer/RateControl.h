@@ -1,12 +1,9 @@
-// The re-timer's rate control: the rate at which the stretched stream is
-// read glides toward the wanted pitch ratio, and the timeline arithmetic
-// that ties output samples, stretched samples and input samples together.
-//
-// Output sample n shows input time n - latency. A synthesis frame centred
-// at stretched time T will be read around output sample n + (T - t) / rate
-// (t: the current read position), so its analysis frame is centred at that
-// sample's input time. The latency is the least that lets every frame be
-// analysed by the time the reader reaches it at the lowest ratio.
+// The re-timer's rate control: the ratio at which frames are analysed (and
+// so the rate at which the stretched stream is read) glides toward the
+// wanted pitch ratio, and the latency that ties output samples to input
+// samples: output sample n shows input time n - latency. The latency is
+// the least that lets every frame be analysed by the time the reader needs
+// it, at any sequence of ratios down to the lowest.
 #pragma once
 
 #include <cstddef>
@@ -20,7 +17,7 @@ class rate_control {
 public:
     class Param : public ParamGroup {
     public:
-        std::int64_t m_Origin = 0;          // read position in the stretched stream after a reset
+        std::int64_t m_Origin = 0;          // first frame's centre, input samples after the first output's input time
         std::int32_t m_ExtraLatency = 0;    // added to the least latency
         float m_Rate = 1.0f;                // rate the control starts from
         float m_Glide = 0.001f;             // per-sample one-pole step toward a new ratio (~21 ms at 48 kHz)

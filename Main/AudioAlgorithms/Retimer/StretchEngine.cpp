@@ -5,7 +5,10 @@
 
 namespace ora::fft::stretch::pv {
 
-Engine::Engine(const EngineParam& param) : m_param(param) { ApplySettings(); }
+Engine::Engine(const EngineParam& param) : m_param(param) {
+    m_in2dft.SetTimeWeighted(true);
+    ApplySettings();
+}
 
 bool Engine::Configure(std::size_t channels, std::size_t inputCapacity, Backend backend) {
     m_channels = 0;
@@ -19,6 +22,7 @@ bool Engine::Configure(std::size_t channels, std::size_t inputCapacity, Backend 
     config.inputCapacity = inputCapacity;
     config.backend = backend;
     config.gain = m_param.Gain();
+    config.inputLimit = kLargestInput;
     config.pipeline = {&m_in2dft, &m_rect2polar, &m_phaseGrad, &m_pghi, &m_plpv, &m_polar2rect, &m_dft2out};
     if (config.pipeline.size() > m_param.PipelineCapacity() || !m_engine.Configure(config)) return false;
     m_channels = channels;

@@ -29,6 +29,10 @@ class Engine {
 public:
     // Samples over which a change of the mix gains ramps (5 ms at 48 kHz).
     static constexpr std::size_t kMixRamp = 240;
+    // Input is limited to +-this (+160 dBFS), non-finite input is silence:
+    // far beyond any real signal, far within what the transforms' sums and
+    // squares hold in single precision.
+    static constexpr float kLargestInput = 1e8f;
 
     explicit Engine(const EngineParam& param);
     Engine(const Engine&) = delete;
@@ -58,7 +62,12 @@ public:
 
     void Write(const float* const* in, std::size_t frames) noexcept { m_engine.Write(in, frames); }
     std::int64_t Written() const { return m_engine.Written(); }
-    void RunFrame(std::int64_t analysisStart) noexcept { m_engine.RunFrame(analysisStart); }
+    // One frame centred on input time `centre`, `analysisHop` after the
+    // previous one, its content placed by `map` (see fft::Engine); the next
+    // synthesis hop is then final in Emitted().
+    void RunFrame(double centre, double analysisHop, const TimeMap* map = nullptr) noexcept {
+        m_engine.RunFrameAt(centre, analysisHop, map);
+    }
     const float* Emitted(std::size_t channel) const { return m_engine.Emitted(channel); }
 
     // Mixes the dry input from position `inputStart` into the finished

@@ -9,10 +9,6 @@ namespace {
 
 bool Forced() { return DispatchSettings::Instance().GetMode() == DispatchMode::Forced; }
 
-bool LevelAtLeast(InstructionLevel level) {
-    return static_cast<int>(DispatchSettings::Instance().GetForcedLevel()) >= static_cast<int>(level);
-}
-
 const ora_cpuinfo_x86& Cpu() { return DispatchSettings::Instance().Detected(); }
 
 }  // namespace
@@ -46,16 +42,53 @@ void DispatchSettings::Force(InstructionLevel level, bool fma, bool wide) {
     m_mode.store(static_cast<int>(DispatchMode::Forced));
 }
 
-bool HasSSE() { return Forced() ? LevelAtLeast(InstructionLevel::SSE) : Cpu().valid && Cpu().sse; }
-bool HasSSE2() { return Forced() ? LevelAtLeast(InstructionLevel::SSE2) : Cpu().valid && Cpu().sse2; }
-bool HasSSE3() { return Forced() ? LevelAtLeast(InstructionLevel::SSE3) : Cpu().valid && Cpu().sse3; }
-bool HasLevel4() { return Forced() ? LevelAtLeast(InstructionLevel::SSSE3) : Cpu().valid && Cpu().sse41; }
-bool HasSSE41() { return Forced() ? LevelAtLeast(InstructionLevel::SSE41) : Cpu().valid && Cpu().sse41; }
-bool HasSSE42() { return Forced() ? LevelAtLeast(InstructionLevel::SSE42) : Cpu().valid && Cpu().sse42; }
-bool HasAVX() { return Forced() ? LevelAtLeast(InstructionLevel::AVX) : Cpu().valid && Cpu().osAvx; }
-bool HasAVX2() { return Forced() ? LevelAtLeast(InstructionLevel::AVX2) : Cpu().valid && Cpu().avx2 && Cpu().osAvx; }
-bool HasFMA() { return Forced() ? DispatchSettings::Instance().GetForcedFma() : Cpu().valid && Cpu().fma && Cpu().osAvx; }
-bool HasWideVectors() { return Forced() && DispatchSettings::Instance().GetForcedWide(); }
+FeatureSet ForcedFeatures(InstructionLevel level, bool fma, bool wide) {
+    const auto atLeast = [level](InstructionLevel wanted) { return static_cast<int>(level) >= static_cast<int>(wanted); };
+    FeatureSet f;
+    f.sse = atLeast(InstructionLevel::SSE);
+    f.sse2 = atLeast(InstructionLevel::SSE2);
+    f.sse3 = atLeast(InstructionLevel::SSE3);
+    f.level4 = atLeast(InstructionLevel::SSSE3);
+    f.sse41 = atLeast(InstructionLevel::SSE41);
+    f.sse42 = atLeast(InstructionLevel::SSE42);
+    f.avx = atLeast(InstructionLevel::AVX);
+    f.avx2 = atLeast(InstructionLevel::AVX2);
+    f.fma = fma;
+    f.wide = wide;
+    return f;
+}
+
+FeatureSet DetectedFeatures(const ora_cpuinfo_x86& cpu) {
+    FeatureSet f;
+    if (!cpu.valid) return f;
+    f.sse = cpu.sse;
+    f.sse2 = cpu.sse2;
+    f.sse3 = cpu.sse3;
+    f.level4 = cpu.sse41;
+    f.sse41 = cpu.sse41;
+    f.sse42 = cpu.sse42;
+    f.avx = cpu.osAvx;
+    f.avx2 = cpu.osAvx && cpu.avx2;
+    f.fma = cpu.osAvx && cpu.fma;
+    return f;
+}
+
+FeatureSet CurrentFeatures() {
+    const DispatchSettings& settings = DispatchSettings::Instance();
+    return Forced() ? ForcedFeatures(settings.GetForcedLevel(), settings.GetForcedFma(), settings.GetForcedWide())
+                    : DetectedFeatures(settings.Detected());
+}
+
+bool HasSSE() { return CurrentFeatures().sse; }
+bool HasSSE2() { return CurrentFeatures().sse2; }
+bool HasSSE3() { return CurrentFeatures().sse3; }
+bool HasLevel4() { return CurrentFeatures().level4; }
+bool HasSSE41() { return CurrentFeatures().sse41; }
+bool HasSSE42() { return CurrentFeatures().sse42; }
+bool HasAVX() { return CurrentFeatures().avx; }
+bool HasAVX2() { return CurrentFeatures().avx2; }
+bool HasFMA() { return CurrentFeatures().fma; }
+bool HasWideVectors() { return CurrentFeatures().wide; }
 
 int LogicalProcessorCount() {
     return Forced() ? DispatchSettings::Instance().GetForcedLogicalProcessors() : Cpu().logicalProcessors;
@@ -74,16 +107,16 @@ int InitialApicId() {
     return Forced() ? DispatchSettings::Instance().GetForcedInitialApicId() : static_cast<int>(Cpu().initialApicId);
 }
 
-KernelForm ChooseKernelForm() {
-    if (HasAVX() && HasFMA()) return KernelForm::M256Fma;
-    if (HasAVX()) return KernelForm::M256;
-    if (HasFMA()) return KernelForm::M128Fma;
-    if (HasSSE2()) return KernelForm::M128;
+KernelForm ChooseKernelForm(const FeatureSet& f) {
+    if (f.avx && f.fma) return KernelForm::M256Fma;
+    if (f.avx) return KernelForm::M256;
+    if (f.fma) return KernelForm::M128Fma;
+    if (f.sse2) return KernelForm::M128;
     return KernelForm::Ref;
 }
 
-KernelForm ChooseKernelFormWithoutFma() {
-    switch (ChooseKernelForm()) {
+KernelForm ChooseKernelFormWithoutFma(const FeatureSet& f) {
+    switch (ChooseKernelForm(f)) {
         case KernelForm::M256Fma:
         case KernelForm::M256: return KernelForm::M256;
         case KernelForm::M128Fma:
@@ -92,11 +125,15 @@ KernelForm ChooseKernelFormWithoutFma() {
     }
 }
 
-IntegerKernelForm ChooseIntegerKernelForm() {
-    if (HasAVX2()) return IntegerKernelForm::M256Avx2;
-    if (HasSSE41()) return IntegerKernelForm::M128Sse41;
+IntegerKernelForm ChooseIntegerKernelForm(const FeatureSet& f) {
+    if (f.avx2) return IntegerKernelForm::M256Avx2;
+    if (f.sse41) return IntegerKernelForm::M128Sse41;
     return IntegerKernelForm::Ref;
 }
+
+KernelForm ChooseKernelForm() { return ChooseKernelForm(CurrentFeatures()); }
+KernelForm ChooseKernelFormWithoutFma() { return ChooseKernelFormWithoutFma(CurrentFeatures()); }
+IntegerKernelForm ChooseIntegerKernelForm() { return ChooseIntegerKernelForm(CurrentFeatures()); }
 
 const char* KernelFormName(IntegerKernelForm form) {
     switch (form) {

@@ -63,6 +63,23 @@ private:
     std::atomic<int> m_forcedThreadsPerCore{2};
 };
 
+// What the feature queries answer; every choice of form is a function of it.
+struct FeatureSet {
+    bool sse = false, sse2 = false, sse3 = false, level4 = false, sse41 = false, sse42 = false;
+    bool avx = false, avx2 = false, fma = false, wide = false;
+};
+
+// Forced mode: each level implies the ones below it; FMA and the second
+// boolean as given.
+FeatureSet ForcedFeatures(InstructionLevel level, bool fma, bool wide = false);
+// Detected mode: level 4 is SSE4.1 (SSSE3 is not detected separately), AVX
+// is operating-system AVX support. AVX2 and FMA also need that support:
+// their forms are VEX-encoded (the fused 128-bit ones too, being built with
+// -mfma), so without it the ladder falls to the non-VEX 128-bit forms.
+FeatureSet DetectedFeatures(const ora_cpuinfo_x86& cpu);
+// The process-wide settings' answer.
+FeatureSet CurrentFeatures();
+
 // Feature queries: forced level and booleans in forced mode, the processor
 // in detected mode.
 bool HasSSE();
@@ -85,15 +102,18 @@ enum class KernelForm { M256Fma, M256, M128Fma, M128, Ref };
 
 // 256-bit FMA when AVX and FMA; else 256-bit when AVX; else 128-bit FMA when
 // FMA; else 128-bit when SSE2; else the reference form.
+KernelForm ChooseKernelForm(const FeatureSet& features);
 KernelForm ChooseKernelForm();
 // The same ladder for a family without fused forms: they become the plain
 // vector form of their width.
+KernelForm ChooseKernelFormWithoutFma(const FeatureSet& features);
 KernelForm ChooseKernelFormWithoutFma();
 const char* KernelFormName(KernelForm form);
 
 // Families of integer arithmetic have a ladder of their own: 256-bit integer
 // vectors need AVX2, 128-bit 32-bit multiplies SSE4.1.
 enum class IntegerKernelForm { M256Avx2, M128Sse41, Ref };
+IntegerKernelForm ChooseIntegerKernelForm(const FeatureSet& features);
 IntegerKernelForm ChooseIntegerKernelForm();
 const char* KernelFormName(IntegerKernelForm form);
 

@@ -18,6 +18,10 @@ namespace {
 
 constexpr unsigned kLeafFeatures = 1;
 constexpr unsigned kLeafExtendedFeatures = 7;
+constexpr int kOsxsaveBit = 27;  // leaf 1 ECX
+constexpr int kAvxBit = 28;      // leaf 1 ECX
+// XCR0: the OS saves SSE (bit 1) and AVX (bit 2) state.
+constexpr unsigned long long kXcr0SseAndAvxState = 0x6u;
 
 bool Bit(unsigned value, int bit) { return ((value >> bit) & 1u) != 0; }
 
@@ -44,31 +48,17 @@ int CountPhysicalCores(int logical) {
 
 unsigned long long xgetbv0() {
     unsigned eax = 0, ebx = 0, ecx = 0, edx = 0;
-    if (!__get_cpuid(kLeafFeatures, &eax, &ebx, &ecx, &edx) || !Bit(ecx, 27)) return 0;
+    if (!__get_cpuid(kLeafFeatures, &eax, &ebx, &ecx, &edx) || !Bit(ecx, kOsxsaveBit)) return 0;
     unsigned low = 0, high = 0;
     __asm__ volatile("xgetbv" : "=a"(low), "=d"(high) : "c"(0));
     return (static_cast<unsigned long long>(high) << 32) | low;
 }
 
-ora_cpuinfo_x86 DetectCpu() {
+ora_cpuinfo_x86 DecodeCpuid(const CpuidWords& words) {
     ora_cpuinfo_x86 info;
-    const long online = sysconf(_SC_NPROCESSORS_ONLN);
-    info.logicalProcessors = online > 0 ? static_cast<int>(online) : 1;
-    info.physicalCores = CountPhysicalCores(info.logicalProcessors);
-    info.logicalExceedsPhysical = info.logicalProcessors > info.physicalCores;
-
-    unsigned eax = 0, ebx = 0, ecx = 0, edx = 0;
-    if (__get_cpuid(0, &eax, &ebx, &ecx, &edx)) {
-        info.highestStandardLeaf = eax;
-        char vendor[13] = {};
-        std::memcpy(vendor, &ebx, 4);
-        std::memcpy(vendor + 4, &edx, 4);
-        std::memcpy(vendor + 8, &ecx, 4);
-        info.vendor = vendor;
-        if (vendor[0] == 'G') Trace("Intel CPU: %s", vendor);
-        if (vendor[0] == 'A') Trace("AMD CPU: %s", vendor);
-    }
-    if (info.highestStandardLeaf >= kLeafFeatures && __get_cpuid(kLeafFeatures, &eax, &ebx, &ecx, &edx)) {
+    info.highestStandardLeaf = words.highestStandardLeaf;
+    if (words.highestStandardLeaf >= kLeafFeatures) {
+        const unsigned ebx = words.leaf1Ebx, ecx = words.leaf1Ecx, edx = words.leaf1Edx;
         info.initialApicId = (ebx >> 24) & 0xFFu;
         info.mmx = Bit(edx, 23);
         info.sse = Bit(edx, 25);
@@ -77,18 +67,11 @@ ora_cpuinfo_x86 DetectCpu() {
         info.fma = Bit(ecx, 12);
         info.sse41 = Bit(ecx, 19);
         info.sse42 = Bit(ecx, 20);
-        const bool osxsave = Bit(ecx, 27);
-        const bool avx = Bit(ecx, 28);
-        if (osxsave && avx) {
-            const unsigned long long xcr0 = xgetbv0();
-            [[maybe_unused]] const unsigned long long intrinsic = IntrinsicXgetbv0();
-            assert(xcr0 == intrinsic);
-            // Either state bit is accepted, not only both together.
-            info.osAvx = (xcr0 & 0x6u) != 0;
-        }
+        // Either state bit is accepted, not only both together.
+        info.osAvx = Bit(ecx, kOsxsaveBit) && Bit(ecx, kAvxBit) && (words.xcr0 & kXcr0SseAndAvxState) != 0;
     }
-    if (info.highestStandardLeaf >= kLeafExtendedFeatures &&
-        __get_cpuid_count(kLeafExtendedFeatures, 0, &eax, &ebx, &ecx, &edx)) {
+    if (words.highestStandardLeaf >= kLeafExtendedFeatures) {
+        const unsigned ebx = words.leaf7Ebx, ecx = words.leaf7Ecx;
         info.bmi1 = Bit(ebx, 3);
         info.avx2 = Bit(ebx, 5);
         info.bmi2 = Bit(ebx, 8);
@@ -107,6 +90,44 @@ ora_cpuinfo_x86 DetectCpu() {
         info.avx512vbmi = Bit(ecx, 1);
     }
     info.valid = true;
+    return info;
+}
+
+ora_cpuinfo_x86 DetectCpu() {
+    CpuidWords words;
+    std::string vendor;
+    unsigned eax = 0, ebx = 0, ecx = 0, edx = 0;
+    if (__get_cpuid(0, &eax, &ebx, &ecx, &edx)) {
+        words.highestStandardLeaf = eax;
+        char name[13] = {};
+        std::memcpy(name, &ebx, 4);
+        std::memcpy(name + 4, &edx, 4);
+        std::memcpy(name + 8, &ecx, 4);
+        vendor = name;
+        if (name[0] == 'G') Trace("Intel CPU: %s", name);
+        if (name[0] == 'A') Trace("AMD CPU: %s", name);
+    }
+    if (words.highestStandardLeaf >= kLeafFeatures && __get_cpuid(kLeafFeatures, &eax, &ebx, &ecx, &edx)) {
+        words.leaf1Ebx = ebx;
+        words.leaf1Ecx = ecx;
+        words.leaf1Edx = edx;
+        if (Bit(ecx, kOsxsaveBit)) {
+            words.xcr0 = xgetbv0();
+            [[maybe_unused]] const unsigned long long intrinsic = IntrinsicXgetbv0();
+            assert(words.xcr0 == intrinsic);
+        }
+    }
+    if (words.highestStandardLeaf >= kLeafExtendedFeatures &&
+        __get_cpuid_count(kLeafExtendedFeatures, 0, &eax, &ebx, &ecx, &edx)) {
+        words.leaf7Ebx = ebx;
+        words.leaf7Ecx = ecx;
+    }
+    ora_cpuinfo_x86 info = DecodeCpuid(words);
+    info.vendor = vendor;
+    const long online = sysconf(_SC_NPROCESSORS_ONLN);
+    info.logicalProcessors = online > 0 ? static_cast<int>(online) : 1;
+    info.physicalCores = CountPhysicalCores(info.logicalProcessors);
+    info.logicalExceedsPhysical = info.logicalProcessors > info.physicalCores;
     return info;
 }
 

@@ -24,6 +24,19 @@ struct ora_cpuinfo_x86 {
     bool osAvx = false;
 };
 
+// The words detection reads. Kept apart from the reading, so that what
+// follows from them can be tested for any processor.
+struct CpuidWords {
+    unsigned highestStandardLeaf = 0;  // leaf 0 EAX
+    unsigned leaf1Ebx = 0, leaf1Ecx = 0, leaf1Edx = 0;
+    unsigned leaf7Ebx = 0, leaf7Ecx = 0;  // subleaf 0; ignored when the highest leaf is below 7
+    unsigned long long xcr0 = 0;          // xgetbv(0); ignored without OSXSAVE
+};
+
+// The feature fields and the APIC identifier the words give, valid set;
+// counts and vendor stay at their defaults.
+ora_cpuinfo_x86 DecodeCpuid(const CpuidWords& words);
+
 // Runs cpuid/xgetbv now.
 ora_cpuinfo_x86 DetectCpu();
 

@@ -26,7 +26,8 @@ public:
               m_current(element.current.load(std::memory_order_relaxed)),
               m_target(element.target.load(std::memory_order_relaxed)),
               m_a(a),
-              m_b(b) {}
+              m_b(b),
+              m_settled(m_a * m_current + m_b * m_target == m_current) {}
         ~Cursor() {
             // Snap only far below float resolution: a ramp toward 0 never
             // reaches denormals, and no block split can change what is heard.
@@ -41,6 +42,15 @@ public:
             return m_current;
         }
 
+        // True when the recursion stands at its fixed point (a few hundred
+        // ulps short of the target, about a second after a change): every
+        // Next() of this block returns Value(), so a caller may apply it as a
+        // constant, by a vector kernel, instead of advancing per sample.
+        // Next() itself does not test it: a branch per sample costs light
+        // loops more than the recursion it saves.
+        bool IsSettled() const noexcept { return m_settled; }
+        double Value() const noexcept { return m_current; }
+
     private:
         static constexpr double kSnapDistance = 1e-30;
         Element& m_element;
@@ -48,6 +58,7 @@ public:
         const double m_target;
         const double m_a;
         const double m_b;
+        const bool m_settled;
     };
 
     SmoothedValueGroup(std::size_t elementCount, float initialValue);

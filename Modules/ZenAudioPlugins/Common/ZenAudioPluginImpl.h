@@ -176,6 +176,12 @@ protected:
     virtual void ProcessBlock(float* const* channels, std::uint32_t channelCount, std::uint32_t frames) noexcept = 0;
     virtual void ResetProcessing() {}
 
+    // For plug-ins that report bad input, which the input guard replaces
+    // before they see it: from then on, NaN and infinities met on the inputs
+    // are counted, a running total that only grows.
+    void CountNonFiniteInput() { m_countNonFinite = true; }
+    std::uint64_t NonFiniteInputSamples() const noexcept { return m_nonFiniteInput; }
+
     // Reports the latency; call from PrepareProcessing.
     void SetLatency(std::uint32_t samples) { m_latency.store(samples, std::memory_order_release); }
 
@@ -216,5 +222,7 @@ private:
     std::vector<float> m_dry;  // channel-major scratch, kMaxChannels x block size at most
 
     ora::numeric::Vec m_vec;
+    bool m_countNonFinite = false;
+    std::uint64_t m_nonFiniteInput = 0;  // audio thread
 };
 

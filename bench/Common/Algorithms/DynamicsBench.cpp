@@ -5,6 +5,7 @@
 
 #include "Common/Algorithms/BiQuad.h"
 #include "Common/Algorithms/Limiter.h"
+#include "Common/Algorithms/LinkwitzRileyCrossover.h"
 #include "Common/Algorithms/RmsCompressor.h"
 #include "Support/NoiseSource.h"
 #include "Support/Realtime.h"
@@ -58,3 +59,18 @@ static void BM_LimiterAlgorithm_Stereo48k(benchmark::State& state) {
     zenbench::ReportRealtime(state, zenbench::kBlock);
 }
 BENCHMARK(BM_LimiterAlgorithm_Stereo48k);
+
+// A stereo five-band split and its sum, the crossover alone.
+static void BM_LinkwitzRileyCrossover_FiveBands_Stereo48k(benchmark::State& state) {
+    LinkwitzRileyCrossover crossover;
+    crossover.SetChannelCount(2);
+    crossover.Prepare(static_cast<float>(zenbench::kSampleRate), zenbench::kBlock);
+    crossover.SetParameter(LinkwitzRileyCrossover::kBands, 5.0f);
+    NoiseSource input(2);
+    for (auto _ : state) {
+        crossover.Process(input.Next(), zenbench::kBlock);
+        benchmark::ClobberMemory();
+    }
+    zenbench::ReportRealtime(state, zenbench::kBlock);
+}
+BENCHMARK(BM_LinkwitzRileyCrossover_FiveBands_Stereo48k);

@@ -34,16 +34,21 @@ std::unique_ptr<Limiter> Make(const Settings& settings, std::size_t channels) {
 }
 
 // Runs in blocks of random length up to maxBlock (1: sample by sample).
+// `ceiling`: C per sample; `constant`: one C for every call.
 Channels Limit(Limiter& limiter, Channels io, std::size_t maxBlock, unsigned seed = 1,
-             const std::vector<float>* ceiling = nullptr) {
+             const std::vector<float>* ceiling = nullptr, const float* constant = nullptr) {
     std::mt19937 random(seed);
     std::uniform_int_distribution<std::size_t> length(1, maxBlock);
     std::vector<float*> pointers(io.size());
     for (std::size_t done = 0; done < io[0].size();) {
         const std::size_t n = std::min(io[0].size() - done, length(random));
         for (std::size_t c = 0; c < io.size(); ++c) pointers[c] = io[c].data() + done;
-        EXPECT_TRUE(ceiling != nullptr ? limiter.Process(pointers.data(), n, ceiling->data() + done)
-                                       : limiter.Process(pointers.data(), n));
+        if (ceiling != nullptr)
+            EXPECT_TRUE(limiter.Process(pointers.data(), n, ceiling->data() + done));
+        else if (constant != nullptr)
+            EXPECT_TRUE(limiter.Process(pointers.data(), n, *constant));
+        else
+            EXPECT_TRUE(limiter.Process(pointers.data(), n));
         done += n;
     }
     return io;
@@ -120,6 +125,15 @@ TEST(Limiter, ACeilingGivenPerSampleIsTakenWhereEachBlockIsDecided) {
     auto limiter = Make(settings, 2);
     std::size_t first = 0;
     EXPECT_EQ(CountDifferences(Limit(*limiter, input, 300, 5, &ceiling), model.Run(input), &first), 0u) << first;
+
+    // One ceiling for every call: as the parameter set to it.
+    const float constant = Limiter::CeilingGain(-4.0f);
+    auto byParameter = Make({48000.0f, -4.0f, 1.0f, true}, 2);
+    limiter->Reset();
+    EXPECT_EQ(CountDifferences(Limit(*limiter, input, 300, 5, nullptr, &constant),
+                               Limit(*byParameter, input, 300, 5), &first),
+              0u)
+        << first;
 }
 
 TEST(Limiter, SamplePeaksStayUnderTheCeilingAndTheGainUnderOne) {

@@ -223,29 +223,6 @@ TEST(LoudnessMeter, Tech3342RangesOfSteppedTones) {
     }
 }
 
-TEST(LoudnessMeter, WeighsChannelsByLayoutAndLeavesTheLfeOut) {
-    // The same tone alone on each channel of 5.1: fronts read alike, the
-    // surrounds 1.5 dB louder, the LFE not at all.
-    std::vector<double> readings;
-    for (std::size_t c = 0; c < 6; ++c) {
-        std::vector<double> levels(6, kSilence);
-        levels[c] = -20.0;
-        readings.push_back(Measured({{3.0, levels}}, 48000.0, 6)->Integrated());
-    }
-    EXPECT_NEAR(readings[1], readings[0], 1e-9);
-    EXPECT_NEAR(readings[2], readings[0], 1e-9);
-    EXPECT_EQ(readings[3], kSilence);
-    EXPECT_NEAR(readings[4] - readings[0], 10.0 * std::log10(1.41), 1e-6);
-    EXPECT_NEAR(readings[5] - readings[0], 10.0 * std::log10(1.41), 1e-6);
-    // A weight set by the owner counts at once.
-    auto meter = MakeMeter(48000.0, 6);
-    meter->SetChannelWeight(3, 1.0);
-    EXPECT_EQ(meter->GetChannelWeight(3), 1.0);
-    ToneProgram program(48000.0, 6, {{3.0, {kSilence, kSilence, kSilence, -20.0, kSilence, kSilence}}});
-    Stream(*meter, program, 4096);
-    EXPECT_NEAR(meter->Integrated(), readings[0], 1e-9);
-}
-
 TEST(LoudnessMeter, EveryReadingIsTheSameForAnyBlockSplit) {
     // Level steps and noise over 4 s of stereo, in blocks from 1 frame up,
     // with true peaks on: every reading equal, bit for bit.

@@ -207,8 +207,8 @@ TEST(zn_denoiser, SurvivesBadInput) {
     }
 }
 
-// Voice guided: in the pauses the floor outside speech holds, while the
-// speech keeps the gentler floor.
+// Voice guided: the pauses go down to the floor outside speech, while the
+// speech is treated nearly as gently as by a plain run at the speech floor.
 TEST(zn_denoiser, VoiceGuidanceSuppressesPausesHarder) {
     const std::vector<float>& clean = Phrase();
     ASSERT_FALSE(clean.empty());
@@ -219,13 +219,15 @@ TEST(zn_denoiser, VoiceGuidanceSuppressesPausesHarder) {
     s.speechFloor = 0.3f;  // 10 dB in speech
     const zentest::Denoised guided = zentest::RunDenoiser(noisy, kRate, s);
     s.voiceGuided = false;
+    s.floor = s.speechFloor;
     const zentest::Denoised plain = zentest::RunDenoiser(noisy, kRate, s);
-    // The lead and the tail are pauses.
-    const std::size_t pause = static_cast<std::size_t>(0.4 * kRate);
-    const double noiseIn = zentest::Rms(noisy, 0, pause);
-    const std::size_t end = noisy.size();
-    EXPECT_LT(zentest::ToDb(zentest::Rms(guided.output, end - pause, end) / noiseIn), -30.0);
+    // The tail is a pause.
+    const std::size_t pause = static_cast<std::size_t>(0.4 * kRate), end = noisy.size();
+    const double noiseIn = zentest::Rms(noisy, end - pause, end);
+    const double guidedPause = zentest::ToDb(zentest::Rms(guided.output, end - pause, end) / noiseIn);
+    EXPECT_LT(guidedPause, -30.0);
+    EXPECT_LT(guidedPause, zentest::ToDb(zentest::Rms(plain.output, end - pause, end) / noiseIn) - 15.0);
     const std::vector<float> speech = zentest::ApplyGains(clean, kRate, guided.gains);
     const std::vector<float> plainSpeech = zentest::ApplyGains(clean, kRate, plain.gains);
-    EXPECT_GT(zentest::SiSdrDb(speech, clean), zentest::SiSdrDb(plainSpeech, clean) + 1.0) << "speech kept more natural";
+    EXPECT_GT(zentest::SiSdrDb(speech, clean), zentest::SiSdrDb(plainSpeech, clean) - 2.0) << "speech nearly as natural";
 }

@@ -9,6 +9,9 @@ namespace nr = zen::noise_reduction;
 
 namespace {
 
+constexpr double kBinHz = 48000.0 / 1024.0;
+constexpr double kHop = 256.0 / 48000.0;
+
 // E1 by numerical integration of exp(-t)/t from v to infinity (t = v e^u).
 double E1(double v) {
     double sum = 0.0;
@@ -43,7 +46,7 @@ TEST(zn_lsa_gain, LsaGainMatchesTheExponentialIntegral) {
 TEST(zn_lsa_gain, StrongBinsPassNoiseRestsAtTheFloor) {
     constexpr std::size_t kBins = 64;
     nr::zn_lsa_gain rule;
-    ASSERT_TRUE(rule.Configure(1, kBins));
+    ASSERT_TRUE(rule.Configure(1, kBins, kBinHz, kHop));
     std::mt19937 random(3);
     std::exponential_distribution<float> periodogram(1.0f);
     std::vector<float> power(kBins), noise(kBins, 1.0f), presence(kBins, 0.0f), gain(kBins);
@@ -64,10 +67,36 @@ TEST(zn_lsa_gain, StrongBinsPassNoiseRestsAtTheFloor) {
     std::vector<float> sensitive(kBins);
     for (std::size_t k = 0; k < kBins; ++k) power[k] = 10.0f;
     nr::zn_lsa_gain a, b;
-    a.Configure(1, kBins);
-    b.Configure(1, kBins);
+    a.Configure(1, kBins, kBinHz, kHop);
+    b.Configure(1, kBins, kBinHz, kHop);
     std::fill(presence.begin(), presence.end(), 0.5f);
     a.Compute(0, power.data(), noise.data(), 1.0f, 0.01f, presence.data(), gain.data());
     b.Compute(0, power.data(), noise.data(), 4.0f, 0.01f, presence.data(), sensitive.data());
     EXPECT_LT(sensitive[5], 0.9f * gain[5]);
+}
+
+// A weak component among a voice's harmonics is taken as speech and keeps
+// the LSA gain; the same component alone, far from any, rests near the floor.
+TEST(zn_lsa_gain, WeakBinsBesideHarmonicsAreKept) {
+    constexpr std::size_t kBins = 200;
+    nr::zn_lsa_gain rule;
+    ASSERT_TRUE(rule.Configure(1, kBins, kBinHz, kHop));
+    std::mt19937 random(5);
+    std::exponential_distribution<float> periodogram(1.0f);
+    std::vector<float> power(kBins), noise(kBins, 1.0f), gain(kBins);
+    const std::size_t beside = 41, alone = 161;  // weak bins: among harmonics 30..50, and by itself
+    double besideDb = 0.0, aloneDb = 0.0;
+    for (int frame = 0; frame < 100; ++frame) {
+        for (std::size_t k = 0; k < kBins; ++k) {
+            const bool harmonic = k >= 30 && k <= 50 && k % 4 == 0;
+            const bool weak = k == beside || k == alone;
+            power[k] = (harmonic ? 100.0f : weak ? 3.0f : 1.0f) * periodogram(random);
+        }
+        rule.Compute(0, power.data(), noise.data(), 1.0f, 0.1f, nullptr, gain.data());
+        if (frame < 20) continue;
+        besideDb += 20.0 * std::log10(gain[beside]) / 80.0;
+        aloneDb += 20.0 * std::log10(gain[alone]) / 80.0;
+    }
+    EXPECT_GT(besideDb, aloneDb + 6.0) << besideDb;
+    EXPECT_LT(aloneDb, -12.0);
 }

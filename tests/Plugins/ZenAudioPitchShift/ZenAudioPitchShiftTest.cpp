@@ -146,3 +146,30 @@ TEST(ZenAudioPitchShift, NonFiniteInputIsSilenceAndTheTailFollowsTheRatio) {
     for (float y : io[0]) ASSERT_TRUE(std::isfinite(y));
     EXPECT_GT(zentest::Peak(io[0], 15000), 0.3f);
 }
+
+TEST(ZenAudioPitchShift, ClicksComeOutTheReportedLatencyLateAtEveryRate) {
+    for (float rate : {44100.0f, 96000.0f, 192000.0f}) {
+        for (float semitones : {-7.0f, 12.0f}) {
+            PluginHarness plugin = zentest::Prepared("Pitch", {{"Semitones", semitones}}, 1, rate);
+            const std::uint32_t latency = plugin.Audio().GetLatency();
+            std::vector<float> x(20000, 0.0f);
+            for (std::size_t at : {3000u, 8500u, 14200u}) x[at] = 0.8f;
+            zentest::Channels io = {x};
+            io[0].resize(x.size() + latency, 0.0f);
+            plugin.Process(io, 512);
+            io[0].erase(io[0].begin(), io[0].begin() + latency);
+            EXPECT_NEAR(zentest::EnvelopeLag(x, io[0], 64), 0.0, 1.0) << rate << " Hz, " << semitones << " semitones";
+        }
+    }
+}
+
+TEST(ZenAudioPitchShift, HugeFiniteSamplesComeOutFinite) {
+    for (float level : {1e18f, 1e19f, 3e38f}) {
+        PluginHarness plugin = zentest::Prepared("Pitch", {{"Semitones", 3.0f}}, 1);
+        auto x = zentest::Sine(300.0, kRate, 12000, 0.5);
+        for (std::size_t i = 0; i < 100; ++i) x[2000 + i] = level;
+        zentest::Channels io = {x};
+        plugin.Process(io, 512);
+        for (std::size_t i = 0; i < io[0].size(); ++i) ASSERT_TRUE(std::isfinite(io[0][i])) << level << " at " << i;
+    }
+}

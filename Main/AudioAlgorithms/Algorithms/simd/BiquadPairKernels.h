@@ -1,4 +1,5 @@
-// Inner loops of the BiquadPair family, one per form. Free of intrinsics.
+// The second-order section and the lane states shared by BiquadPair and
+// BiquadLanes. Free of intrinsics.
 #pragma once
 
 #include <cstddef>
@@ -19,19 +20,5 @@ struct BiquadPairState {
     double w1[2][kMaxLanes] = {};  // [section][lane], newest
     double w2[2][kMaxLanes] = {};
 };
-
-namespace kernels {
-
-using BiquadPairKernel = void (*)(const BiquadSection* sections, BiquadPairState& state, float* const* lanes,
-                                  std::size_t laneCount, std::size_t count);
-
-void BiquadPair_ref(const BiquadSection* sections, BiquadPairState& state, float* const* lanes, std::size_t laneCount,
-                    std::size_t count);
-void BiquadPair_m128(const BiquadSection* sections, BiquadPairState& state, float* const* lanes,
-                     std::size_t laneCount, std::size_t count);
-void BiquadPair_m256(const BiquadSection* sections, BiquadPairState& state, float* const* lanes,
-                     std::size_t laneCount, std::size_t count);
-
-}  // namespace kernels
 
 }  // namespace ora::numeric

@@ -1,10 +1,10 @@
-// The filter loops of the vector forms, written once over a vector type V
-// (VecM128, VecM128Fma, VecM256, VecM256Fma). Free of intrinsics: each form's
-// source includes its own V and instantiates these templates, so every
-// instantiation has internal linkage and is compiled for that form's
-// instruction set only.
+// The filter and correlation loops of the vector forms, written once over a
+// vector type V (VecM128, VecM128Fma, VecM256, VecM256Fma). Free of
+// intrinsics: each form's source includes its own V and instantiates these
+// templates, so every instantiation has internal linkage and is compiled for
+// that form's instruction set only.
 //
-// Every loop sums in the order of the reference loop (tap by tap, starting
+// Every loop sums in the order of the reference loop (term by term, starting
 // from zero), so that the plain forms give the reference result bit for bit.
 #pragma once
 
@@ -169,6 +169,51 @@ void UpsampleTruePeak(const float* run, const float* phases, std::size_t taps, f
             for (std::size_t j = 0; j < taps; ++j) acc = V::MulAddScalar(phases[p * taps + j], run[n + j], acc);
             out[4 * n + 1 + p] = acc;
         }
+    }
+}
+
+// G vectors of lags from `first` on. Each x[n] broadcast once feeds them all
+// while every lane has the term; then each vector goes on alone while all of
+// its lanes have it, and each lane adds the few terms only its lag has, in
+// the same order.
+template <class V, std::size_t G>
+void AutoCorrelateLags(const float* x, std::size_t frames, float* r, std::size_t first) {
+    constexpr std::size_t W = V::kWidth;
+    // Terms n < Common(lag) exist for every lane of the vector of lags from `lag`.
+    const auto common = [frames](std::size_t lastLag) { return frames > lastLag ? frames - lastLag : 0; };
+    const std::size_t shared = common(first + G * W - 1);
+    typename V::T acc[G];
+    for (std::size_t g = 0; g < G; ++g) acc[g] = V::Zero();
+    for (std::size_t n = 0; n < shared; ++n) {
+        const typename V::T xn = V::Set1(x[n]);
+        for (std::size_t g = 0; g < G; ++g) acc[g] = V::MulAdd(xn, V::Load(x + n + first + g * W), acc[g]);
+    }
+    for (std::size_t g = 0; g < G; ++g) {
+        const std::size_t lag = first + g * W, own = common(lag + W - 1);
+        for (std::size_t n = shared; n < own; ++n) acc[g] = V::MulAdd(V::Set1(x[n]), V::Load(x + n + lag), acc[g]);
+        V::Store(r + lag, acc[g]);
+        for (std::size_t j = 0; j < W; ++j) {
+            float sum = r[lag + j];
+            for (std::size_t n = own; n + lag + j < frames; ++n) sum = V::MulAddScalar(x[n], x[n + lag + j], sum);
+            r[lag + j] = sum;
+        }
+    }
+}
+
+// r[k] = sum_{n < frames - k} x[n] x[n + k] for k < lags, summed in n order.
+template <class V>
+void AutoCorrelate(const float* x, std::size_t frames, float* r, std::size_t lags) {
+    constexpr std::size_t W = V::kWidth;
+    std::size_t k = 0;
+    // Eight vectors of lags at once keep both multiply-add units busy; short
+    // lag counts (linear prediction) still take two.
+    for (; k + 8 * W <= lags; k += 8 * W) AutoCorrelateLags<V, 8>(x, frames, r, k);
+    for (; k + 2 * W <= lags; k += 2 * W) AutoCorrelateLags<V, 2>(x, frames, r, k);
+    for (; k + W <= lags; k += W) AutoCorrelateLags<V, 1>(x, frames, r, k);
+    for (; k < lags; ++k) {
+        float sum = 0.0f;
+        for (std::size_t n = 0; n + k < frames; ++n) sum = V::MulAddScalar(x[n], x[n + k], sum);
+        r[k] = sum;
     }
 }
 

@@ -1,6 +1,19 @@
 #include "FFT/Plugins/Dft2Out.h"
 
+#include "FFT/PhaseMath.h"
+
 namespace ora::fft {
+
+namespace {
+
+// out += a * b * scale
+void AddProduct(const float* a, const float* b, float scale, float* out, std::size_t n) noexcept {
+    std::size_t j = 0;
+    for (; j + 4 <= n; j += 4) Store4(out + j, Load4(out + j) + Load4(a + j) * scale * Load4(b + j));
+    for (; j < n; ++j) out[j] += a[j] * scale * b[j];
+}
+
+}  // namespace
 
 bool Dft2Out::Configure(Frame& frame, const Context& context) {
     return frame.RequireVector(variable::TSIG, type::SIG_REAL_VECTOR, context.channels, context.fftLength) &&
@@ -20,8 +33,8 @@ void Dft2Out::Process(Frame& frame, Context& context) noexcept {
         float* t = tsig + c * m;
         context.fft->InverseReal(fsig + c * context.bins, t);
         float* out = (*context.out)[c].data();
-        for (std::size_t j = 0; j < half; ++j) out[j] += t[j + m - half] * scale * dual[j];
-        for (std::size_t j = half; j < n; ++j) out[j] += t[j - half] * scale * dual[j];
+        AddProduct(t + (m - half), dual, scale, out, half);
+        AddProduct(t, dual + half, scale, out + half, n - half);
     }
 }
 

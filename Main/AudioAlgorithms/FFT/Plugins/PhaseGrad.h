@@ -3,22 +3,30 @@
 //   TGRAD        time derivative (instantaneous frequency, rad/sample) to
 //                advance a bin's phase from the previous frame to this one;
 //   FGRAD_RIGHT  phase step from bin k to k + 1 (rad), FGRAD_LEFT from k - 1
-//                to k, FGRAD their mean;
+//                to k;
 //   MAG_LOG      the natural log of the magnitude.
-// Two estimates:
-//   PG  from magnitudes alone, through the relations that hold for a
+// The time derivative has two estimates:
+//   PG  from magnitudes alone, through the relation that holds for a
 //       Gaussian window (the Hann window is treated as the Gaussian of
 //       lambda = 0.25645 N^2): needs no trustworthy phase history, so it
 //       copes with onsets and non-stationary frames;
-//   PV  from analysis phase differences, between frames for TGRAD and
-//       between bins for the frequency steps: exact for steady partials.
-// "Auto" takes its frequency steps from this frame's phases (they need no
-// history) and its time derivative from the phase history, except where
-// more than a quarter of the frame's energy is new (positive spectral flux
-// against the previous frame: onsets, noise), where the previous frame's
-// phases say nothing about this one and the magnitudes are used. When the
-// analysis hop equals the synthesis hop nothing is stretched and PV gives
-// back the input exactly, so "Auto" stays with PV.
+//   PV  from analysis phase differences between frames: exact for steady
+//       partials.
+// "Auto" takes the phase history, except where more than a quarter of the
+// frame's energy is new (positive spectral flux against the previous frame:
+// onsets, noise), where the previous frame's phases say nothing about this
+// one and the magnitudes are used. When the analysis hop equals the
+// synthesis hop nothing is stretched and PV gives back the input exactly,
+// so "Auto" stays with PV.
+//
+// The frequency steps need no history: they are this frame's own phase
+// differences, with the time at which each bin's energy sits in the frame
+// (from In2Dft's time-weighted transform) moved to where that time belongs
+// in the synthesis (the context's time map, or the stretch times it): an
+// event a time d from an analysis centre belongs a stretch times d from the
+// synthesis centre, or it would land off its place in the stretched stream
+// by the share of d the stretch adds or removes. Phase steps of pi between
+// side lobes carry no time and stay as they are.
 // MASK holds one bit per row: set when that row's time derivative came from
 // the magnitudes in this frame.
 #pragma once
@@ -48,15 +56,22 @@ public:
     Mode GetMode() const { return m_mode; }
 
 private:
-    bool UsePg(std::size_t row, const float* mag2, std::size_t analysisHop, std::size_t synthesisHop) const noexcept;
+    bool UsePg(std::size_t row, const float* mag2, const Context& context) const noexcept;
+    // Per bin: how far the time its energy sits at from the frame's centre
+    // moves in the synthesis (the shift the frequency steps add), and the
+    // trust in it (the magnitude; 0 for bins too weak to tell).
+    void StretchShift(const Frame& frame, const Context& context, std::size_t row, float* shift,
+                      float* weight) noexcept;
 
     Mode m_mode = Mode::Auto;
     std::size_t m_bins = 0;
-    AlignedBuffer<float> m_prevLog;
     AlignedBuffer<float> m_prevPhase;
     AlignedBuffer<float> m_prevMag2;
     AlignedBuffer<float> m_prevPgTgrad;
-    AlignedBuffer<float> m_fgrad;  // PG frequency derivative of one row
+    AlignedBuffer<float> m_shift;  // of one row
+    AlignedBuffer<float> m_weight;  // of one row
+    AlignedBuffer<float> m_pgNow;   // of one row
+    AlignedBuffer<float> m_advance;  // a steady partial's phase advance over the hop, per bin
     std::vector<std::uint8_t> m_hasPrev;
 };
 

@@ -9,13 +9,21 @@ namespace ora::fft {
 
 bool Plpv::Configure(Frame& frame, const Context& context) {
     m_bins = context.bins;
-    m_candidates.assign(context.bins, 0);
+    m_candidates.assign(context.bins + 4, 0);
+    // Room for reading four past the end, kept below any magnitude.
+    m_padded.Resize(context.bins + 8);
+    std::fill(m_padded.begin(), m_padded.end(), -1.0f);
     m_peaks.reserve(kPeakCapacity);
     m_peakPhase.assign(kPeakCapacity, 0.0f);
-    for (variable v : {variable::SFEAT, variable::PHASE_IN, variable::TGRAD, variable::PHASE_START})
+    m_steps.assign(context.bins, 0.0);
+    m_prevMag.Resize(context.bins * context.rows);
+    for (variable v : {variable::SFEAT, variable::PHASE_IN, variable::TGRAD, variable::FGRAD_RIGHT,
+                       variable::PHASE_START})
         if (!frame.RequireVector(v, type::FREQ_REAL_VECTOR, context.rows, context.bins)) return false;
     return true;
 }
+
+void Plpv::Reset() noexcept { m_prevMag.Clear(); }
 
 void Plpv::SetLog10Threshold(float log10Eps) { m_threshold = std::pow(10.0f, log10Eps); }
 
@@ -25,17 +33,20 @@ std::size_t Plpv::FindPeaks(const float* mag) noexcept {
     const std::size_t bins = m_bins;
     const float eps = m_threshold * *std::max_element(mag, mag + bins);
     m_eps = eps;
+    // A local maximum over two bins each side (a Hann main lobe's width):
+    // above those below it, not below those above. Two bins of -1 each side
+    // stand for the ends.
+    float* padded = m_padded.data();
+    std::copy(mag, mag + bins, padded + 2);
     std::size_t count = 0;
-    for (std::size_t k = 0; k < bins; ++k) {
-        const float v = mag[k];
-        if (!(v > eps)) continue;
-        // A local maximum over two bins each side (a Hann main lobe's width).
-        bool peak = true;
-        for (std::size_t d = 1; d <= 2 && peak; ++d) {
-            if (k >= d && !(v > mag[k - d])) peak = false;
-            if (k + d < bins && v < mag[k + d]) peak = false;
+    for (std::size_t k = 0; k < bins; k += 4) {
+        const Float4 v = Load4(padded + k + 2);
+        const Int4 peak = (v > eps) & (v > Load4(padded + k + 1)) & (v > Load4(padded + k)) &
+                          (v >= Load4(padded + k + 3)) & (v >= Load4(padded + k + 4));
+        for (std::size_t i = 0; i < 4; ++i) {
+            m_candidates[count] = static_cast<std::int32_t>(k + i);
+            count += peak[i] != 0 && k + i < bins ? 1 : 0;
         }
-        if (peak) m_candidates[count++] = static_cast<std::int32_t>(k);
     }
     const auto begin = m_candidates.begin();
     if (count > m_maxPeaks) {
@@ -49,17 +60,30 @@ std::size_t Plpv::FindPeaks(const float* mag) noexcept {
     return count;
 }
 
-void Plpv::ProcessRow(const float* mag, const float* phase, const float* tgrad, float* psi, double hop) noexcept {
+void Plpv::ProcessRow(const float* mag, const float* phase, const float* tgrad, const float* right, float* psi,
+                      float* prevMag, double hop) noexcept {
     const std::size_t bins = m_bins;
     const std::size_t count = FindPeaks(mag);
+    // Phase of any bin relative to any other along the frame's steps.
+    m_steps[0] = 0.0;
+    for (std::size_t k = 1; k < bins; ++k) m_steps[k] = m_steps[k - 1] + right[k - 1];
     if (count == 0) {
-        std::copy(phase, phase + bins, psi);
+        for (std::size_t k = 0; k < bins; ++k) psi[k] = static_cast<float>(Princarg(phase[0] + m_steps[k]));
+        std::copy(mag, mag + bins, prevMag);
         return;
     }
     // Every peak's new phase first: the update below overwrites the previous ones.
+    std::size_t strongest = 0;
     for (std::size_t i = 0; i < count; ++i) {
         const auto p = static_cast<std::size_t>(m_peaks[i]);
         m_peakPhase[i] = static_cast<float>(Princarg(psi[p] + hop * tgrad[p]));
+        if (mag[p] > mag[m_peaks[strongest]]) strongest = i;
+    }
+    const double reference = m_peakPhase[strongest] - m_steps[static_cast<std::size_t>(m_peaks[strongest])];
+    for (std::size_t i = 0; i < count; ++i) {
+        const auto p = static_cast<std::size_t>(m_peaks[i]);
+        if (i != strongest && mag[p] > kNewPeakRise * prevMag[p])
+            m_peakPhase[i] = static_cast<float>(Princarg(reference + m_steps[p]));
     }
     std::size_t start = 0;
     for (std::size_t i = 0; i < count; ++i) {
@@ -72,11 +96,12 @@ void Plpv::ProcessRow(const float* mag, const float* phase, const float* tgrad, 
                 if (mag[k] < mag[end]) end = k;
             end = std::max(end, p + 1);
         }
-        const double offset = static_cast<double>(m_peakPhase[i]) - phase[p];
+        const double offset = m_peakPhase[i] - m_steps[p];
         for (std::size_t k = start; k < end; ++k)
-            psi[k] = mag[k] > m_eps ? static_cast<float>(Princarg(offset + phase[k])) : phase[k];
+            psi[k] = mag[k] > m_eps ? static_cast<float>(Princarg(offset + m_steps[k])) : phase[k];
         start = end;
     }
+    std::copy(mag, mag + bins, prevMag);
 }
 
 void Plpv::Process(Frame& frame, Context& context) noexcept {
@@ -84,16 +109,19 @@ void Plpv::Process(Frame& frame, Context& context) noexcept {
     const float* mag = frame.Real(variable::SFEAT, type::FREQ_REAL_VECTOR);
     const float* phase = frame.Real(variable::PHASE_IN, type::FREQ_REAL_VECTOR);
     const float* tgrad = frame.Real(variable::TGRAD, type::FREQ_REAL_VECTOR);
+    const float* right = frame.Real(variable::FGRAD_RIGHT, type::FREQ_REAL_VECTOR);
     float* psi = frame.Real(variable::PHASE_START, type::FREQ_REAL_VECTOR);
-    if (!mag || !phase || !tgrad || !psi) return;
+    if (!mag || !phase || !tgrad || !right || !psi) return;
     const std::size_t bins = context.bins;
     for (std::size_t r = context.FirstReconstructedRow(); r < context.EndReconstructedRow(); ++r) {
         const std::size_t o = r * bins;
         if (context.frameIndex == 0) {
             std::copy(phase + o, phase + o + bins, psi + o);
+            std::copy(mag + o, mag + o + bins, m_prevMag.data() + o);
             continue;
         }
-        ProcessRow(mag + o, phase + o, tgrad + o, psi + o, static_cast<double>(context.synthesisHop));
+        ProcessRow(mag + o, phase + o, tgrad + o, right + o, psi + o, m_prevMag.data() + o,
+                   static_cast<double>(context.synthesisHop));
     }
 }
 

@@ -7,107 +7,93 @@
 
 namespace ora::fft {
 
+namespace {
+// Queue values: the bin, and whether the entry stands for the previous frame.
+std::int32_t Current(std::size_t bin) { return static_cast<std::int32_t>(2 * bin); }
+std::int32_t Previous(std::size_t bin) { return static_cast<std::int32_t>(2 * bin + 1); }
+}  // namespace
+
 bool RtPghi::Configure(Frame& frame, const Context& context) {
     m_bins = context.bins;
-    m_heap.assign(2 * context.bins + 2, Entry{0.0f, 0, false});
-    m_order.assign(context.bins, 0);
+    m_queue.Configure(2 * context.bins);
+    m_fresh.Configure(context.bins);
     m_done.assign(context.bins, 0);
     m_prevMag.Resize(context.rows * context.bins);
+    m_prevLargest.assign(context.rows, 0.0f);
     for (variable v : {variable::SFEAT, variable::PHASE_IN, variable::TGRAD, variable::FGRAD_LEFT,
                        variable::FGRAD_RIGHT, variable::PHASE_START})
         if (!frame.RequireVector(v, type::FREQ_REAL_VECTOR, context.rows, context.bins)) return false;
     return true;
 }
 
-void RtPghi::Reset() noexcept { m_prevMag.Clear(); }
+void RtPghi::Reset() noexcept {
+    m_prevMag.Clear();
+    std::fill(m_prevLargest.begin(), m_prevLargest.end(), 0.0f);
+}
 
 void RtPghi::SetLog10Tolerance(float log10Tol) { m_tolerance = std::pow(10.0f, log10Tol); }
-
-void RtPghi::HeapPush(Entry e) noexcept {
-    std::size_t i = m_heapSize++;
-    while (i > 0) {
-        const std::size_t parent = (i - 1) / 2;
-        if (!(m_heap[parent].magnitude < e.magnitude)) break;
-        m_heap[i] = m_heap[parent];
-        i = parent;
-    }
-    m_heap[i] = e;
-}
-
-RtPghi::Entry RtPghi::HeapPop() noexcept {
-    const Entry top = m_heap[0];
-    const Entry last = m_heap[--m_heapSize];
-    std::size_t i = 0;
-    for (;;) {
-        std::size_t child = 2 * i + 1;
-        if (child >= m_heapSize) break;
-        if (child + 1 < m_heapSize && m_heap[child].magnitude < m_heap[child + 1].magnitude) ++child;
-        if (!(last.magnitude < m_heap[child].magnitude)) break;
-        m_heap[i] = m_heap[child];
-        i = child;
-    }
-    m_heap[i] = last;
-    return top;
-}
 
 void RtPghi::ProcessRow(std::size_t row, const float* mag, const float* phase, const float* tgrad, const float* left,
                         const float* right, float* psi, double hop) noexcept {
     const std::size_t bins = m_bins;
     float* prevMag = m_prevMag.data() + row * bins;
-    const float tol = m_tolerance * *std::max_element(mag, mag + bins);
+    const float largest = *std::max_element(mag, mag + bins);
+    const float tol = m_tolerance * largest;
 
+    m_queue.Start(std::max(largest, m_prevLargest[row]));
     std::size_t remaining = 0;
-    m_heapSize = 0;
     for (std::size_t k = 0; k < bins; ++k) {
-        if (mag[k] > tol) {
-            m_done[k] = 0;
-            m_order[remaining++] = static_cast<std::int32_t>(k);
-            if (prevMag[k] > tol) HeapPush({prevMag[k], static_cast<std::int32_t>(k), true});
-        } else {
-            m_done[k] = 1;
-        }
+        const bool significant = mag[k] > tol;
+        m_done[k] = significant ? 0 : 1;
+        remaining += significant ? 1 : 0;
+        if (significant && prevMag[k] > tol) m_queue.Push(prevMag[k], Previous(k));
     }
-    std::sort(m_order.begin(), m_order.begin() + static_cast<std::ptrdiff_t>(remaining),
-              [mag](std::int32_t a, std::int32_t b) { return mag[a] > mag[b]; });
-    const std::size_t significant = remaining;
-    std::size_t next = 0;  // strongest coefficient not reached yet, for fresh starts
+    bool freshReady = false;
 
     while (remaining > 0) {
-        if (m_heapSize == 0) {
-            while (next < significant && m_done[static_cast<std::size_t>(m_order[next])]) ++next;
-            const auto k = static_cast<std::size_t>(m_order[next]);
+        if (m_queue.Empty()) {
+            // Nothing leads into what is left: start from its strongest.
+            if (!freshReady) {
+                m_fresh.Start(largest);
+                for (std::size_t k = 0; k < bins; ++k)
+                    if (!m_done[k]) m_fresh.Push(mag[k], static_cast<std::int32_t>(k));
+                freshReady = true;
+            }
+            auto k = static_cast<std::size_t>(m_fresh.Pop());
+            while (m_done[k]) k = static_cast<std::size_t>(m_fresh.Pop());
             psi[k] = phase[k];
             m_done[k] = 1;
             --remaining;
-            HeapPush({mag[k], static_cast<std::int32_t>(k), false});
+            m_queue.Push(mag[k], Current(k));
             continue;
         }
-        const Entry e = HeapPop();
-        const auto k = static_cast<std::size_t>(e.bin);
-        if (e.previous) {
+        const std::int32_t entry = m_queue.Pop();
+        const auto k = static_cast<std::size_t>(entry / 2);
+        if (entry % 2 != 0) {
             if (m_done[k]) continue;
             psi[k] = static_cast<float>(Princarg(psi[k] + hop * tgrad[k]));
             m_done[k] = 1;
             --remaining;
-            HeapPush({mag[k], e.bin, false});
+            m_queue.Push(mag[k], Current(k));
             continue;
         }
         if (k + 1 < bins && !m_done[k + 1]) {
             psi[k + 1] = static_cast<float>(Princarg(static_cast<double>(psi[k]) + right[k]));
             m_done[k + 1] = 1;
             --remaining;
-            HeapPush({mag[k + 1], e.bin + 1, false});
+            m_queue.Push(mag[k + 1], Current(k + 1));
         }
         if (k > 0 && !m_done[k - 1]) {
             psi[k - 1] = static_cast<float>(Princarg(static_cast<double>(psi[k]) - left[k]));
             m_done[k - 1] = 1;
             --remaining;
-            HeapPush({mag[k - 1], e.bin - 1, false});
+            m_queue.Push(mag[k - 1], Current(k - 1));
         }
     }
     for (std::size_t k = 0; k < bins; ++k)
         if (!(mag[k] > tol)) psi[k] = phase[k];
     std::copy(mag, mag + bins, prevMag);
+    m_prevLargest[row] = largest;
 }
 
 void RtPghi::Process(Frame& frame, Context& context) noexcept {
@@ -125,6 +111,7 @@ void RtPghi::Process(Frame& frame, Context& context) noexcept {
         if (context.frameIndex == 0) {
             std::copy(phase + o, phase + o + bins, psi + o);
             std::copy(mag + o, mag + o + bins, m_prevMag.data() + o);
+            m_prevLargest[r] = *std::max_element(mag + o, mag + o + bins);
             continue;
         }
         ProcessRow(r, mag + o, phase + o, tgrad + o, left + o, right + o, psi + o,

@@ -146,25 +146,43 @@ void Limiter::ApplyGain(float* const* channels, std::uint64_t channelCount, std:
                         std::uint64_t frames) noexcept {
     float g = m_gain;
     const float target = m_target;
-    for (std::uint64_t i = 0; i < frames; ++i) {
+    for (std::uint64_t i = 0; i < frames;) {
         if (g > target) {
             g = target;  // instant attack
         } else if (m_hold > 0) {
-            --m_hold;
+            // g stays for the whole hold, and so stays under the target.
+            const std::uint64_t run = std::min<std::uint64_t>(m_hold, frames - i);
+            std::fill_n(m_gains.begin() + static_cast<std::ptrdiff_t>(i), run, g);
+            m_hold -= run;
+            i += run;
+            continue;
         } else {
-            g = m_releaseGain * target + m_releaseCoeff * g;
+            const float next = std::min(m_releaseGain * target + m_releaseCoeff * g, 1.0f);
+            if (next == g) {  // the release's fixed point: g stays for the rest
+                std::fill_n(m_gains.begin() + static_cast<std::ptrdiff_t>(i), frames - i, g);
+                break;
+            }
+            g = next;
         }
         g = std::min(g, 1.0f);
-        m_gains[i] = g;
+        m_gains[i++] = g;
     }
     m_gain = g;
     for (std::uint64_t c = 0; c < channelCount; ++c)
         m_vec.Multiply(channels[c] + offset, m_gains.data(), channels[c] + offset, frames);
 }
 
-bool Limiter::Process(float* const* channels, std::uint64_t count) { return Process(channels, count, nullptr); }
+bool Limiter::Process(float* const* channels, std::uint64_t count) { return Run(channels, count, &m_ceiling, 0); }
 
 bool Limiter::Process(float* const* channels, std::uint64_t count, const float* ceiling) noexcept {
+    return Run(channels, count, ceiling, 1);
+}
+
+bool Limiter::Process(float* const* channels, std::uint64_t count, float ceiling) noexcept {
+    return Run(channels, count, &ceiling, 0);
+}
+
+bool Limiter::Run(float* const* channels, std::uint64_t count, const float* ceiling, std::uint64_t stride) noexcept {
     const std::uint64_t channelCount = GetChannelCount();
     if (channelCount > kMaxChannels) return false;
     std::fill(m_callInputPeak.begin(), m_callInputPeak.end(), 0.0f);
@@ -195,7 +213,7 @@ bool Limiter::Process(float* const* channels, std::uint64_t count, const float* 
             }
         }
         if (m_position == m_blockLength) {
-            FinishBlock(channelCount, ceiling != nullptr ? ceiling[done - 1] : m_ceiling);
+            FinishBlock(channelCount, ceiling[(done - 1) * stride]);
             m_position = 0;
         }
     }

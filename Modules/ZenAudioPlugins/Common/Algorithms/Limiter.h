@@ -75,8 +75,10 @@ public:
     // False, buffers untouched, for more than kMaxChannels channels.
     bool Process(float* const* channels, std::uint64_t count) override;
     // As Process, with the ceiling C (linear) given per sample by an owner
-    // that smooths it; the "Ceiling" parameter is then not used.
+    // that smooths it, or one for the whole call once it has settled; the
+    // "Ceiling" parameter is then not used.
     bool Process(float* const* channels, std::uint64_t count, const float* ceiling) noexcept;
+    bool Process(float* const* channels, std::uint64_t count, float ceiling) noexcept;
     float GetMeter(std::uint64_t index) const override;
 
     // Samples, at the prepared rate.
@@ -94,6 +96,8 @@ public:
 
 private:
     void Dimension();
+    // C of sample i is ceiling[i * stride].
+    bool Run(float* const* channels, std::uint64_t count, const float* ceiling, std::uint64_t stride) noexcept;
     void SetRelease(float milliseconds);
     // The block whose true peak is now complete: its soft stage and target gain.
     void FinishBlock(std::uint64_t channelCount, float ceiling) noexcept;

@@ -56,6 +56,8 @@ public:
     const float* Bands(std::size_t row) const { return m_bands.data() + row * zen::OctaveBands::kBands; }
     // Frames analysed since the reset.
     std::uint64_t Frames() const { return m_frames; }
+    // Samples to go until the next frame is analysed.
+    std::size_t UntilFrame() const { return m_untilFrame; }
 
 private:
     // New coefficients; `reshaped` (size, window or rows) also a new window

@@ -18,7 +18,7 @@ bool zn_denoise_frame::Configure(ora::fft::Frame& frame, const ora::fft::Context
     for (std::size_t n = 0; n < context.frameLength; ++n) windowEnergy += static_cast<double>(window[n]) * window[n];
     if (!frame.RequireVector(ora::fft::variable::FSIG, ora::fft::type::FREQ_CPLX_VECTOR, channels, bins) ||
         !m_tracker.Configure(channels, bins, hopSeconds) ||
-        !m_profile.Configure(channels, bins, m_sampleRate, windowEnergy) || !m_gain.Configure(channels, bins) ||
+        !m_profile.Configure(channels, bins, m_sampleRate, windowEnergy) || !m_gain.Configure(channels, bins, m_sampleRate / static_cast<double>(context.fftLength), hopSeconds) ||
         !m_smoother.Configure(channels, bins, m_sampleRate, hopSeconds))
         return false;
     try {
@@ -99,14 +99,16 @@ void zn_denoise_frame::Process(ora::fft::Frame& frame, ora::fft::Context& contex
             power[k] = x[k].real() * x[k].real() + x[k].imag() * x[k].imag();
             total += power[k];
         }
+        // The estimates of the frames before this one: a frame is no
+        // measure of its own noise.
+        const float* noise = learned ? m_profile.Power(c) : m_tracker.Noise(c);
+        m_gain.Compute(c, power, noise, overSubtraction, floor, m_tracker.Presence(c), gain);
         // Frames that begin before the stream does hold leading silence,
         // which is no measure of the noise.
         if (context.analysisStart >= 0) {
             if (s.learning) m_profile.Learn(c, power);
             m_tracker.Update(c, power, voice);
         }
-        const float* noise = learned ? m_profile.Power(c) : m_tracker.Noise(c);
-        m_gain.Compute(c, power, noise, overSubtraction, floor, m_tracker.Presence(c), gain);
         m_smoother.Process(c, gain, floor);
         double kept = 0.0;
         for (std::size_t k = 0; k < m_bins; ++k) {

@@ -14,10 +14,11 @@ struct zn_denoise_settings {
     // when voice guided (the floor moves between the two with the voice
     // probability).
     float speechFloor = 0.25f;
-    // Factor on the noise estimate (the sensitivity), linear power. Half the
-    // estimate by default: the tracker runs a little high under speech, and
-    // speech suffers more from a high estimate than noise from a low one.
-    float overSubtraction = 0.5f;
+    // Factor on the noise the suppression gain sees where speech is present
+    // (the sensitivity), linear power; presence itself is decided on the
+    // estimate as it is. Below 1 by default (-5 dB): the voice masks what
+    // noise is left beside it, and keeps its shape.
+    float overSubtraction = 0.3f;
     // Musical-noise control, 0..1.
     float smoothing = 0.5f;
     // Share of the suppression applied, 0..1 (0 passes the input through).

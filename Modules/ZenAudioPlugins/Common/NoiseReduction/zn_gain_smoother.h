@@ -17,8 +17,8 @@ namespace zen::noise_reduction {
 
 class zn_gain_smoother {
 public:
-    static constexpr double kMaxOctaves = 1.0 / 3.0;     // band width at amount 1
-    static constexpr double kMaxTimeSeconds = 0.01;      // time constant at amount 1 (longer blurs onsets)
+    static constexpr double kMaxOctaves = 1.0 / 6.0;     // band width at amount 1 (wider thins the voice)
+    static constexpr double kMaxTimeSeconds = 0.005;     // time constant at amount 1 (longer blurs onsets)
     static constexpr double kLowestSmoothedHz = 300.0;   // below, bins stay apart (harmonics of voices)
 
     bool Configure(std::size_t channels, std::size_t bins, double sampleRate, double hopSeconds);

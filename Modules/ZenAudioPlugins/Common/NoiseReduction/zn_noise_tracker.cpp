@@ -29,6 +29,7 @@ bool zn_noise_tracker::Configure(std::size_t channels, std::size_t bins, double 
         m_presence.Resize(n);
         m_frequencySmoothed.Resize(bins);
         m_frames.Resize(channels);
+        m_age.Resize(channels);
     } catch (const std::bad_alloc&) {
         return false;
     }
@@ -39,6 +40,7 @@ bool zn_noise_tracker::Configure(std::size_t channels, std::size_t bins, double 
     m_alphaP = Coefficient(kPresenceSmoothingSeconds, hopSeconds);
     m_subWindow = static_cast<std::uint32_t>(
         std::max(1.0, std::round(kMinimumWindowSeconds / kSubWindows / hopSeconds)));
+    m_warmUp = static_cast<std::uint32_t>(std::max(1.0, std::round(kWarmUpSeconds / hopSeconds)));
     Reset();
     return true;
 }
@@ -52,6 +54,7 @@ void zn_noise_tracker::Reset() noexcept {
     m_noise.Clear();
     m_presence.Clear();
     m_frames.Clear();
+    m_age.Clear();
 }
 
 void zn_noise_tracker::Update(std::size_t channel, const float* power, float voice) noexcept {
@@ -72,12 +75,18 @@ void zn_noise_tracker::Update(std::size_t channel, const float* power, float voi
     sf[bins - 1] = 0.5f * (power[bins - 2] + power[bins - 1]);
 
     std::uint32_t& frames = m_frames[channel];
+    std::uint32_t& age = m_age[channel];
     float* parts = m_parts.data() + offset * kSubWindows;
-    if (frames == 0) {
+    if (age < m_warmUp) {
+        // The plain mean of the frames so far; the minima start from a
+        // settled smoothed power rather than from one frame's chance low.
+        const float share = 1.0f / static_cast<float>(++age);
+        const float as = frames == 0 ? 0.0f : m_alphaS;
         for (std::size_t k = 0; k < bins; ++k) {
-            s[k] = smin[k] = stmp[k] = std::max(sf[k], kPowerFloor);
+            s[k] = std::max(as * s[k] + (1.0f - as) * sf[k], kPowerFloor);
+            smin[k] = stmp[k] = s[k];
             for (std::uint32_t u = 0; u < kSubWindows; ++u) parts[u * bins + k] = s[k];
-            noise[k] = std::max(power[k], kPowerFloor);
+            noise[k] = std::max(noise[k] + share * (power[k] - noise[k]), kPowerFloor);
             p[k] = 0.0f;
         }
     } else {
@@ -88,8 +97,10 @@ void zn_noise_tracker::Update(std::size_t channel, const float* power, float voi
             stmp[k] = std::min(stmp[k], s[k]);
             const float indicator = s[k] > kPresenceRatio * smin[k] ? voice : 0.0f;
             p[k] = ap * p[k] + (1.0f - ap) * indicator;
-            const float a = ad + (1.0f - ad) * p[k];
-            noise[k] = std::max(std::min(a * noise[k] + (1.0f - a) * power[k], kFollowDown * s[k]), kPowerFloor);
+            const float held = power[k] > kSpeechGate * noise[k] ? voice : p[k];
+            const float a = ad + (1.0f - ad) * std::max(p[k], held);
+            const float averaged = std::min(a * noise[k] + (1.0f - a) * power[k], kFollowDown * s[k]);
+            noise[k] = std::max(std::max(averaged, kMinimumShare * smin[k]), kPowerFloor);
         }
     }
     if (++frames > m_subWindow) {

@@ -2,13 +2,18 @@
 // each bin's power is smoothed over time and frequency, its minimum over a
 // sliding window tracked (kept as the minima of kSubWindows parts, so that
 // the window slides by a part rather than jumping by a whole window), and
-// where the smoothed power stands well above
-// that minimum speech is taken to be present. The noise estimate averages
-// the periodogram recursively, more slowly the likelier speech is, so it
-// follows a changing noise floor in speech pauses and holds during speech.
+// where the smoothed power stands well above that minimum speech is taken
+// to be present. The noise estimate averages the periodogram recursively,
+// more slowly the likelier speech is, so it follows a changing noise floor
+// in speech pauses and holds during speech.
 //
+// A bin whose periodogram stands far above the estimate (kSpeechGate) is
+// left out of the average at once: the smoothed presence alone reacts too
+// late to keep the first frames of a word out, and what leaks in is speech
+// suppressed later. The window's minimum bounds the estimate from below, so
+// a noise floor that rises past the gate is followed within a window.
 // Where the smoothed power falls below the estimate, the estimate follows it
-// down at once.
+// down at once. The first kWarmUpSeconds simply average the periodogram.
 //
 // An owner with a voice-activity decision scales the presence by it: a
 // frame outside speech (voice 0) updates every bin as noise.
@@ -35,6 +40,13 @@ public:
     // The noise never stands above the smoothed power by more than this: a
     // floor that fell (or a loud passage learnt as noise) is followed at once.
     static constexpr float kFollowDown = 2.0f;
+    // A periodogram this far above the estimate is taken for speech: noise
+    // alone exceeds 4.6 times its mean in 1 % of the bins.
+    static constexpr float kSpeechGate = 4.6f;
+    // The estimate never falls below this share of the window's minimum (the
+    // minimum of noise alone runs about 2 dB below its mean).
+    static constexpr float kMinimumShare = 0.5f;
+    static constexpr double kWarmUpSeconds = 0.25;
 
     bool Configure(std::size_t channels, std::size_t bins, double hopSeconds);
     void Reset() noexcept;
@@ -55,6 +67,7 @@ private:
     float m_alphaD = 0.0f;
     float m_alphaP = 0.0f;
     std::uint32_t m_subWindow = 1;            // frames per part of the minimum window
+    std::uint32_t m_warmUp = 1;               // frames averaged plainly after Reset
     ora::AlignedBuffer<float> m_smoothed;     // S
     ora::AlignedBuffer<float> m_minimum;      // Smin
     ora::AlignedBuffer<float> m_running;      // the minimum of the part under way
@@ -63,7 +76,8 @@ private:
     ora::AlignedBuffer<float> m_noise;        // lambda
     ora::AlignedBuffer<float> m_presence;     // p
     ora::AlignedBuffer<float> m_frequencySmoothed;
-    ora::AlignedBuffer<std::uint32_t> m_frames;  // per channel, since Reset
+    ora::AlignedBuffer<std::uint32_t> m_frames;  // per channel, within the part under way
+    ora::AlignedBuffer<std::uint32_t> m_age;     // per channel, frames since Reset (up to the warm-up)
 };
 
 }  // namespace zen::noise_reduction

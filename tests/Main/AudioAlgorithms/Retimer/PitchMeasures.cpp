@@ -54,8 +54,8 @@ double PartialFrequency(const std::vector<float>& x, std::size_t from, std::size
 
 double Cents(double measured, double expected) { return 1200.0 * std::log2(measured / expected); }
 
-std::vector<std::vector<float>> Shift(const std::vector<std::vector<float>>& channels, const ShifterSettings& s,
-                                      std::size_t block) {
+std::vector<std::vector<float>> Stream(const std::vector<std::vector<float>>& channels, const ShifterSettings& s,
+                                       std::size_t block) {
     ora::pitchshift::EngineParam param(4096, 4, 4096, 2);
     ora::pitchshift::Engine engine(param);
     const std::size_t count = channels.size();
@@ -70,23 +70,38 @@ std::vector<std::vector<float>> Shift(const std::vector<std::vector<float>>& cha
     engine.Apply(wanted, engine.Changes(wanted));
     engine.Reset();  // the mix starts at its setting rather than ramping to it
 
-    const std::size_t latency = engine.Latency();
     const std::size_t length = channels[0].size();
-    const std::size_t total = length + latency;
-    std::vector<std::vector<float>> in(count, std::vector<float>(total, 0.0f));
-    std::vector<std::vector<float>> out(count, std::vector<float>(total, 0.0f));
-    for (std::size_t c = 0; c < count; ++c) std::copy(channels[c].begin(), channels[c].end(), in[c].begin());
+    std::vector<std::vector<float>> out(count, std::vector<float>(length, 0.0f));
     std::vector<const float*> ip(count);
     std::vector<float*> op(count);
-    for (std::size_t done = 0; done < total;) {
-        const std::size_t n = std::min(block, total - done);
+    for (std::size_t done = 0; done < length;) {
+        const std::size_t n = std::min(block, length - done);
         for (std::size_t c = 0; c < count; ++c) {
-            ip[c] = in[c].data() + done;
+            ip[c] = channels[c].data() + done;
             op[c] = out[c].data() + done;
         }
         engine.Process(ip.data(), op.data(), n);
         done += n;
     }
+    return out;
+}
+
+std::vector<float> Stream(const std::vector<float>& x, const ShifterSettings& s, std::size_t block) {
+    return Stream(std::vector<std::vector<float>>{x}, s, block)[0];
+}
+
+std::size_t ShifterLatency() {
+    ora::pitchshift::EngineParam param(4096, 4, 4096, 2);
+    ora::pitchshift::Engine engine(param);
+    return engine.Configure(1) ? engine.Latency() : 0;
+}
+
+std::vector<std::vector<float>> Shift(const std::vector<std::vector<float>>& channels, const ShifterSettings& s,
+                                      std::size_t block) {
+    const std::size_t latency = ShifterLatency();
+    std::vector<std::vector<float>> in = channels;
+    for (auto& c : in) c.resize(c.size() + latency, 0.0f);
+    std::vector<std::vector<float>> out = Stream(in, s, block);
     for (auto& o : out) o.erase(o.begin(), o.begin() + static_cast<std::ptrdiff_t>(latency));
     return out;
 }
@@ -260,6 +275,13 @@ std::vector<float> Transients(std::size_t frames) {
         const double env = std::exp(-t / 0.03);
         x[i] = static_cast<float>(0.5 * env * (0.6 * u(rng) + 0.4 * std::sin(kTwoPi * 180.0 * t)));
     }
+    return x;
+}
+
+std::vector<float> Clicks(std::size_t frames, std::uint32_t seed) {
+    std::vector<float> x(frames, 0.0f);
+    std::mt19937 rng(seed);
+    for (std::size_t at = 3000; at + 2000 < frames; at += 5000 + rng() % 1000) x[at] = 0.8f;
     return x;
 }
 

@@ -29,12 +29,17 @@ struct ShifterSettings {
     bool joint = true;
 };
 
-// Runs `channels` through a pitch-shift engine in blocks of `block`,
-// feeding the latency's worth of silence after the input and dropping the
+// Runs `channels` through a fresh pitch-shift engine in blocks of `block`:
+// the output as a host gets it, delayed by the latency, same length.
+std::vector<std::vector<float>> Stream(const std::vector<std::vector<float>>& channels, const ShifterSettings& s,
+                                       std::size_t block = 512);
+std::vector<float> Stream(const std::vector<float>& x, const ShifterSettings& s, std::size_t block = 512);
+// Streams the input followed by the latency's worth of silence and drops the
 // first latency samples: the result lines up with the input, same length.
 std::vector<std::vector<float>> Shift(const std::vector<std::vector<float>>& channels, const ShifterSettings& s,
                                       std::size_t block = 512);
 std::vector<float> Shift(const std::vector<float>& x, const ShifterSettings& s, std::size_t block = 512);
+std::size_t ShifterLatency();
 
 // The baseline: a phase vocoder without phase locking (every bin advances
 // on its own instantaneous frequency), same frame, hop and windows, read
@@ -55,5 +60,8 @@ std::vector<float> Chord(const std::vector<double>& frequencies, std::size_t fra
 std::vector<float> Chirp(double f0, double f1, std::size_t frames, double amplitude = 0.5);
 std::vector<float> SpeechLike(std::size_t frames);
 std::vector<float> Transients(std::size_t frames);
+// Single-sample clicks 5000 to 6000 samples apart (more than a frame, so
+// each frame holds at most one), the first at 3000.
+std::vector<float> Clicks(std::size_t frames, std::uint32_t seed = 1);
 
 }  // namespace zentest

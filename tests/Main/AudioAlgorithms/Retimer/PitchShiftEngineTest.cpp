@@ -144,6 +144,31 @@ TEST(PitchShiftEngine, ZeroShiftIsNearlyTransparentAndTheMixIsLinearFromDryToWet
     for (std::size_t i = 0; i < kLength; ++i) ASSERT_EQ(dry[i], x[i]) << i;
 }
 
+TEST(PitchShiftEngine, HugeFiniteInputComesOutFiniteAndTheShifterRecovers) {
+    // 100 samples at each level, both signs on the right; a tone follows.
+    for (int algorithm : {0, 1}) {
+        for (float level : {1e18f, 1e19f, 3e38f}) {
+            std::vector<float> left(20000, 0.0f), right(20000, 0.0f);
+            for (std::size_t i = 0; i < 100; ++i) {
+                left[1000 + i] = level;
+                right[1000 + i] = i % 2 != 0 ? level : -level;
+            }
+            const auto tone = zentest::Sine(300.0, kRate, 18000, 0.5);
+            std::copy(tone.begin(), tone.end(), left.begin() + 2000);
+            ShifterSettings s;
+            s.coarse = 5;
+            s.algorithm = algorithm;
+            s.dryWet = 60.0f;
+            const auto out = zentest::Stream({left, right}, s);
+            for (const auto& channel : out)
+                for (std::size_t i = 0; i < channel.size(); ++i)
+                    ASSERT_TRUE(std::isfinite(channel[i])) << level << ", algorithm " << algorithm << ", sample " << i;
+            // Once the burst has passed through, the tone is back at its level.
+            EXPECT_NEAR(zentest::Rms(out[0], 16000, 20000), 0.5 / std::sqrt(2.0), 0.1) << level;
+        }
+    }
+}
+
 TEST(PitchShiftEngine, BlockSizeDoesNotChangeTheResult) {
     const auto x = SpeechLike(20000);
     ShifterSettings s;

@@ -8,6 +8,29 @@
 
 using namespace ora::system;
 
+namespace {
+
+// CPUID bits: leaf 1 EDX, leaf 1 ECX, leaf 7 EBX.
+constexpr unsigned kMmx = 1u << 23, kSse = 1u << 25, kSse2 = 1u << 26;
+constexpr unsigned kSse3 = 1u << 0, kFma = 1u << 12, kSse41 = 1u << 19, kSse42 = 1u << 20;
+constexpr unsigned kOsxsave = 1u << 27, kAvx = 1u << 28;
+constexpr unsigned kAvx2 = 1u << 5;
+constexpr unsigned kBaseEcx = kSse3 | kSse41 | kSse42;
+
+CpuidWords Words(unsigned ecx, unsigned long long xcr0, unsigned leaf7Ebx = kAvx2, unsigned highestLeaf = 13) {
+    CpuidWords w;
+    w.highestStandardLeaf = highestLeaf;
+    w.leaf1Edx = kMmx | kSse | kSse2;
+    w.leaf1Ecx = ecx;
+    w.leaf7Ebx = leaf7Ebx;
+    w.xcr0 = xcr0;
+    return w;
+}
+
+bool VexEncoded(KernelForm form) { return form != KernelForm::M128 && form != KernelForm::Ref; }
+
+}  // namespace
+
 TEST(CpuInfo, DetectionFillsTheFeatureFields) {
     const ora_cpuinfo_x86 info = DetectCpu();
     ASSERT_TRUE(info.valid);
@@ -92,4 +115,60 @@ TEST(DispatchSettings, DetectedModeFollowsTheProcessor) {
         EXPECT_FALSE(HasSSE2());
     }
     EXPECT_EQ(DispatchSettings::Instance().GetMode(), DispatchMode::Detected);  // restored
+}
+
+TEST(DispatchSettings, ChoosesFromTheCpuidWordsAndXcr0OfAnyProcessor) {
+    const unsigned all = kBaseEcx | kFma | kOsxsave | kAvx;
+    struct Case {
+        const char* what;
+        CpuidWords words;
+        KernelForm withFma, plain;
+        IntegerKernelForm integer;
+    } cases[] = {
+        {"AVX, FMA and AVX2 with YMM state saved", Words(all, 0b111), KernelForm::M256Fma, KernelForm::M256,
+         IntegerKernelForm::M256Avx2},
+        {"XCR0 = 0b110", Words(all, 0b110), KernelForm::M256Fma, KernelForm::M256, IntegerKernelForm::M256Avx2},
+        // The detection accepts either state bit: with XCR0 = 0b010 the OS saves
+        // no YMM state, yet the VEX-encoded forms are chosen.
+        {"XCR0 = 0b010", Words(all, 0b010), KernelForm::M256Fma, KernelForm::M256, IntegerKernelForm::M256Avx2},
+        {"XCR0 = 0b100", Words(all, 0b100), KernelForm::M256Fma, KernelForm::M256, IntegerKernelForm::M256Avx2},
+        {"XCR0 = 0: the OS saves no vector state", Words(all, 0), KernelForm::M128, KernelForm::M128,
+         IntegerKernelForm::M128Sse41},
+        {"AVX without OSXSAVE", Words(kBaseEcx | kFma | kAvx, 0b111), KernelForm::M128, KernelForm::M128,
+         IntegerKernelForm::M128Sse41},
+        {"no AVX", Words(kBaseEcx | kOsxsave, 0b111, 0), KernelForm::M128, KernelForm::M128,
+         IntegerKernelForm::M128Sse41},
+        // FMA's forms are VEX-encoded: without OS AVX support they must not run.
+        {"FMA without AVX", Words(kBaseEcx | kFma | kOsxsave, 0b111, 0), KernelForm::M128, KernelForm::M128,
+         IntegerKernelForm::M128Sse41},
+        {"AVX2 without OS AVX support", Words(kBaseEcx | kFma | kAvx, 0), KernelForm::M128, KernelForm::M128,
+         IntegerKernelForm::M128Sse41},
+        {"AVX without FMA", Words(kBaseEcx | kOsxsave | kAvx, 0b111, 0), KernelForm::M256, KernelForm::M256,
+         IntegerKernelForm::M128Sse41},
+        {"leaf 7 beyond the highest leaf", Words(all, 0b111, kAvx2, 6), KernelForm::M256Fma, KernelForm::M256,
+         IntegerKernelForm::M128Sse41},
+        {"SSE2 only", Words(0, 0, 0), KernelForm::M128, KernelForm::M128, IntegerKernelForm::Ref},
+    };
+    for (const Case& c : cases) {
+        const FeatureSet features = DetectedFeatures(DecodeCpuid(c.words));
+        EXPECT_EQ(ChooseKernelForm(features), c.withFma) << c.what;
+        EXPECT_EQ(ChooseKernelFormWithoutFma(features), c.plain) << c.what;
+        EXPECT_EQ(ChooseIntegerKernelForm(features), c.integer) << c.what;
+    }
+    // No processor information at all: the reference forms.
+    EXPECT_EQ(ChooseKernelForm(DetectedFeatures(ora_cpuinfo_x86{})), KernelForm::Ref);
+}
+
+TEST(DispatchSettings, NoVexFormWithoutOsxsaveAvxAndAnXcr0StateBit) {
+    // Every combination of the feature bits that matter and of XCR0's low bits.
+    for (unsigned mask = 0; mask < 16; ++mask) {
+        const unsigned ecx = kBaseEcx | ((mask & 1) ? kOsxsave : 0) | ((mask & 2) ? kAvx : 0) | ((mask & 4) ? kFma : 0);
+        const unsigned leaf7 = (mask & 8) ? kAvx2 : 0;
+        for (unsigned long long xcr0 = 0; xcr0 < 8; ++xcr0) {
+            const FeatureSet f = DetectedFeatures(DecodeCpuid(Words(ecx, xcr0, leaf7)));
+            const bool osAvx = (ecx & kOsxsave) && (ecx & kAvx) && (xcr0 & 0b110) != 0;
+            const bool vex = VexEncoded(ChooseKernelForm(f)) || ChooseIntegerKernelForm(f) == IntegerKernelForm::M256Avx2;
+            EXPECT_TRUE(!vex || osAvx) << "ecx " << std::hex << ecx << " xcr0 " << xcr0;
+        }
+    }
 }

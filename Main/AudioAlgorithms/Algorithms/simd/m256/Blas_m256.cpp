@@ -1,48 +1,18 @@
-// Blas1 and Blas2, 256-bit form.
-#include <immintrin.h>
-
+// Blas1 and Blas2, 256-bit form (rows left over by 8 go 4 at a time).
 #include "Algorithms/simd/BlasKernels.h"
+#include "Algorithms/simd/ReductionBodies.h"
+#include "Algorithms/simd/StreamBodies.h"
+#include "Algorithms/simd/m128/VecM128.h"
+#include "Algorithms/simd/m256/VecM256.h"
 
 namespace ora::numeric::kernels {
 
-float Dot_m256(const float* x, const float* y, std::size_t n) {
-    __m256 acc = _mm256_setzero_ps();
-    std::size_t i = 0;
-    for (; i + 8 <= n; i += 8) acc = _mm256_add_ps(acc, _mm256_mul_ps(_mm256_loadu_ps(x + i), _mm256_loadu_ps(y + i)));
-    __m128 t = _mm_add_ps(_mm256_castps256_ps128(acc), _mm256_extractf128_ps(acc, 1));
-    t = _mm_add_ps(t, _mm_movehl_ps(t, t));
-    float sum = _mm_cvtss_f32(_mm_add_ss(t, _mm_shuffle_ps(t, t, 1)));
-    for (; i < n; ++i) sum += x[i] * y[i];
-    return sum;
-}
+float Dot_m256(const float* x, const float* y, std::size_t n) { return simd::Dot<VecM256>(x, y, n); }
 
-void Axpy_m256(float a, const float* x, float* y, std::size_t n) {
-    const __m256 factor = _mm256_set1_ps(a);
-    std::size_t i = 0;
-    for (; i + 8 <= n; i += 8)
-        _mm256_storeu_ps(y + i, _mm256_add_ps(_mm256_loadu_ps(y + i), _mm256_mul_ps(factor, _mm256_loadu_ps(x + i))));
-    for (; i < n; ++i) y[i] += a * x[i];
-}
+void Axpy_m256(float a, const float* x, float* y, std::size_t n) { simd::Axpy<VecM256>(a, x, y, n); }
 
 void Gemv_m256(const float* a, std::size_t rows, std::size_t cols, std::size_t stride, const float* x, float* y) {
-    std::size_t r = 0;
-    for (; r + 8 <= rows; r += 8) {
-        __m256 acc = _mm256_setzero_ps();
-        for (std::size_t c = 0; c < cols; ++c)
-            acc = _mm256_add_ps(acc, _mm256_mul_ps(_mm256_loadu_ps(a + c * stride + r), _mm256_set1_ps(x[c])));
-        _mm256_storeu_ps(y + r, acc);
-    }
-    for (; r + 4 <= rows; r += 4) {
-        __m128 acc = _mm_setzero_ps();
-        for (std::size_t c = 0; c < cols; ++c)
-            acc = _mm_add_ps(acc, _mm_mul_ps(_mm_loadu_ps(a + c * stride + r), _mm_set1_ps(x[c])));
-        _mm_storeu_ps(y + r, acc);
-    }
-    for (; r < rows; ++r) {
-        float acc = 0.0f;
-        for (std::size_t c = 0; c < cols; ++c) acc += a[c * stride + r] * x[c];
-        y[r] = acc;
-    }
+    simd::Gemv<VecM256, VecM128>(a, rows, cols, stride, x, y);
 }
 
 }  // namespace ora::numeric::kernels
