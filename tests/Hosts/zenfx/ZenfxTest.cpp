@@ -250,6 +250,25 @@ TEST(ZenfxProcess, MetersOfAFileRunAreTheFinalReadingsAndTheLevelsMaxima) {
     EXPECT_LT(peak["final"].get<double>(), -40.0);  // the flush: the quiet end, then silence
 }
 
+// "Meter" at the end of the chain gives the output file's loudness: its
+// integrated value at the end of the run, not the last block's.
+TEST(ZenfxProcess, MeterAtTheEndGivesTheFilesLoudness) {
+    TempFolder folder;
+    // 1 kHz at amplitude 0.1 for 3 s: -23.0 LUFS.
+    std::vector<float> tone(3 * kRate);
+    for (std::size_t n = 0; n < tone.size(); ++n) tone[n] = 0.1f * std::sin(2.0f * 3.14159265f * 1000.0f * n / kRate);
+    WriteAudio(folder / "in.wav", {tone}, kRate);
+    auto result = RunZenfx({"process", folder / "in.wav", "-o", folder / "out.wav", "--plugin", "Meter",
+                            "--meters-json", folder / "meters.json"});
+    ASSERT_EQ(result.exitCode, 0) << result.err;
+    std::ifstream file(folder / "meters.json");
+    const auto meters = nlohmann::json::parse(file)["plugins"][0]["meters"];
+    const auto integrated = std::find_if(meters.begin(), meters.end(),
+                                         [](const auto& m) { return m["identifier"] == "ZenMeter::INTEGRATED"; });
+    ASSERT_NE(integrated, meters.end());
+    EXPECT_NEAR((*integrated)["final"].get<double>(), -23.0, 0.05);
+}
+
 TEST(ZenfxProcess, PresetsThenSettings) {
     TempFolder folder;
     WriteAudio(folder / "in.wav", {std::vector<float>(100, 2.0f)}, kRate);
