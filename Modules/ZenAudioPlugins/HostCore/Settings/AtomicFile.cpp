@@ -126,10 +126,17 @@ AtomicFile::AtomicFile(const std::string& destination) : m_destination(destinati
         Folder(m_target) + "/" + TemporaryPrefix(m_target) + std::to_string(getpid()) + "-XXXXXX";
     std::vector<char> buffer(pattern.begin(), pattern.end());
     buffer.push_back('\0');
+    // A signal handler must never find the file created but not yet listed.
+    sigset_t all, previous;
+    sigfillset(&all);
+    pthread_sigmask(SIG_BLOCK, &all, &previous);
     m_fd = mkostemp(buffer.data(), O_CLOEXEC);
+    const int error = errno;
+    if (m_fd >= 0) m_slot = Register(buffer.data());
+    pthread_sigmask(SIG_SETMASK, &previous, nullptr);
+    errno = error;
     if (m_fd < 0) throw WriteError(destination);
     m_path = buffer.data();
-    m_slot = Register(m_path);
     // mkstemp makes the file private; give it what the file it replaces had,
     // or what a new file would get.
     struct stat existing {};
