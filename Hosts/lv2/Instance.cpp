@@ -8,6 +8,7 @@
 #include <cmath>
 #include <cstring>
 #include <limits>
+#include <mutex>
 
 namespace zenlv2 {
 
@@ -23,20 +24,25 @@ const void* FindFeature(const LV2_Feature* const* features, const char* uri) {
 
 std::unique_ptr<Instance> Instance::Create(Library& library, const Variant& variant, double sampleRate,
                                            const LV2_Feature* const* features) {
-    std::unique_ptr<zen::PluginInstance> instance = library.Create(variant.key);
-    AudioPlugin* audio = zen::InterfaceCast<AudioPlugin>(instance.get());
-    if (audio == nullptr || !audio->ConfigureChannels(variant.inputs, variant.outputs)) return nullptr;
-    PortMap ports(*audio, variant.inputs, variant.outputs);
-    std::unique_ptr<Instance> self(
-        new Instance(std::move(instance), *audio, std::move(ports), static_cast<float>(sampleRate)));
+    if (!library.IsLoaded()) return nullptr;
+    // The library hands the services set on its interface to each instance
+    // it creates; hosts may instantiate from several threads at once.
+    static std::mutex creating;
+    std::lock_guard<std::mutex> lock(creating);
+    auto studio = std::make_unique<zen::host::StudioModel>(library.Interface());
+    const std::uint32_t source = variant.inputs == 0 ? variant.outputs : variant.inputs;
+    studio->AddChannel(variant.name, variant.outputs, source);
+    studio->InsertPlugin(kChannel, variant.key);  // throws when the layout is refused
+    PortMap ports(studio->PluginAt(kChannel, kSlot), variant.inputs, variant.outputs);
+    std::unique_ptr<Instance> self(new Instance(std::move(studio), std::move(ports), static_cast<float>(sampleRate)));
     self->ReadFeatures(features);
-    if (!audio->Prepare(self->m_sampleRate, self->m_maxBlock)) return nullptr;
+    self->m_studio->Prepare(static_cast<int>(sampleRate), self->m_maxBlock);
     return self;
 }
 
-Instance::Instance(std::unique_ptr<zen::PluginInstance> instance, AudioPlugin& audio, PortMap ports, float sampleRate)
-    : m_instance(std::move(instance)),
-      m_audio(audio),
+Instance::Instance(std::unique_ptr<zen::host::StudioModel> studio, PortMap ports, float sampleRate)
+    : m_studio(std::move(studio)),
+      m_audio(m_studio->PluginAt(kChannel, kSlot)),
       m_ports(std::move(ports)),
       m_sampleRate(sampleRate),
       m_inputs(m_ports.Inputs(), nullptr),
@@ -45,7 +51,7 @@ Instance::Instance(std::unique_ptr<zen::PluginInstance> instance, AudioPlugin& a
       m_scratch(static_cast<std::size_t>(m_ports.Inputs()) * kScratchFrames),
       m_parameterPorts(m_ports.ParameterCount(), nullptr),
       m_sent(m_ports.ParameterCount(), std::numeric_limits<float>::quiet_NaN()),
-      m_meterPorts(audio.GetMeterCount(), nullptr) {}
+      m_meterPorts(m_audio.GetMeterCount(), nullptr) {}
 
 void Instance::ReadFeatures(const LV2_Feature* const* features) {
     const auto* map = static_cast<const LV2_URID_Map*>(FindFeature(features, LV2_URID__map));
@@ -83,7 +89,10 @@ void Instance::ConnectPort(std::uint32_t index, void* data) noexcept {
 
 void Instance::Activate() {
     SendControls();
-    m_audio.Prepare(m_sampleRate, m_maxBlock);
+    try {
+        m_studio->Prepare(static_cast<int>(m_sampleRate), m_maxBlock);
+    } catch (const std::exception&) {  // it was prepared at this rate once; Run then does nothing
+    }
 }
 
 void Instance::SendControls() noexcept {
@@ -122,7 +131,7 @@ void Instance::Run(std::uint32_t frames) noexcept {
                 if (in == nullptr) std::fill_n(m_outputs[c], frames, 0.0f);
                 else if (in != m_outputs[c]) std::copy_n(in, frames, m_outputs[c]);
             }
-            m_audio.Process(m_outputs.data(), frames);
+            m_studio->Process(kChannel, m_outputs.data(), frames);
         }
     }
     PublishOutputs();
@@ -141,7 +150,7 @@ void Instance::ProcessAliased(std::uint32_t frames) noexcept {
             if (c < m_inputs.size()) std::copy_n(m_scratch.data() + c * kScratchFrames, length, m_chunk[c]);
             else std::fill_n(m_chunk[c], length, 0.0f);
         }
-        m_audio.Process(m_chunk.data(), length);
+        m_studio->Process(kChannel, m_chunk.data(), length);
         done += length;
     }
 }

@@ -1,5 +1,5 @@
-// One LV2 plug-in instance: a library instance in one channel layout, driven
-// through the ports of its PortMap.
+// One LV2 plug-in instance: a one-slot channel of the host core's studio
+// model, in the variant's layout, driven through the ports of its PortMap.
 //
 // Threads as LV2 defines them: Create, Activate and the state calls on the
 // host's instantiation thread; ConnectPort and Run on the audio thread. Run
@@ -17,6 +17,7 @@
 #include <vector>
 
 #include "Catalog.h"
+#include "HostCore/Studio/StudioModel.h"
 #include "Library.h"
 #include "PortMap.h"
 
@@ -36,8 +37,8 @@ public:
     // Key of the plug-in's state text in a host's saved state.
     static constexpr const char* kStateKey = "urn:zenaudioplugins:state";
 
-    // Null when the plug-in cannot be created in the variant's layout or run
-    // at this rate.
+    // Null when the library is not loaded; throws HostError when the plug-in
+    // cannot be created in the variant's layout or run at this rate.
     static std::unique_ptr<Instance> Create(Library& library, const Variant& variant, double sampleRate,
                                             const LV2_Feature* const* features);
 
@@ -52,14 +53,17 @@ public:
     LV2_State_Status Restore(LV2_State_Retrieve_Function retrieve, LV2_State_Handle handle);
 
 private:
-    Instance(std::unique_ptr<zen::PluginInstance> instance, AudioPlugin& audio, PortMap ports, float sampleRate);
+    static constexpr std::size_t kChannel = 0;
+    static constexpr std::size_t kSlot = 0;
+
+    Instance(std::unique_ptr<zen::host::StudioModel> studio, PortMap ports, float sampleRate);
 
     void ReadFeatures(const LV2_Feature* const* features);
     void SendControls() noexcept;
     void ProcessAliased(std::uint32_t frames) noexcept;
     void PublishOutputs() noexcept;
 
-    std::unique_ptr<zen::PluginInstance> m_instance;
+    std::unique_ptr<zen::host::StudioModel> m_studio;  // one channel, one slot
     AudioPlugin& m_audio;
     PortMap m_ports;
     float m_sampleRate;

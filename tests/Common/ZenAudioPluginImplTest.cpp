@@ -131,6 +131,23 @@ TEST(ZenAudioPluginImpl, BypassSwitchesWithoutAClick) {
     EXPECT_EQ(buffer[0][180 * 256], -sine[180 * 256]);   // processing again
 }
 
+// What a plug-in can never see, processing or bypassed: NaN and infinities
+// arrive as silence, huge finite values held at the input limit.
+TEST(ZenAudioPluginImpl, InputIsGuardedBeforeAnyPluginSeesIt) {
+    const float limit = ZenAudioPluginImpl::kInputLimit;
+    const std::vector<float> input = {NAN, INFINITY, -INFINITY, 1e19f, -3e38f, 0.25f, -limit, limit * 1.5f};
+    const std::vector<float> guarded = {0.0f, 0.0f, 0.0f, limit, -limit, 0.25f, -limit, limit};
+    for (bool bypassed : {false, true}) {
+        PluginHarness plugin("Test Delay");
+        plugin.Set("Delay", 0.0f);
+        plugin.Audio().SetBypass(bypassed);
+        plugin.Prepare(2);
+        const auto out = plugin.Run(input, 2, 3);
+        EXPECT_EQ(out[0], guarded) << (bypassed ? "bypassed" : "processing");
+        EXPECT_EQ(out[1], guarded) << (bypassed ? "bypassed" : "processing");
+    }
+}
+
 TEST(ZenAudioPluginImpl, LongBlocksAreSplitAtThePreparedMaximum) {
     PluginHarness plugin("Test Delay");
     plugin.Set("Delay", 3.0f);

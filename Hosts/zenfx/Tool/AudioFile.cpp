@@ -6,6 +6,7 @@
 #include <cerrno>
 #include <cstring>
 #include <cctype>
+#include <fstream>
 #include <map>
 
 #include "ZenfxError.h"
@@ -39,6 +40,43 @@ const std::map<std::string, int>& SampleFormats() {
     return formats;
 }
 
+std::string Lower(std::string text) {
+    std::transform(text.begin(), text.end(), text.begin(), [](unsigned char c) { return std::tolower(c); });
+    return text;
+}
+
+std::uint32_t LittleEndian32(const unsigned char* bytes) {
+    return bytes[0] | (bytes[1] << 8) | (bytes[2] << 16) | (static_cast<std::uint32_t>(bytes[3]) << 24);
+}
+
+// Frames the 'data' chunk of a RIFF WAVE file declares, or -1 when the
+// header does not say (a stream written without sizes, another layout).
+std::int64_t DeclaredWaveFrames(const std::string& path) {
+    std::ifstream file(path, std::ios::binary);
+    unsigned char header[12];
+    if (!file.read(reinterpret_cast<char*>(header), 12) || std::memcmp(header, "RIFF", 4) != 0 ||
+        std::memcmp(header + 8, "WAVE", 4) != 0)
+        return -1;
+    std::uint32_t blockAlign = 0;
+    unsigned char chunk[8];
+    while (file.read(reinterpret_cast<char*>(chunk), 8)) {
+        const std::uint32_t size = LittleEndian32(chunk + 4);
+        if (std::memcmp(chunk, "data", 4) == 0) {
+            if (blockAlign == 0 || size == 0 || size == 0xFFFFFFFFu) return -1;
+            return size / blockAlign;
+        }
+        if (std::memcmp(chunk, "fmt ", 4) == 0 && size >= 14) {
+            unsigned char format[14];
+            if (!file.read(reinterpret_cast<char*>(format), 14)) return -1;
+            blockAlign = static_cast<std::uint32_t>(format[12] | (format[13] << 8));
+            file.seekg(size - 14 + (size & 1), std::ios::cur);
+        } else {
+            file.seekg(size + (size & 1), std::ios::cur);  // chunks are padded to even sizes
+        }
+    }
+    return -1;
+}
+
 bool Storable(int format) {
     SF_INFO info{};
     info.samplerate = 48000;
@@ -55,6 +93,10 @@ AudioFileReader::AudioFileReader(const std::string& path) : m_path(path) {
     m_file = sf_open(path.c_str(), SFM_READ, &m_info);
     if (m_file == nullptr) throw ZenfxError("cannot read '" + path + "': " + sf_strerror(nullptr));
     if (m_info.channels < 1) throw ZenfxError("cannot read '" + path + "': it has no audio channels");
+    m_declaredFrames = m_info.frames;
+    const int container = m_info.format & SF_FORMAT_TYPEMASK;
+    if (container == SF_FORMAT_WAV || container == SF_FORMAT_WAVEX)
+        m_declaredFrames = std::max<std::int64_t>(m_info.frames, DeclaredWaveFrames(path));
 }
 
 AudioFileReader::~AudioFileReader() {
@@ -66,7 +108,7 @@ std::int64_t AudioFileReader::Read(float* interleaved, std::int64_t frames) {
 }
 
 AudioFileWriter::AudioFileWriter(const std::string& path, int sampleRate, int channels, int format)
-    : m_path(path), m_temporary(path) {
+    : m_path(path), m_file(path) {
     SF_INFO info{};
     info.samplerate = sampleRate;
     info.channels = channels;
@@ -74,31 +116,45 @@ AudioFileWriter::AudioFileWriter(const std::string& path, int sampleRate, int ch
     if (sf_format_check(&info) == 0)
         throw ZenfxError("cannot write '" + path + "': " + DescribeFormat(format) + " cannot hold " +
                          std::to_string(channels) + " channels at " + std::to_string(sampleRate) + " Hz");
-    m_file = sf_open_fd(m_temporary.Descriptor(), SFM_WRITE, &info, SF_TRUE);
-    if (m_file == nullptr) throw ZenfxError("cannot write '" + path + "': " + sf_strerror(nullptr));
-    m_temporary.ReleaseDescriptor();
+    m_sound = sf_open_fd(m_file.Descriptor(), SFM_WRITE, &info, SF_TRUE);
+    if (m_sound == nullptr) throw ZenfxError("cannot write '" + path + "': " + sf_strerror(nullptr));
+    m_file.ReleaseDescriptor();
     // Integer formats clip instead of wrapping around.
-    sf_command(m_file, SFC_SET_CLIPPING, nullptr, SF_TRUE);
+    sf_command(m_sound, SFC_SET_CLIPPING, nullptr, SF_TRUE);
 }
 
 AudioFileWriter::~AudioFileWriter() {
-    if (m_file != nullptr) sf_close(m_file);
+    if (m_sound != nullptr) sf_close(m_sound);
 }
 
 void AudioFileWriter::Write(const float* interleaved, std::int64_t frames) {
-    if (sf_writef_float(m_file, interleaved, frames) != frames)
-        throw ZenfxError("cannot write '" + m_path + "': " + sf_strerror(m_file));
+    errno = 0;
+    if (sf_writef_float(m_sound, interleaved, frames) != frames) {
+        // libsndfile keeps the system's reason ("No space left on device") in its log, not its error text.
+        const std::string reason = errno != 0 ? std::strerror(errno) : sf_strerror(m_sound);
+        throw ZenfxError("cannot write '" + m_path + "': " + reason);
+    }
+}
+
+void AudioFileWriter::Close() {
+    if (m_sound == nullptr) return;
+    errno = 0;
+    const int status = sf_close(m_sound);
+    m_sound = nullptr;
+    if (status != 0)
+        throw ZenfxError("cannot write '" + m_path + "': " + (errno != 0 ? std::strerror(errno) : sf_error_number(status)));
 }
 
 void AudioFileWriter::Commit() {
-    const int status = sf_close(m_file);
-    m_file = nullptr;
-    if (status != 0) throw ZenfxError("cannot write '" + m_path + "': " + sf_error_number(status));
-    m_temporary.Commit();
+    Close();
+    m_file.Commit();
 }
 
 int ChooseOutputFormat(const std::string& outputPath, int inputFormat, const std::string& formatOption) {
     const std::string ext = Extension(outputPath);
+    if (ext.empty())
+        throw ZenfxError("cannot write '" + outputPath +
+                         "': it has no extension to tell the file type (use .wav, .flac, .aiff, .w64, .caf, .au or .ogg)");
     const auto container = Containers().find(ext);
     if (container == Containers().end())
         throw ZenfxError("cannot write '" + outputPath + "': unknown file type '." + ext +
@@ -108,7 +164,7 @@ int ChooseOutputFormat(const std::string& outputPath, int inputFormat, const std
         return SF_FORMAT_OGG | SF_FORMAT_VORBIS;
     }
     if (!formatOption.empty()) {
-        const auto sample = SampleFormats().find(formatOption);
+        const auto sample = SampleFormats().find(Lower(formatOption));
         if (sample == SampleFormats().end())
             throw ZenfxError("unknown --format '" + formatOption + "' (pcm16, pcm24, pcm32, float or double)");
         const int format = container->second | sample->second;

@@ -1,5 +1,5 @@
-// Audio files through libsndfile: a reader, a writer that commits through a
-// TemporaryFile, and the choice of the output's format.
+// Audio files through libsndfile: a reader, a writer that commits through an
+// AtomicFile, and the choice of the output's format.
 #pragma once
 
 #include <sndfile.h>
@@ -7,7 +7,7 @@
 #include <cstdint>
 #include <string>
 
-#include "TemporaryFile.h"
+#include "HostCore/Settings/AtomicFile.h"
 
 namespace zenfx {
 
@@ -18,6 +18,8 @@ public:
     virtual int SampleRate() const = 0;
     virtual int Channels() const = 0;
     virtual std::int64_t Frames() const = 0;
+    // What the file's header promises; more than Frames() when it was cut off.
+    virtual std::int64_t DeclaredFrames() const { return Frames(); }
     virtual int Format() const = 0;  // libsndfile format of the source
     virtual std::string Description() const = 0;
     // Interleaved frames; returns the count read (0 at the end).
@@ -33,6 +35,7 @@ public:
     int SampleRate() const override { return m_info.samplerate; }
     int Channels() const override { return m_info.channels; }
     std::int64_t Frames() const override { return m_info.frames; }
+    std::int64_t DeclaredFrames() const override { return m_declaredFrames; }
     int Format() const override { return m_info.format; }
     std::string Description() const override { return "'" + m_path + "'"; }
     std::int64_t Read(float* interleaved, std::int64_t frames) override;
@@ -41,30 +44,35 @@ private:
     std::string m_path;
     SF_INFO m_info{};
     SNDFILE* m_file = nullptr;
+    std::int64_t m_declaredFrames = 0;
 };
 
 class AudioFileWriter {
 public:
     // Opens a temporary file beside `path`; the output appears at `path`
-    // only on Commit. Throws ZenfxError.
+    // only on Commit. Throws ZenfxError or HostError.
     AudioFileWriter(const std::string& path, int sampleRate, int channels, int format);
     ~AudioFileWriter();
 
     void Write(const float* interleaved, std::int64_t frames);
+    // Completes the file (headers, flush) without putting it in place, so a
+    // run can finish every output before it replaces any.
+    void Close();
+    // Closes if still open and renames the file into place.
     void Commit();
 
 private:
     std::string m_path;
-    TemporaryFile m_temporary;
-    SNDFILE* m_file = nullptr;
+    zen::host::AtomicFile m_file;
+    SNDFILE* m_sound = nullptr;
 };
 
 // The libsndfile format for an output path: the container from the
 // extension (.wav .w64 .flac .aif/.aiff .caf .au .ogg) and the sample format
 // from `formatOption` (pcm16, pcm24, pcm32, float, double) or, when empty,
 // the input's own if the container stores it (float input stays float),
-// else 24-bit. Throws ZenfxError for an unknown extension or a sample format
-// the container cannot store.
+// else 24-bit. Format names take any case. Throws ZenfxError for a missing or
+// unknown extension or a sample format the container cannot store.
 int ChooseOutputFormat(const std::string& outputPath, int inputFormat, const std::string& formatOption);
 
 // "WAV float", "FLAC 24-bit", ...

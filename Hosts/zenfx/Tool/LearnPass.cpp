@@ -5,6 +5,7 @@
 #include <cstdio>
 #include <iostream>
 
+#include "StageSettings.h"
 #include "ZenfxError.h"
 
 namespace zenfx {
@@ -38,8 +39,11 @@ LearnRegion ParseLearnRegion(const std::string& text) {
     return region;
 }
 
-void RunLearnPasses(PluginChain& chain, const std::vector<StageSpec>& stages,
+void RunLearnPasses(zen::host::StudioModel& studio, std::size_t channel, const std::vector<StageSpec>& stages,
                     const std::function<std::unique_ptr<AudioSource>()>& open, std::uint32_t block) {
+    const auto resetAll = [&] {
+        for (std::size_t s = 0; s < stages.size(); ++s) studio.PluginAt(channel, s).Reset();
+    };
     for (std::size_t s = 0; s < stages.size(); ++s) {
         if (stages[s].learn.empty()) continue;
         const LearnRegion region = ParseLearnRegion(stages[s].learn);
@@ -53,9 +57,9 @@ void RunLearnPasses(PluginChain& chain, const std::vector<StageSpec>& stages,
                                  Seconds(static_cast<double>(source->Frames()) / rate) + " s",
                              kExitUsage);
 
-        PluginChain::Stage& learner = chain.Stages()[s];
-        for (PluginChain::Stage& stage : chain.Stages()) stage.audio->Reset();
-        PluginChain::ApplySetting(learner, "Learn=1");
+        StageSettings learner(studio.PluginAt(channel, s), stages[s].plugin, [](const std::string&) {});
+        resetAll();
+        learner.Set("Learn=1");
         std::vector<float> interleaved(channels * block), planar(channels * block);
         std::vector<float*> pointers(channels);
         for (std::int64_t position = 0; position < last;) {
@@ -70,13 +74,13 @@ void RunLearnPasses(PluginChain& chain, const std::vector<StageSpec>& stages,
                     for (std::size_t i = 0; i < count; ++i)
                         pointers[c][i] = interleaved[(static_cast<std::size_t>(from) + i) * channels + c];
                 }
-                chain.Process(pointers.data(), count);
+                studio.Process(channel, pointers.data(), count);
             }
             position += got;
         }
-        PluginChain::ApplySetting(learner, "Learn=0");
-        for (PluginChain::Stage& stage : chain.Stages()) stage.audio->Reset();
-        std::cout << "zenfx: " << learner.plugin.entry.name << " learnt from " << Seconds(region.start) << " to "
+        learner.Set("Learn=0");
+        resetAll();
+        std::cout << "zenfx: " << stages[s].plugin << " learnt from " << Seconds(region.start) << " to "
                   << Seconds(static_cast<double>(last) / rate) << " s\n";
     }
 }

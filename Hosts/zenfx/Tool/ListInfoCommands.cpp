@@ -12,6 +12,8 @@
 #include "DemoMaterial.h"
 #include "MeterJson.h"
 #include "ParameterValue.h"
+#include "RunFiles.h"
+#include "TextColumns.h"
 #include "ZenfxError.h"
 
 namespace zenfx {
@@ -142,18 +144,31 @@ int RunInfo(PluginLibrary& library, const InfoOptions& options) {
               << "  processing " << (audio.IsBlockBased() ? "block-based" : "sample by sample")
               << (audio.LocksAudioPath() ? ", takes a lock on the audio path" : "") << "\n"
               << "\nParameters:\n";
-    int labelWidth = 18;  // the longest label sets the column
-    for (std::uint32_t i = 0; i < audio.GetParameterCount(); ++i) {
-        zen::ParameterInfo p;
-        audio.GetParameterInfo(i, p);
-        labelWidth = std::max(labelWidth, static_cast<int>(p.label.size()));
+    // Columns as wide as their longest entry, in characters.
+    std::size_t labelWidth = 18, identifierWidth = 36, rangeWidth = 34;
+    std::vector<zen::ParameterInfo> infos(audio.GetParameterCount());
+    for (std::uint32_t i = 0; i < infos.size(); ++i) {
+        audio.GetParameterInfo(i, infos[i]);
+        labelWidth = std::max(labelWidth, DisplayWidth(infos[i].label));
+        identifierWidth = std::max(identifierWidth, DisplayWidth(infos[i].identifier));
+        rangeWidth = std::max(rangeWidth, DisplayWidth(DescribeRange(infos[i])));
     }
-    for (std::uint32_t i = 0; i < audio.GetParameterCount(); ++i) {
-        zen::ParameterInfo p;
-        audio.GetParameterInfo(i, p);
-        std::printf("  %2u  %-*s %-36s %-34s default %s%s\n", i, labelWidth, p.label.c_str(), p.identifier.c_str(),
-                    DescribeRange(p).c_str(), FormatParameterValue(p, p.defaultValue).c_str(),
-                    p.taper == zen::ParameterTaper::Logarithmic ? ", logarithmic" : "");
+    const zen::ParameterInfo* example = nullptr;  // a parameter with a unit, a percentage first
+    for (const zen::ParameterInfo& p : infos) {
+        if (p.kind == zen::ParameterKind::Continuous && !p.unit.empty() &&
+            (example == nullptr || (p.unit == "%" && example->unit != "%")))
+            example = &p;
+        std::cout << "  " << std::setw(2) << &p - infos.data() << "  " << PadRight(p.label, labelWidth) << " "
+                  << PadRight(p.identifier, identifierWidth) << " " << PadRight(DescribeRange(p), rangeWidth)
+                  << " default " << FormatParameterValue(p, p.defaultValue)
+                  << (p.taper == zen::ParameterTaper::Logarithmic ? ", logarithmic" : "") << "\n";
+    }
+    if (example != nullptr) {
+        std::ostringstream value;
+        value << static_cast<double>(example->defaultValue);
+        std::cout << "  --set takes values in the unit shown: " << example->label << "=" << value.str() << " and "
+                  << example->label << "=" << value.str() << example->unit << " are both "
+                  << FormatParameterValue(*example, example->defaultValue) << "\n";
     }
     std::fflush(stdout);
     std::cout << "\nMeters (" << channels << " channel" << (channels == 1 ? "" : "s") << "):\n";
@@ -177,6 +192,7 @@ int RunInfo(PluginLibrary& library, const InfoOptions& options) {
 }
 
 int RunDemo(const std::string& output, const std::string& format) {
+    RunFiles().AddOutput("-o", output);
     DemoMaterial demo;
     AudioFileWriter writer(output, demo.SampleRate(), demo.Channels(),
                            ChooseOutputFormat(output, demo.Format(), format));

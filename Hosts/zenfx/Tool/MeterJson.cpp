@@ -29,14 +29,14 @@ nlohmann::json ReadMeter(const AudioPlugin& audio, std::uint32_t index) {
                           {"kind", MeterKindName(info.kind)}};
     switch (info.kind) {
         case zen::MeterKind::Level:
-        case zen::MeterKind::Value: row["value"] = audio.GetMeter(index); break;
+        case zen::MeterKind::Value: row["final"] = audio.GetMeter(index); break;
         case zen::MeterKind::Array: {
             std::vector<float> values(info.size);
-            if (audio.ReadMeterArray(index, values.data(), info.size)) row["value"] = values;
-            else row["value"] = nullptr;
+            if (audio.ReadMeterArray(index, values.data(), info.size)) row["final"] = values;
+            else row["final"] = nullptr;
             break;
         }
-        case zen::MeterKind::Ring: row["value"] = nullptr; break;
+        case zen::MeterKind::Ring: row["final"] = nullptr; break;
     }
     return row;
 }

@@ -1,5 +1,5 @@
 // Meters as JSON, mapped from any plug-in's meter table: zenfx info
-// describes them, --meters-json writes their readings.
+// describes them, --meters-json writes their readings (MeterRecorder).
 #pragma once
 
 #include <cstdint>
@@ -17,9 +17,9 @@ const char* MeterKindName(zen::MeterKind kind);
 // size and capacity for rings.
 nlohmann::json DescribeMeter(const zen::MeterInfo& info);
 
-// {identifier, name, unit, kind, value}: a number for level (dB) and value
-// meters, an array of numbers for arrays (null when it could not be read).
-// Rings hold a history rather than a reading: null.
+// {identifier, name, unit, kind, final}: the reading now, a number for level
+// (dB) and value meters, an array of numbers for arrays (null when it could
+// not be read). Rings hold a history rather than a reading: null.
 nlohmann::json ReadMeter(const AudioPlugin& audio, std::uint32_t index);
 
 }  // namespace zenfx

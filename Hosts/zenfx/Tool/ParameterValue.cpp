@@ -2,10 +2,10 @@
 
 #include <cctype>
 #include <cmath>
-#include <cstdlib>
 #include <sstream>
 #include <vector>
 
+#include "HostCore/Settings/SettingsDocument.h"
 #include "NameSuggestions.h"
 #include "ZenfxError.h"
 
@@ -30,9 +30,24 @@ std::string UpperName(const std::string& identifier) {
     return colons == std::string::npos ? identifier : identifier.substr(colons + 2);
 }
 
-[[noreturn]] void OutOfRange(const zen::ParameterInfo& info, const std::string& pluginName, const std::string& text) {
+[[noreturn]] void OutOfRange(const zen::ParameterInfo& info, const std::string& pluginName, const std::string& text,
+                             bool bare) {
+    const std::string unitNote =
+        bare && !info.unit.empty() ? "; a plain number is in " + info.unit + ", as in " + info.label + "=" +
+                                         FormatNumber(info.defaultValue) + info.unit
+                                   : "";
     throw ZenfxError("value '" + text + "' for '" + info.label + "' of '" + pluginName + "' is out of range (" +
-                     DescribeRange(info) + ")");
+                     DescribeRange(info) + ")" + unitNote);
+}
+
+// The longest leading decimal number of `text` ("-2.5e3" of "-2.5e3Hz"), and
+// where it ends; false when there is none.
+bool LeadingNumber(const std::string& text, double& number, std::size_t& end) {
+    end = text.find_first_not_of("+-0123456789.eE");
+    if (end == std::string::npos) end = text.size();
+    for (; end > 0; --end)
+        if (zen::host::ParseNumber(text.substr(0, end), number)) return true;
+    return false;
 }
 
 }  // namespace
@@ -56,29 +71,34 @@ std::uint32_t FindParameter(AudioPlugin& plugin, const std::string& pluginName, 
                      " (zenfx info '" + pluginName + "' lists them)");
 }
 
-float ParseParameterValue(const zen::ParameterInfo& info, const std::string& pluginName, const std::string& text) {
+ParsedValue ParseParameterValue(const zen::ParameterInfo& info, const std::string& pluginName,
+                                const std::string& text) {
     const std::string value = Trim(text);
     if (info.kind == zen::ParameterKind::List) {
         for (std::size_t i = 0; i < info.choices.size(); ++i)
-            if (EqualsIgnoreCase(value, info.choices[i])) return info.minimum + static_cast<float>(i) * info.step;
+            if (EqualsIgnoreCase(value, info.choices[i])) return {info.minimum + static_cast<float>(i) * info.step};
     }
     if (info.kind == zen::ParameterKind::Switch) {
         for (const char* on : {"on", "true", "yes"})
-            if (EqualsIgnoreCase(value, on)) return 1.0f;
+            if (EqualsIgnoreCase(value, on)) return {1.0f};
         for (const char* off : {"off", "false", "no"})
-            if (EqualsIgnoreCase(value, off)) return 0.0f;
+            if (EqualsIgnoreCase(value, off)) return {0.0f};
     }
 
-    const char* begin = value.c_str();
-    char* end = nullptr;
-    double number = std::strtod(begin, &end);
-    if (end == begin || !std::isfinite(number)) {
+    const std::size_t digits = value.find_first_not_of("+-");
+    if (digits != std::string::npos && (value.compare(digits, 2, "0x") == 0 || value.compare(digits, 2, "0X") == 0))
+        throw ZenfxError("'" + text + "' for '" + info.label + "' of '" + pluginName +
+                         "' is hexadecimal; give a decimal value (" + DescribeRange(info) + ")");
+    double number = 0.0;
+    std::size_t end = 0;
+    if (!LeadingNumber(value, number, end)) {
         std::string hint;
         if (info.kind == zen::ParameterKind::List) hint = DidYouMean(value, info.choices);
         throw ZenfxError("'" + text + "' is not a value for '" + info.label + "' of '" + pluginName + "'" + hint +
                          " (" + DescribeRange(info) + ")");
     }
-    std::string unit = Trim(end);
+    std::string unit = Trim(value.substr(end));
+    const bool bare = unit.empty();
     // "2.5k" and "2.5kHz" for frequencies.
     if (!unit.empty() && (unit[0] == 'k' || unit[0] == 'K') && EqualsIgnoreCase(info.unit, "Hz") &&
         (unit.size() == 1 || EqualsIgnoreCase(unit.substr(1), "Hz"))) {
@@ -92,7 +112,7 @@ float ParseParameterValue(const zen::ParameterInfo& info, const std::string& plu
     const auto result = static_cast<float>(number);
     // A hair of tolerance for values typed with fewer digits than the range's own.
     const float slack = 1e-6f * std::max(1.0f, std::max(std::fabs(info.minimum), std::fabs(info.maximum)));
-    if (result < info.minimum - slack || result > info.maximum + slack) OutOfRange(info, pluginName, text);
+    if (result < info.minimum - slack || result > info.maximum + slack) OutOfRange(info, pluginName, text, bare);
     if (info.kind != zen::ParameterKind::Continuous) {
         const float stride = info.step > 0.0f ? info.step : 1.0f;
         const float steps = (result - info.minimum) / stride;
@@ -100,7 +120,7 @@ float ParseParameterValue(const zen::ParameterInfo& info, const std::string& plu
             throw ZenfxError("'" + text + "' is not a value for '" + info.label + "' of '" + pluginName + "' (" +
                              DescribeRange(info) + ")");
     }
-    return std::min(std::max(result, info.minimum), info.maximum);
+    return {std::min(std::max(result, info.minimum), info.maximum), bare};
 }
 
 std::string FormatParameterValue(const zen::ParameterInfo& info, float value) {

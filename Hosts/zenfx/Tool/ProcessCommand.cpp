@@ -1,9 +1,6 @@
-// zenfx process: a chain of plug-ins over a file or the demo material.
-#include <sys/stat.h>
-
+// zenfx process: a chain of plug-ins over a file or the demo material, on one
+// channel of the host core's studio model.
 #include <algorithm>
-#include <csignal>
-#include <cstdio>
 #include <iomanip>
 #include <iostream>
 #include <memory>
@@ -12,49 +9,31 @@
 #include "AudioFile.h"
 #include "Commands.h"
 #include "DemoMaterial.h"
+#include "HostCore/Settings/AtomicFile.h"
+#include "HostCore/Studio/StudioModel.h"
 #include "LearnPass.h"
-#include "PluginChain.h"
+#include "MeterRecorder.h"
 #include "ProgressBar.h"
-#include "TemporaryFile.h"
+#include "RunFiles.h"
+#include "StageSettings.h"
 #include "ZenfxError.h"
 
 namespace zenfx {
 
 namespace {
 
-volatile std::sig_atomic_t g_interrupted = 0;
-
-extern "C" void OnInterrupt(int) { g_interrupted = 1; }
-
-// Restores the previous handlers when processing ends.
-class InterruptGuard {
-public:
-    InterruptGuard() {
-        g_interrupted = 0;
-        m_int = std::signal(SIGINT, OnInterrupt);
-        m_term = std::signal(SIGTERM, OnInterrupt);
-    }
-    ~InterruptGuard() {
-        std::signal(SIGINT, m_int);
-        std::signal(SIGTERM, m_term);
-    }
-
-private:
-    void (*m_int)(int);
-    void (*m_term)(int);
-};
-
-bool SameFile(const std::string& a, const std::string& b) {
-    struct stat sa {}, sb {};
-    if (stat(a.c_str(), &sa) != 0 || stat(b.c_str(), &sb) != 0) return false;
-    return sa.st_dev == sb.st_dev && sa.st_ino == sb.st_ino;
-}
+// The rates AudioPlugin::Prepare promises to take.
+constexpr int kLowestRate = 8000;
+constexpr int kHighestRate = 384000;
+constexpr std::uint32_t kLongestBlock = 1u << 20;
 
 std::string Seconds(std::int64_t frames, int rate) {
     std::ostringstream out;
     out << std::fixed << std::setprecision(2) << static_cast<double>(frames) / rate << " s";
     return out.str();
 }
+
+void Warn(const std::string& message) { std::cerr << "zenfx: warning: " << message << "\n"; }
 
 // Channel buffers for the chain and the interleaved frames of the files.
 class BlockBuffers {
@@ -86,49 +65,64 @@ private:
     std::vector<float*> m_pointers;
 };
 
+std::unique_ptr<AudioSource> OpenSource(const std::string& input) {
+    if (input.empty()) return std::make_unique<DemoMaterial>();
+    auto source = std::make_unique<AudioFileReader>(input);
+    if (source->DeclaredFrames() > source->Frames())
+        Warn("'" + input + "' is cut off: its header declares " + std::to_string(source->DeclaredFrames()) +
+             " frames, the file holds " + std::to_string(source->Frames()) + "; processing those");
+    if (source->SampleRate() < kLowestRate || source->SampleRate() > kHighestRate)
+        throw ZenfxError("'" + input + "' is at " + std::to_string(source->SampleRate()) +
+                         " Hz; the plug-ins run at " + std::to_string(kLowestRate) + " to " +
+                         std::to_string(kHighestRate) + " Hz (resample it first)");
+    return source;
+}
+
 }  // namespace
 
 int RunProcess(PluginLibrary& library, const ProcessOptions& options) {
     if (options.stages.empty()) throw ZenfxError("process needs at least one --plugin", kExitUsage);
-    if (options.block < 1 || options.block > (1u << 20))
-        throw ZenfxError("--block must be between 1 and 1048576 frames", kExitUsage);
-    if (!options.input.empty() && (options.input == options.output || SameFile(options.input, options.output)))
-        throw ZenfxError("the output '" + options.output + "' is the input file; choose another output path",
-                         kExitUsage);
+    if (options.block < 1 || options.block > kLongestBlock)
+        throw ZenfxError("--block must be between 1 and " + std::to_string(kLongestBlock) + " frames", kExitUsage);
+    RunFiles files;
+    if (!options.input.empty()) files.AddInput(options.input);
+    files.AddOutput("-o", options.output);
+    if (!options.metersJson.empty()) files.AddOutput("--meters-json", options.metersJson);
 
-    const auto open = [&options]() -> std::unique_ptr<AudioSource> {
-        if (options.input.empty()) return std::make_unique<DemoMaterial>();
-        return std::make_unique<AudioFileReader>(options.input);
-    };
-    std::unique_ptr<AudioSource> source = open();
+    const auto open = [&options] { return OpenSource(options.input); };
+    const std::unique_ptr<AudioSource> source = open();
     const int channels = source->Channels();
     const int rate = source->SampleRate();
     const int format = ChooseOutputFormat(options.output, source->Format(), options.format);
 
-    PluginChain chain;
-    for (const StageSpec& spec : options.stages) chain.Add(library, spec.plugin);
-    chain.ConfigureChannels(static_cast<std::uint32_t>(channels));
-    for (std::size_t s = 0; s < options.stages.size(); ++s) {
-        for (const auto& [action, argument] : options.stages[s].actions) {
-            if (action == "--preset") PluginChain::ApplyPreset(chain.Stages()[s], argument);
-            else PluginChain::ApplySetting(chain.Stages()[s], argument);
-        }
+    zen::host::StudioModel studio(library.Interface());
+    const std::size_t channel = studio.AddChannel("zenfx", static_cast<std::uint32_t>(channels));
+    std::vector<MeterRecorder::Plugin> plugins;
+    for (const StageSpec& spec : options.stages) {
+        const PluginEntry plugin = library.FindAudioPlugin(spec.plugin);
+        const std::size_t slot = studio.InsertPlugin(channel, plugin.key);
+        StageSettings(studio.PluginAt(channel, slot), plugin.entry.name, Warn).Apply(spec.actions);
+        plugins.push_back({plugin.entry.name, plugin.key, &studio.PluginAt(channel, slot)});
     }
-    chain.Prepare(rate, options.block);
-    RunLearnPasses(chain, options.stages, open, options.block);
-    const std::uint64_t latency = chain.Latency();
+    studio.Prepare(rate, options.block);
+    RunLearnPasses(studio, channel, options.stages, open, options.block);
+    const std::uint64_t latency = studio.Latency(channel);
 
+    // Every destination is taken before the run, so that one that cannot be
+    // written fails now rather than after an hour of processing.
     AudioFileWriter writer(options.output, rate, channels, format);
+    std::unique_ptr<zen::host::AtomicFile> metersFile;
+    if (!options.metersJson.empty()) metersFile = std::make_unique<zen::host::AtomicFile>(options.metersJson);
+
+    MeterRecorder meters(plugins);
     BlockBuffers buffers(channels, options.block);
     const std::int64_t total = source->Frames();
     std::uint64_t skip = options.compensateLatency ? latency : 0;
     std::int64_t written = 0;
     bool inputDone = false;
     {
-        InterruptGuard interrupts;
         ProgressBar progress(total);
         while (written < total) {
-            if (g_interrupted) throw ZenfxError("interrupted; nothing was written", kExitInterrupted);
             const std::size_t block = options.block;
             std::size_t got = 0;
             if (!inputDone) {
@@ -138,7 +132,9 @@ int RunProcess(PluginLibrary& library, const ProcessOptions& options) {
             // After the input, silence pushes the chain's delayed tail out.
             std::fill(buffers.Interleaved() + got * channels, buffers.Interleaved() + block * channels, 0.0f);
             buffers.Deinterleave(block);
-            chain.Process(buffers.Channels(), block);
+            if (!studio.Process(channel, buffers.Channels(), block))
+                throw ZenfxError("a plug-in of the chain refused to process a block");
+            meters.Update();
 
             const std::size_t first = static_cast<std::size_t>(std::min<std::uint64_t>(skip, block));
             skip -= first;
@@ -150,15 +146,19 @@ int RunProcess(PluginLibrary& library, const ProcessOptions& options) {
             progress.Update(written);
         }
     }
+    // Every output complete before any replaces what was there.
+    writer.Close();
+    if (metersFile) metersFile->Write(meters.Json().dump(2) + "\n");
     writer.Commit();
-    if (!options.metersJson.empty()) WriteFileAtomically(options.metersJson, chain.MetersJson().dump(2) + "\n");
+    if (metersFile) metersFile->Commit();
 
+    std::string names;
+    for (const MeterRecorder::Plugin& plugin : plugins) names += (names.empty() ? "" : " -> ") + plugin.name;
     std::cout << "zenfx: processed " << source->Description() << " (" << Seconds(total, rate) << ", " << channels
-              << " ch, " << rate << " Hz) through " << chain.Names() << "\n"
+              << " ch, " << rate << " Hz) through " << names << "\n"
               << "zenfx: wrote " << options.output << " (" << DescribeFormat(format) << "); chain latency "
-              << latency << " samples, "
-              << (options.compensateLatency ? "compensated" : "not compensated") << "\n";
-    if (!options.metersJson.empty()) std::cout << "zenfx: meters in " << options.metersJson << "\n";
+              << latency << " samples, " << (options.compensateLatency ? "compensated" : "not compensated") << "\n";
+    if (metersFile) std::cout << "zenfx: meters in " << options.metersJson << "\n";
     return 0;
 }
 

@@ -8,7 +8,6 @@ namespace zenfx {
 
 constexpr int kExitFailure = 1;
 constexpr int kExitUsage = 2;
-constexpr int kExitInterrupted = 130;
 
 class ZenfxError : public std::runtime_error {
 public:

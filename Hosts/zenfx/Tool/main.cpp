@@ -3,6 +3,7 @@
 #include <iostream>
 
 #include "Commands.h"
+#include "SignalCleanup.h"
 #include "ZenfxError.h"
 
 namespace {
@@ -99,7 +100,8 @@ int main(int argc, char** argv) {
     bool noCompensation = false;
     processCommand->add_flag("--no-latency-compensation", noCompensation,
                              "Keep the chain's delay instead of aligning output with input");
-    processCommand->add_option("--format", process.format, "Sample format: pcm16, pcm24, pcm32, float, double");
+    processCommand->add_option("--format", process.format,
+                               "Sample format: pcm16, pcm24, pcm32, float, double (any case)");
     processCommand->add_option("--meters-json", process.metersJson, "Write every plug-in's final meters here");
 
     zenfx::ValidateOptions validate;
@@ -189,6 +191,7 @@ int main(int argc, char** argv) {
         return zenfx::kExitUsage;
     }
 
+    zenfx::InstallSignalCleanup();
     try {
         if (*demo) return zenfx::RunDemo(demoOutput, demoFormat);
         zenfx::PluginLibrary library(libraryPath);

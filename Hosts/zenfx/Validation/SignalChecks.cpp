@@ -17,6 +17,8 @@ constexpr float kFullScale = 1.0f;
 // Non-finite input goes in at this block, after the plug-in has settled.
 constexpr std::size_t kPoisonBlock = 4;
 constexpr std::size_t kRecoveryBlocks = 8;
+// Huge values also come as a burst of this many samples on every channel.
+constexpr std::size_t kBurstFrames = 100;
 // Each timed run lasts at least this long, so that neither the clock's
 // resolution nor a stray interrupt decides.
 constexpr double kShortestTimedRun = 0.002;
@@ -35,11 +37,6 @@ std::string Ratio(double ratio) {
     std::ostringstream out;
     out << std::fixed << std::setprecision(2) << ratio << "x";
     return out.str();
-}
-
-std::string ValueName(float value) {
-    if (std::isnan(value)) return "NaN";
-    return value > 0 ? "+Inf" : "-Inf";
 }
 
 Planar Concatenate(const std::vector<Planar>& parts) {
@@ -95,6 +92,7 @@ void SignalChecks::Run() {
         });
     });
     m_context.Run("signals.non-finite", [this] { return NonFinite(); });
+    m_context.Run("signals.huge", [this] { return Huge(); });
     m_context.Run("signals.denormals", [this] { return Denormals(); });
     m_context.Run("meters.readings", [this] { return Meters(); });
 }
@@ -164,41 +162,70 @@ CheckOutcome SignalChecks::Stress(const std::string& what,
 }
 
 CheckOutcome SignalChecks::NonFinite() {
-    auto probe = m_context.NewInstance();
-    if (!probe->HasAudioInput()) return Skip("no audio input");
+    if (!m_context.NewInstance()->HasAudioInput()) return Skip("no audio input");
+    const std::vector<float> values = {std::numeric_limits<float>::quiet_NaN(), std::numeric_limits<float>::infinity(),
+                                       -std::numeric_limits<float>::infinity()};
+    const int cases = Poisoned(values, {Shape::OneSample, Shape::WholeBlock}, true);
+    return Pass(std::to_string(cases) + " cases (NaN, +Inf, -Inf; one sample, a whole block; defaults and a " +
+                "random setting): the output stays finite, and bounded again one block plus the latency later");
+}
+
+CheckOutcome SignalChecks::Huge() {
+    if (!m_context.NewInstance()->HasAudioInput()) return Skip("no audio input");
+    const std::vector<float> values = {1e18f, -1e19f, 3e38f, -std::numeric_limits<float>::max()};
+    const int cases = Poisoned(values, {Shape::OneSample, Shape::Burst, Shape::WholeBlock}, false);
+    return Pass(std::to_string(cases) + " cases (1e18, -1e19, 3e38, -3.4e38; one sample, " +
+                std::to_string(kBurstFrames) + " samples, a whole block; defaults and a random setting): " +
+                "the output stays finite");
+}
+
+int SignalChecks::Poisoned(const std::vector<float>& values, const std::vector<Shape>& shapes, bool boundedAfter) {
     const std::uint32_t block = ValidationContext::kBlock;
-    const float bad[] = {std::numeric_limits<float>::quiet_NaN(), std::numeric_limits<float>::infinity(),
-                         -std::numeric_limits<float>::infinity()};
+    const std::vector<std::vector<float>> settings = {m_context.Defaults(), m_context.RandomSetting()};
     int cases = 0;
-    for (float value : bad) {
-        for (bool wholeBlock : {false, true}) {
-            auto plugin = m_context.NewPrepared();
-            const std::uint64_t latency = plugin->Audio().GetLatency();
-            const std::size_t poisonStart = kPoisonBlock * block;
-            const std::size_t poisonEnd = poisonStart + block;
-            const std::size_t frames = poisonEnd + block + latency + kRecoveryBlocks * block;
-            Planar input = signals::Noise(plugin->Width(), frames, ValidationContext::kTestLevel, m_context.Random());
-            if (wholeBlock) {
-                for (auto& channel : input) std::fill(channel.begin() + poisonStart, channel.begin() + poisonEnd, value);
-            } else {
-                input[0][poisonStart + 100] = value;
+    for (double rate : m_context.CheckRates()) {
+        for (std::size_t s = 0; s < settings.size(); ++s) {
+            for (float value : values) {
+                for (Shape shape : shapes) {
+                    auto plugin = m_context.NewInstance();
+                    Require(plugin->SetAll(settings[s]), "a parameter value was refused");
+                    Require(plugin->Prepare(rate, ValidationContext::kMaxBlock),
+                            "Prepare at " + Hertz(rate) + " was refused");
+                    const std::uint64_t latency = plugin->Audio().GetLatency();
+                    // Into a block the plug-in has settled in, at an odd offset.
+                    const std::size_t start = kPoisonBlock * block + (shape == Shape::WholeBlock ? 0 : 100);
+                    const std::size_t length =
+                        shape == Shape::OneSample ? 1 : (shape == Shape::Burst ? kBurstFrames : block);
+                    const std::size_t frames = start + length + block + latency + kRecoveryBlocks * block;
+                    Planar input =
+                        signals::Noise(plugin->Width(), frames, ValidationContext::kTestLevel, m_context.Random());
+                    for (std::size_t c = 0; c < input.size(); ++c) {
+                        if (shape == Shape::OneSample && c > 0) break;
+                        std::fill_n(input[c].begin() + static_cast<std::ptrdiff_t>(start), length, value);
+                    }
+                    const Planar output = plugin->Run(input, block);
+                    const std::string what =
+                        "after " +
+                        (shape == Shape::OneSample ? "one sample of " + signals::ValueName(value) +
+                                                         " on channel 1 at frame " + std::to_string(start)
+                                                   : std::to_string(length) + " samples of " +
+                                                         signals::ValueName(value) + " on every channel (frames " +
+                                                         std::to_string(start) + " to " +
+                                                         std::to_string(start + length - 1) + ")") +
+                        " with " + (s == 0 ? "the defaults" : "a random setting") + " at " + Hertz(rate);
+                    const signals::Inspection found = signals::Inspect(output);
+                    Require(found.finite, what + ": " + signals::DescribeFault(found));
+                    if (boundedAfter) {
+                        const std::size_t from = start + length + block + latency;
+                        RequireSane(output, what + ", from frame " + std::to_string(from) +
+                                                " (one block plus the latency later)", from);
+                    }
+                    ++cases;
+                }
             }
-            const Planar output = plugin->Run(input, block);
-            // Finite again within one block plus the latency.
-            const std::size_t allowedUntil = poisonEnd + block + latency;
-            const std::string what = std::string(wholeBlock ? "a block of " : "one ") + ValueName(value) +
-                                     (wholeBlock ? "" : " sample") + " in the block ending at frame " +
-                                     std::to_string(poisonEnd);
-            const std::string allowed = " (allowed: one block plus the latency, to frame " + std::to_string(allowedUntil) + ")";
-            const signals::Inspection after = signals::Inspect(output, allowedUntil);
-            Require(after.finite, "after " + what + " the output is still non-finite at frame " +
-                                      std::to_string(after.firstNonFinite) + allowed);
-            RequireSane(output, "after " + what, allowedUntil);
-            ++cases;
         }
     }
-    return Pass(std::to_string(cases) + " cases (one sample, a whole block; NaN, +Inf, -Inf): finite output again " +
-                "within one block plus the latency");
+    return cases;
 }
 
 CheckOutcome SignalChecks::Denormals() {
@@ -292,8 +319,10 @@ CheckOutcome SignalChecks::Meters() {
             } else {
                 values = {audio.GetMeter(i)};
             }
-            for (float v : values)
-                Require(std::isfinite(v), which + " reads " + std::to_string(v) + " after " + after);
+            for (std::size_t v = 0; v < values.size(); ++v)
+                Require(std::isfinite(values[v]), which + " reads " + signals::ValueName(values[v]) +
+                                                      (values.size() > 1 ? " at value " + std::to_string(v) : "") +
+                                                      " after " + after);
         }
     };
     plugin->Run(signals::Noise(width, 4 * block, kFullScale, m_context.Random()), block);
@@ -306,8 +335,15 @@ CheckOutcome SignalChecks::Meters() {
         plugin->Run(poisoned, block);
         plugin->Run(signals::Noise(width, 2 * block + latency, ValidationContext::kTestLevel, m_context.Random()), block);
         readAll("a NaN and then finite input", false);
+        Planar huge = signals::Noise(width, block, ValidationContext::kTestLevel, m_context.Random());
+        for (auto& channel : huge) std::fill(channel.begin() + 10, channel.begin() + 110, 3e38f);
+        plugin->Run(huge, block);
+        readAll("100 samples of 3e+38", true);
+        plugin->Run(signals::Noise(width, 2 * block + latency, ValidationContext::kTestLevel, m_context.Random()), block);
+        readAll("100 samples of 3e+38 and then finite input", true);
     }
-    return Pass(std::to_string(count) + " meters described; readings are numbers after noise, silence and NaN input");
+    return Pass(std::to_string(count) +
+                " meters described; readings are numbers after noise, silence, NaN and huge input");
 }
 
 }  // namespace zenfx

@@ -1,5 +1,5 @@
 // Silence and tails, DC, full-scale noise, impulses, sines near Nyquist,
-// non-finite and denormal input, and the meters that read them.
+// non-finite, huge and denormal input, and the meters that read them.
 #pragma once
 
 #include "ValidationContext.h"
@@ -20,7 +20,15 @@ private:
     CheckOutcome Silence();
     CheckOutcome Tail();
     CheckOutcome Stress(const std::string& what, const std::function<Planar(std::uint32_t width, double rate)>& make);
+    enum class Shape { OneSample, Burst, WholeBlock };
+
     CheckOutcome NonFinite();
+    CheckOutcome Huge();
+    // `values` in each shape into noise, at every check rate with the
+    // defaults and a random setting: the output must stay finite, and with
+    // `boundedAfter` be sane one block plus the latency later. Returns the
+    // number of cases.
+    int Poisoned(const std::vector<float>& values, const std::vector<Shape>& shapes, bool boundedAfter);
     CheckOutcome Denormals();
     CheckOutcome Meters();
 

@@ -1,10 +1,12 @@
 // zenfx validate: the validation battery over one, several or every plug-in.
+#include <algorithm>
 #include <cstdio>
 #include <iostream>
 
 #include <nlohmann/json.hpp>
 
 #include "Commands.h"
+#include "NameSuggestions.h"
 #include "ValidationContext.h"
 #include "Validator.h"
 #include "ZenfxError.h"
@@ -44,9 +46,33 @@ std::vector<PluginEntry> ChoosePlugins(PluginLibrary& library, const ValidateOpt
     return plugins;
 }
 
+// A --check that matches no check would pass by checking nothing.
+void RequireKnownChecks(const ValidateOptions& options) {
+    const std::vector<std::string> ids = Validator::CheckIds();
+    std::vector<std::string> groups;
+    for (const std::string& id : ids) {
+        const std::string group = id.substr(0, id.find('.'));
+        if (std::find(groups.begin(), groups.end(), group) == groups.end()) groups.push_back(group);
+    }
+    for (const std::string& prefix : options.checks) {
+        const bool matches = std::any_of(ids.begin(), ids.end(), [&](const std::string& id) {
+            return id.compare(0, prefix.size(), prefix) == 0;
+        });
+        if (matches) continue;
+        std::vector<std::string> names = groups;
+        names.insert(names.end(), ids.begin(), ids.end());
+        std::string list;
+        for (const std::string& group : groups) list += (list.empty() ? "" : ", ") + group;
+        throw ZenfxError("no check matches --check '" + prefix + "'" + DidYouMean(prefix, names) +
+                             " (the groups: " + list + "; zenfx validate prints every check's name)",
+                         kExitUsage);
+    }
+}
+
 }  // namespace
 
 int RunValidate(PluginLibrary& library, const ValidateOptions& options) {
+    RequireKnownChecks(options);
     const std::vector<PluginEntry> plugins = ChoosePlugins(library, options);
     Validator validator(library, options);
     Counts total;

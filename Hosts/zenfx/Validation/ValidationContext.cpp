@@ -19,7 +19,7 @@ std::uint32_t HashKey(const std::string& key) {
 
 ValidationContext::ValidationContext(PluginLibrary& library, PluginEntry plugin, const ValidateOptions& options,
                                      Listener listener)
-    : m_library(library),
+    : m_library(&library),
       m_plugin(std::move(plugin)),
       m_options(options),
       m_listener(std::move(listener)),
@@ -32,6 +32,8 @@ ValidationContext::ValidationContext(PluginLibrary& library, PluginEntry plugin,
     }
 }
 
+ValidationContext::ValidationContext(const ValidateOptions& options) : m_options(options) {}
+
 std::vector<double> ValidationContext::CheckRates() const {
     if (Level() <= 2) return {kSampleRate};
     if (Level() == 3) return {kSampleRate, 96000.0};
@@ -39,7 +41,8 @@ std::vector<double> ValidationContext::CheckRates() const {
 }
 
 std::unique_ptr<PluginUnderTest> ValidationContext::NewInstance() {
-    zen::PluginInstance* instance = m_library.Interface().CreatePlugin(m_plugin.kind, m_plugin.key);
+    if (m_library == nullptr) throw CheckFailure("a listing context runs no check");
+    zen::PluginInstance* instance = m_library->Interface().CreatePlugin(m_plugin.kind, m_plugin.key);
     if (instance == nullptr) throw CheckFailure("the library could not create an instance");
     return std::make_unique<PluginUnderTest>(std::unique_ptr<zen::PluginInstance>(instance), m_tally);
 }
@@ -83,6 +86,10 @@ bool ValidationContext::Wants(const std::string& id) const {
 
 void ValidationContext::Run(const std::string& id, const std::function<CheckOutcome()>& check) {
     if (!Wants(id)) return;
+    if (m_library == nullptr) {
+        m_listed.push_back(id);
+        return;
+    }
     m_tally.check = id;
     CheckOutcome outcome;
     try {

@@ -33,6 +33,9 @@ public:
     static constexpr double kMatchTolerance = 1e-5;
 
     ValidationContext(PluginLibrary& library, PluginEntry plugin, const ValidateOptions& options, Listener listener);
+    // A context that runs no check but lists the id of every one asked of it.
+    explicit ValidationContext(const ValidateOptions& options);
+    const std::vector<std::string>& Listed() const { return m_listed; }
 
     const PluginEntry& Plugin() const { return m_plugin; }
     int Level() const { return m_options.level; }
@@ -67,7 +70,7 @@ public:
     const std::vector<CheckResult>& Results() const { return m_results; }
 
 private:
-    PluginLibrary& m_library;
+    PluginLibrary* m_library = nullptr;  // null when only listing
     PluginEntry m_plugin;
     const ValidateOptions& m_options;
     Listener m_listener;
@@ -75,6 +78,7 @@ private:
     RealtimeTally m_tally;
     std::vector<zen::ParameterInfo> m_parameters;
     std::vector<CheckResult> m_results;
+    std::vector<std::string> m_listed;
 };
 
 // Fails the running check when `output` (from frame `from` on) holds a NaN,

@@ -56,12 +56,18 @@ Planar Slice(const Planar& signal, std::size_t from, std::size_t count) {
 
 Inspection Inspect(const Planar& signal, std::size_t from) {
     Inspection result;
-    for (const auto& channel : signal) {
+    for (std::size_t c = 0; c < signal.size(); ++c) {
+        const auto& channel = signal[c];
         for (std::size_t i = from; i < channel.size(); ++i) {
             const float x = channel[i];
             if (!std::isfinite(x)) {
-                if (result.finite || i < result.firstNonFinite) result.firstNonFinite = i;
+                if (result.finite || i < result.firstNonFinite) {
+                    result.firstNonFinite = i;
+                    result.nonFiniteChannel = c;
+                    result.nonFiniteValue = x;
+                }
                 result.finite = false;
+                ++result.nonFiniteCount;
                 continue;
             }
             const float magnitude = std::fabs(x);
@@ -102,10 +108,20 @@ std::string Decibels(double gain) {
     return out.str();
 }
 
+std::string ValueName(float value) {
+    if (std::isnan(value)) return "NaN";
+    if (std::isinf(value)) return value > 0 ? "+Inf" : "-Inf";
+    std::ostringstream out;
+    out << value;
+    return out.str();
+}
+
 std::string DescribeFault(const Inspection& inspection) {
     std::ostringstream out;
     if (!inspection.finite) {
-        out << "non-finite output at frame " << inspection.firstNonFinite;
+        out << ValueName(inspection.nonFiniteValue) << " at frame " << inspection.firstNonFinite << " on channel "
+            << inspection.nonFiniteChannel + 1 << " (" << inspection.nonFiniteCount << " non-finite sample"
+            << (inspection.nonFiniteCount == 1 ? "" : "s") << " in all)";
     } else if (inspection.peak > kOutputLimit) {
         out << "output peak " << inspection.peak << " (" << Decibels(inspection.peak) << ") at frame "
             << inspection.peakFrame << ", above the limit of " << Decibels(kOutputLimit);

@@ -33,6 +33,9 @@ Planar Slice(const Planar& signal, std::size_t from, std::size_t count);
 struct Inspection {
     bool finite = true;
     std::size_t firstNonFinite = 0;  // frame of the first NaN or infinity
+    std::size_t nonFiniteChannel = 0;
+    float nonFiniteValue = 0.0f;
+    std::size_t nonFiniteCount = 0;
     float peak = 0.0f;               // largest finite magnitude
     std::size_t peakFrame = 0;
     std::size_t subnormals = 0;
@@ -44,10 +47,13 @@ Inspection Inspect(const Planar& signal, std::size_t from = 0);
 // Largest |a - b| over common frames and channels, and where it is.
 double MaxDifference(const Planar& a, const Planar& b, std::size_t* frame = nullptr);
 
-// "NaN at frame 17", "peak 143.2 (+43.1 dBFS) at frame 4", "" when neither.
+// "NaN at frame 17 on channel 2 (30 non-finite samples in all)", "peak 143.2
+// (+43.1 dBFS) at frame 4", "" when neither.
 std::string DescribeFault(const Inspection& inspection);
 
 std::string Decibels(double gain);
+// "NaN", "+Inf", "-Inf", or the number ("1e+19").
+std::string ValueName(float value);
 
 }  // namespace signals
 }  // namespace zenfx

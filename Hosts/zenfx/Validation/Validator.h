@@ -19,7 +19,12 @@ public:
     // Every check the options ask for; `listener` hears each as it ends.
     std::vector<CheckResult> Validate(const PluginEntry& plugin, const ValidationContext::Listener& listener);
 
+    // The id of every check, in the order they run.
+    static std::vector<std::string> CheckIds();
+
 private:
+    static void RunGroups(ValidationContext& context);
+
     PluginLibrary& m_library;
     const ValidateOptions& m_options;
 };

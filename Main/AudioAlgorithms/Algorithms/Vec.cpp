@@ -1,6 +1,7 @@
 #include "Algorithms/Vec.h"
 
 #include <cmath>
+#include <limits>
 
 namespace ora::numeric {
 
@@ -35,9 +36,18 @@ void Clamp(const float* a, float lo, float hi, float* out, std::size_t n) {
     }
 }
 
+void Sanitize(const float* a, float limit, float* out, std::size_t n) {
+    for (std::size_t i = 0; i < n; ++i) {
+        const float magnitude = std::fabs(a[i]);
+        // Both comparisons are false for NaN.
+        if (magnitude <= limit) out[i] = a[i];
+        else out[i] = magnitude <= std::numeric_limits<float>::max() ? std::copysign(limit, a[i]) : 0.0f;
+    }
+}
+
 }  // namespace
 
-const VecKernels kVec_ref = {Add, Subtract, Multiply, Scale, Abs, Clamp};
+const VecKernels kVec_ref = {Add, Subtract, Multiply, Scale, Abs, Clamp, Sanitize};
 
 }  // namespace kernels
 

@@ -30,6 +30,11 @@ public:
     void Clamp(const float* a, float lo, float hi, float* out, std::size_t n) const noexcept {
         m_kernels->clamp(a, lo, hi, out, n);
     }
+    // out = a where |a| <= limit, +-limit for larger finite values, 0 for NaN
+    // and infinities. `limit` is positive and finite.
+    void Sanitize(const float* a, float limit, float* out, std::size_t n) const noexcept {
+        m_kernels->sanitize(a, limit, out, n);
+    }
 
     system::KernelForm GetForm() const { return m_form; }
     const char* FormName() const { return system::KernelFormName(m_form); }

@@ -228,6 +228,11 @@ bool ZenAudioPluginImpl::Process(float* const* channels, std::uint64_t frames) n
         zen::GlobalSmoothing::EnterProcessing();
     }
     ApplyPendingParameters();
+    for (std::uint32_t c = 0; c < m_inputs; ++c) {
+        if (m_countNonFinite)
+            for (std::uint64_t i = 0; i < frames; ++i) m_nonFiniteInput += std::isfinite(channels[c][i]) ? 0 : 1;
+        m_vec.Sanitize(channels[c], kInputLimit, channels[c], frames);
+    }
 
     const std::uint32_t channelCount = GetProcessChannelCount();
     const auto maxChunk = static_cast<std::uint64_t>(m_blockSize);

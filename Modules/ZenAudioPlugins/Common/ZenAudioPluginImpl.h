@@ -34,6 +34,7 @@
 #include "PendingBits.h"
 #include "SmoothedValueGroup.h"
 #include "Algorithms/Delay.h"
+#include "Algorithms/Vec.h"
 #include "zen/AudioPlugin.h"
 #include "zen/PluginInstance.h"
 #include "zen/ZenControlValueHost.h"
@@ -54,6 +55,10 @@ public:
     static constexpr std::uint32_t kMaxBlockSize = 1u << 20;
     // Length of the cross-fade when bypass is switched.
     static constexpr double kBypassFadeSeconds = 0.010;
+    // Input samples are held within +-kInputLimit (+200 dBFS) and NaN and
+    // infinities become 0 before any plug-in sees them: far beyond real audio,
+    // and low enough that squares and sums inside every plug-in stay finite.
+    static constexpr float kInputLimit = 1e10f;
 
     ~ZenAudioPluginImpl() override;
 
@@ -178,6 +183,12 @@ protected:
     virtual void SaveStateFields(QJsonObject& root) const;
     virtual bool LoadStateFields(const QJsonObject& root);
 
+    // For plug-ins that report bad input, which the input guard replaces
+    // before they see it: from then on, NaN and infinities met on the inputs
+    // are counted, a running total that only grows.
+    void CountNonFiniteInput() { m_countNonFinite = true; }
+    std::uint64_t NonFiniteInputSamples() const noexcept { return m_nonFiniteInput; }
+
     // Reports the latency; call from PrepareProcessing.
     void SetLatency(std::uint32_t samples) { m_latency.store(samples, std::memory_order_release); }
 
@@ -226,5 +237,9 @@ private:
     zen::Delay m_bypassDelay;
     std::vector<float> m_dry;  // channel-major scratch, kMaxChannels x block size at most
     bool m_dryFilled = false;  // m_dry holds this block's delayed input; audio thread
+
+    ora::numeric::Vec m_vec;
+    bool m_countNonFinite = false;
+    std::uint64_t m_nonFiniteInput = 0;  // audio thread
 };
 

@@ -170,6 +170,11 @@ std::vector<Family> Families() {
                             return std::function<void()>(
                                 [=] { f->Clamp(a, -0.5f, 0.5f, out, kFrames); });
                         }});
+    families.push_back({"Vec/Sanitize", false, false, [=] {
+                            auto f = std::make_shared<Vec>();
+                            return std::function<void()>(
+                                [=] { f->Sanitize(a, 0.5f, out, kFrames); });
+                        }});
     families.push_back({"Blas1/Dot", false, false, [=] {
                             auto f = std::make_shared<Blas1>();
                             return std::function<void()>(

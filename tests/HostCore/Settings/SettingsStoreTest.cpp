@@ -1,21 +1,13 @@
 // Settings files: where they live, and that the previous document survives
-// a refused document and a process killed in the middle of a write.
+// a refused document.
 #include <gtest/gtest.h>
-#include <signal.h>
-#include <sys/wait.h>
-#include <unistd.h>
 
-#include <chrono>
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
-#include <random>
 #include <sstream>
-#include <thread>
 
 #include "HostCore/HostError.h"
-#include "HostCore/Settings/AtomicFile.h"
-#include "HostCore/Settings/Documents/BChainDocument.h"
 #include "HostCore/Settings/Documents/TalkbackDocument.h"
 #include "HostCore/Settings/SettingsStore.h"
 
@@ -101,29 +93,4 @@ TEST(SettingsStore, WritesCreateTheFolderAndARefusedDocumentLeavesTheOldOne) {
         EXPECT_EQ(std::string(e.what()).rfind(store.PathOf(schema) + ":1:", 0), 0u) << e.what();
     }
     EXPECT_THROW(SettingsStore("/proc/no-such/folder").Write(schema, d.ToXml()), zen::host::HostError);
-}
-
-TEST(AtomicFile, AProcessKilledWhileWritingLeavesTheOldDocumentOrTheNewOneWhole) {
-    Folder folder;
-    const std::string path = (folder.path / "BChainSettings.xml").string();
-    // Two large documents, so a kill lands inside a write most of the time.
-    const std::string one = SettingsDocument(zen::host::BChainDocument::Schema()).ToXml();
-    std::string first;
-    for (int i = 0; i < 300; ++i) first += one;
-    const std::string second(first.size() + 12345, 'y');
-    zen::host::AtomicFile::Replace(path, first);
-    std::mt19937 random(3);
-    for (int round = 0; round < 8; ++round) {
-        const pid_t child = fork();
-        ASSERT_GE(child, 0);
-        if (child == 0) {
-            for (int i = 0;; ++i) zen::host::AtomicFile::Replace(path, i % 2 == 0 ? second : first);
-        }
-        std::this_thread::sleep_for(std::chrono::microseconds(std::uniform_int_distribution<int>(200, 30000)(random)));
-        kill(child, SIGKILL);
-        int status = 0;
-        waitpid(child, &status, 0);
-        const std::string now = ReadFile(path);
-        ASSERT_TRUE(now == first || now == second) << "round " << round << ": " << now.size() << " bytes";
-    }
 }

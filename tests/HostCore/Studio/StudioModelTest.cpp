@@ -50,9 +50,24 @@ TEST(StudioModel, ChannelsRunTheirChainsInOrderWithBypassAndLatency) {
 
     EXPECT_THROW(studio.InsertPlugin(vocal, "No Such Plug-in"), zen::host::HostError);
     EXPECT_THROW(studio.InsertPlugin(vocal, "Test Delay", 5), zen::host::HostError);
-    const std::size_t wide = studio.AddChannel("Wide", 3);
-    EXPECT_THROW(studio.InsertPlugin(wide, "Test Delay"), zen::host::HostError);  // two channels at most
     EXPECT_FALSE(studio.Process(99, buffers, 64));
+}
+
+// A refused layout names what the plug-in takes; a channel whose source is
+// narrower offers the first slot that many inputs.
+TEST(StudioModel, RefusedLayoutsSayWhatThePluginTakes) {
+    StudioModel studio(*GetZenPluginInterface());
+    const auto refusal = [&](std::size_t channel) {
+        try {
+            studio.InsertPlugin(channel, "Test Delay");
+        } catch (const zen::host::HostError& e) {
+            return std::string(e.what());
+        }
+        return std::string("accepted");
+    };
+    EXPECT_EQ(refusal(studio.AddChannel("Wide", 3)), "'Test Delay' does not accept 3 channels (it takes 1 or 2)");
+    EXPECT_EQ(refusal(studio.AddChannel("Mono source", 2, 1)), "'Test Delay' does not take 1 channel in and 2 out");
+    EXPECT_THROW(studio.AddChannel("Narrowing", 1, 2), zen::host::HostError);
 }
 
 TEST(StudioModel, PluginsActOnTheirOwnChannelThroughHostActions) {

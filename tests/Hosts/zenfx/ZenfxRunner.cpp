@@ -1,8 +1,13 @@
 #include "ZenfxRunner.h"
 
+#include <fcntl.h>
+#include <signal.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <algorithm>
+#include <cerrno>
+#include <csignal>
 #include <cstdio>
 #include <cstdlib>
 #include <filesystem>
@@ -52,6 +57,50 @@ ZenfxResult RunProgram(const std::string& program, const std::vector<std::string
     return result;
 }
 
+ZenfxProcess::ZenfxProcess(const std::vector<std::string>& arguments, bool ignoreHangup) {
+    char errPath[] = "/tmp/zenfx-err-XXXXXX";
+    close(mkstemp(errPath));
+    m_errPath = errPath;
+    std::vector<std::string> argv = {ZENFX_PATH};
+    argv.insert(argv.end(), arguments.begin(), arguments.end());
+    std::vector<char*> pointers;
+    for (std::string& a : argv) pointers.push_back(a.data());
+    pointers.push_back(nullptr);
+    m_pid = fork();
+    if (m_pid != 0) return;
+    // The child: a terminal's dispositions, whatever the test runner had.
+    for (int signal : {SIGHUP, SIGINT, SIGTERM, SIGPIPE}) std::signal(signal, SIG_DFL);
+    if (ignoreHangup) std::signal(SIGHUP, SIG_IGN);
+    sigset_t none;
+    sigemptyset(&none);
+    sigprocmask(SIG_SETMASK, &none, nullptr);
+    const int null = open("/dev/null", O_RDWR);
+    const int err = open(errPath, O_WRONLY | O_TRUNC);
+    dup2(null, 0);
+    dup2(null, 1);
+    dup2(err, 2);
+    execv(ZENFX_PATH, pointers.data());
+    _exit(127);
+}
+
+ZenfxProcess::~ZenfxProcess() {
+    if (m_pid > 0 && !m_reaped) {
+        kill(m_pid, SIGKILL);
+        Wait();
+    }
+    unlink(m_errPath.c_str());
+}
+
+int ZenfxProcess::Wait() {
+    int status = 0;
+    while (waitpid(m_pid, &status, 0) < 0 && errno == EINTR) {
+    }
+    m_reaped = true;
+    return status;
+}
+
+std::string ZenfxProcess::Err() const { return Slurp(m_errPath); }
+
 std::vector<float> AudioData::Channel(int c) const {
     std::vector<float> channel;
     for (std::size_t i = static_cast<std::size_t>(c); i < samples.size(); i += static_cast<std::size_t>(info.channels))
@@ -96,6 +145,7 @@ TempFolder::~TempFolder() { std::filesystem::remove_all(m_path); }
 std::vector<std::string> TempFolder::Files() const {
     std::vector<std::string> names;
     for (const auto& entry : std::filesystem::directory_iterator(m_path)) names.push_back(entry.path().filename());
+    std::sort(names.begin(), names.end());
     return names;
 }
 

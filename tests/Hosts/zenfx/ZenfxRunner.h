@@ -2,6 +2,7 @@
 #pragma once
 
 #include <sndfile.h>
+#include <sys/types.h>
 
 #include <string>
 #include <vector>
@@ -22,6 +23,27 @@ ZenfxResult RunZenfx(const std::vector<std::string>& arguments);
 ZenfxResult RunProgram(const std::string& program, const std::vector<std::string>& arguments,
                        const std::vector<std::string>& environment = {});
 
+// zenfx started in the background, as from a terminal (every signal at its
+// default disposition unless `ignoreHangup`, as nohup starts it), for tests
+// that signal it. Killed and reaped at the end if still running.
+class ZenfxProcess {
+public:
+    explicit ZenfxProcess(const std::vector<std::string>& arguments, bool ignoreHangup = false);
+    ~ZenfxProcess();
+    ZenfxProcess(const ZenfxProcess&) = delete;
+    ZenfxProcess& operator=(const ZenfxProcess&) = delete;
+
+    pid_t Pid() const { return m_pid; }
+    // Waits for the end; the wait status (WIFSIGNALED, WEXITSTATUS, ...).
+    int Wait();
+    std::string Err() const;
+
+private:
+    pid_t m_pid = -1;
+    bool m_reaped = false;
+    std::string m_errPath;
+};
+
 struct AudioData {
     SF_INFO info{};
     std::vector<float> samples;  // interleaved
@@ -38,7 +60,8 @@ public:
     TempFolder();
     ~TempFolder();
     std::string operator/(const std::string& name) const { return m_path + "/" + name; }
-    std::vector<std::string> Files() const;
+    std::vector<std::string> Files() const;  // names, sorted
+    const std::string& Path() const { return m_path; }
 
 private:
     std::string m_path;

@@ -4,6 +4,9 @@
 #include <algorithm>
 #include <cmath>
 #include <fstream>
+#include <iterator>
+#include <set>
+#include <sstream>
 #include <nlohmann/json.hpp>
 
 #include "ZenfxRunner.h"
@@ -63,15 +66,30 @@ TEST(ZenfxInfo, FindsPluginsByNameOrKeyIgnoringCase) {
     }
 }
 
+// Columns line up in characters ("m²" is one column for two bytes), and
+// the text says which unit a plain number is in.
 TEST(ZenfxInfo, TextShowsEachParameterWithItsUnitAndRangeAndThePresets) {
     auto clipper = RunZenfx({"info", "Soft Clipper"});
     EXPECT_NE(clipper.out.find("-18 to 18 dB"), std::string::npos);
     EXPECT_NE(clipper.out.find("Warm Drive"), std::string::npos);
+    EXPECT_NE(clipper.out.find("Threshold=0 and Threshold=0dB are both 0 dB"), std::string::npos) << clipper.out;
     auto reverb = RunZenfx({"info", "Reverb"});
     ASSERT_EQ(reverb.exitCode, 0) << reverb.err;
     for (const char* line : {"Reverb:1517179490", "ZnRb", "T@-60dB", "0.1 to 20 s", "0 to 200 ms", "1 to 100 m",
-                             "20 to 2000 Hz", "0 to 100 %", "Late Rev. Gain"})
+                             "20 to 2000 Hz", "0 to 100 %", "Late Rev. Gain", "1 to 10000 m²",
+                             "Brightness=50 and Brightness=50% are both 50 %"})
         EXPECT_NE(reverb.out.find(line), std::string::npos) << line;
+    std::istringstream lines(reverb.out);
+    std::set<std::size_t> columns;
+    for (std::string line; std::getline(lines, line);) {
+        const std::size_t at = line.find(" default ");
+        if (at == std::string::npos) continue;
+        // Characters before it: UTF-8 continuation bytes take no column.
+        columns.insert(static_cast<std::size_t>(
+            std::count_if(line.begin(), line.begin() + static_cast<std::ptrdiff_t>(at),
+                          [](char c) { return (static_cast<unsigned char>(c) & 0xC0) != 0x80; })));
+    }
+    EXPECT_EQ(columns.size(), 1u) << reverb.out;
 }
 
 TEST(ZenfxProcess, RunsTheChainInOrderWithEachSettingOnItsPlugin) {
@@ -143,7 +161,7 @@ TEST(ZenfxProcess, KeepsRateChannelsLengthAndSampleFormat) {
     } cases[] = {
         {"f.wav", SF_FORMAT_WAV | SF_FORMAT_FLOAT, "f-out.wav", "", SF_FORMAT_WAV | SF_FORMAT_FLOAT},
         {"p.wav", SF_FORMAT_WAV | SF_FORMAT_PCM_24, "p-out.wav", "", SF_FORMAT_WAV | SF_FORMAT_PCM_24},
-        {"f2.wav", SF_FORMAT_WAV | SF_FORMAT_FLOAT, "f2-out.wav", "pcm16", SF_FORMAT_WAV | SF_FORMAT_PCM_16},
+        {"f2.wav", SF_FORMAT_WAV | SF_FORMAT_FLOAT, "f2-out.wav", "PCM16", SF_FORMAT_WAV | SF_FORMAT_PCM_16},
         {"a.aiff", SF_FORMAT_AIFF | SF_FORMAT_PCM_16, "a-out.flac", "", SF_FORMAT_FLAC | SF_FORMAT_PCM_16},
         {"l.flac", SF_FORMAT_FLAC | SF_FORMAT_PCM_24, "l-out.aiff", "", SF_FORMAT_AIFF | SF_FORMAT_PCM_24},
         {"f3.wav", SF_FORMAT_WAV | SF_FORMAT_FLOAT, "f3-out.flac", "", SF_FORMAT_FLAC | SF_FORMAT_PCM_24},
@@ -198,10 +216,12 @@ TEST(ZenfxProcess, MetersOfEveryKindMapToJson) {
     const auto meters = nlohmann::json::parse(file)["plugins"][0]["meters"];
     ASSERT_EQ(meters.size(), 3u);  // mono: one output peak, the array, the ring
     ExpectFields(meters[0], R"({"identifier": "ZenTestDelay::OUTPUT_PEAK_1", "kind": "level"})");
-    EXPECT_TRUE(meters[0]["value"].is_number());
+    EXPECT_TRUE(meters[0]["final"].is_number());
+    EXPECT_TRUE(meters[0]["max"].is_number());
     ExpectFields(meters[1], R"({"identifier": "ZenTestDelay::LAST_SAMPLES", "kind": "array"})");
-    EXPECT_EQ(meters[1]["value"].get<std::vector<float>>(), std::vector<float>(input.end() - 8, input.end()));
-    ExpectFields(meters[2], R"({"identifier": "ZenTestDelay::POINTS", "kind": "ring", "value": null})");
+    EXPECT_EQ(meters[1]["final"].get<std::vector<float>>(), std::vector<float>(input.end() - 8, input.end()));
+    EXPECT_FALSE(meters[1].contains("max"));
+    ExpectFields(meters[2], R"({"identifier": "ZenTestDelay::POINTS", "kind": "ring", "final": null})");
 
     auto info = RunZenfx({"--library", ZEN_TEST_LIBRARY_PATH, "info", "Test Delay", "--json"});
     ASSERT_EQ(info.exitCode, 0) << info.err;
@@ -210,6 +230,43 @@ TEST(ZenfxProcess, MetersOfEveryKindMapToJson) {
     ExpectFields(described[3], R"({"kind": "ring", "size": 2, "capacity": 256})");
     auto text = RunZenfx({"--library", ZEN_TEST_LIBRARY_PATH, "info", "Test Delay"});
     EXPECT_NE(text.out.find("Points (ring of 256 x 2)"), std::string::npos) << text.out;
+}
+
+// A file run reports each level meter's highest reading, not only the last
+// block's: a loud start, a quiet end and a latency flush of silence.
+TEST(ZenfxProcess, MetersOfAFileRunAreTheFinalReadingsAndTheLevelsMaxima) {
+    TempFolder folder;
+    std::vector<float> input = Ramp(48000, 0.01f);
+    for (std::size_t n = 0; n < 512; ++n) input[n] = n % 2 == 0 ? 0.5f : -0.5f;
+    WriteAudio(folder / "in.wav", {input}, kRate);
+    auto result = RunZenfx({"--library", ZEN_TEST_LIBRARY_PATH, "process", folder / "in.wav", "-o",
+                            folder / "out.wav", "--plugin", "Test Delay", "--set", "Delay=100", "--meters-json",
+                            folder / "meters.json"});
+    ASSERT_EQ(result.exitCode, 0) << result.err;
+    std::ifstream file(folder / "meters.json");
+    const auto peak = nlohmann::json::parse(file)["plugins"][0]["meters"][0];
+    ExpectFields(peak, R"({"identifier": "ZenTestDelay::OUTPUT_PEAK_1", "kind": "level", "unit": "dBFS"})");
+    EXPECT_NEAR(peak["max"].get<double>(), -6.02, 0.01);
+    EXPECT_LT(peak["final"].get<double>(), -40.0);  // the flush: the quiet end, then silence
+}
+
+// "Meter" at the end of the chain gives the output file's loudness: its
+// integrated value at the end of the run, not the last block's.
+TEST(ZenfxProcess, MeterAtTheEndGivesTheFilesLoudness) {
+    TempFolder folder;
+    // 1 kHz at amplitude 0.1 for 3 s: -23.0 LUFS.
+    std::vector<float> tone(3 * kRate);
+    for (std::size_t n = 0; n < tone.size(); ++n) tone[n] = 0.1f * std::sin(2.0f * 3.14159265f * 1000.0f * n / kRate);
+    WriteAudio(folder / "in.wav", {tone}, kRate);
+    auto result = RunZenfx({"process", folder / "in.wav", "-o", folder / "out.wav", "--plugin", "Meter",
+                            "--meters-json", folder / "meters.json"});
+    ASSERT_EQ(result.exitCode, 0) << result.err;
+    std::ifstream file(folder / "meters.json");
+    const auto meters = nlohmann::json::parse(file)["plugins"][0]["meters"];
+    const auto integrated = std::find_if(meters.begin(), meters.end(),
+                                         [](const auto& m) { return m["identifier"] == "ZenMeter::INTEGRATED"; });
+    ASSERT_NE(integrated, meters.end());
+    EXPECT_NEAR((*integrated)["final"].get<double>(), -23.0, 0.05);
 }
 
 TEST(ZenfxProcess, PresetsThenSettings) {
@@ -222,6 +279,40 @@ TEST(ZenfxProcess, PresetsThenSettings) {
     EXPECT_NEAR(ReadAudio(folder / "out.wav").samples[50], knee * knee, 1e-6);
 }
 
+// Each surprise is a one-line warning on stderr; the run still succeeds.
+TEST(ZenfxProcess, WarnsWhereAValueIsSilentlyDiscardedOrLikelyNotMeant) {
+    TempFolder folder;
+    WriteAudio(folder / "in.wav", {Ramp(1000, 0.5f)}, kRate);
+    const auto warnings = [&](std::vector<std::string> settings, const std::string& input = "") {
+        std::vector<std::string> args = {"process", input.empty() ? folder / "in.wav" : input, "-o",
+                                         folder / "out.wav", "--plugin"};
+        args.insert(args.end(), settings.begin(), settings.end());
+        const auto result = RunZenfx(args);
+        EXPECT_EQ(result.exitCode, 0) << result.err;
+        return result.err;
+    };
+    EXPECT_EQ(warnings({"Soft Clipper", "--set", "Threshold=3", "--set", "threshold=4"}),
+              "zenfx: warning: --set 'threshold=4' for 'Soft Clipper' replaces the earlier --set 'Threshold=3'\n");
+    EXPECT_EQ(warnings({"Soft Clipper", "--set", "Shape=0.2", "--preset", "Warm Drive"}),
+              "zenfx: warning: --preset 'Warm Drive' for 'Soft Clipper' replaces the earlier --set 'Shape=0.2' (a "
+              "--set after the --preset changes the preset's value)\n");
+    EXPECT_EQ(warnings({"Soft Clipper", "--preset", "Warm Drive", "--set", "Shape=0.2"}), "");
+    EXPECT_EQ(warnings({"De-Esser", "--set", "Amount=0.5"}),
+              "zenfx: warning: --set 'Amount=0.5' for 'De-Esser' is 0.5 %; for 50 % write Amount=50%\n");
+    EXPECT_EQ(warnings({"De-Esser", "--set", "Amount=50%"}), "");
+
+    // A WAV file cut off in its data: the frames found and declared.
+    const std::string whole = folder / "whole.wav", cut = folder / "cut.wav";
+    WriteAudio(whole, {Ramp(1000, 0.5f)}, kRate, SF_FORMAT_WAV | SF_FORMAT_PCM_16);
+    std::ifstream in(whole, std::ios::binary);
+    std::string bytes((std::istreambuf_iterator<char>(in)), std::istreambuf_iterator<char>());
+    std::ofstream(cut, std::ios::binary) << bytes.substr(0, bytes.size() - 2 * 400);
+    EXPECT_EQ(warnings({"Soft Clipper"}, cut),
+              "zenfx: warning: '" + cut + "' is cut off: its header declares 1000 frames, the file holds 600; "
+              "processing those\n");
+    EXPECT_EQ(warnings({"Soft Clipper"}, whole), "");
+}
+
 TEST(ZenfxProcess, ValuesTakeUnitsAndChoicesAndLabelsWinOverUpperCaseNames) {
     TempFolder folder;
     auto deessed = RunZenfx({"process", "-o", folder / "out.wav", "--plugin", "De-Esser", "--set", "Frequency=6kHz",
@@ -231,8 +322,8 @@ TEST(ZenfxProcess, ValuesTakeUnitsAndChoicesAndLabelsWinOverUpperCaseNames) {
     const auto meters = nlohmann::json::parse(file)["plugins"][0]["meters"];
     ASSERT_EQ(meters.size(), 2u);
     ExpectFields(meters[0], R"({"name": "Reduction", "unit": "dB"})");
-    EXPECT_LE(meters[0]["value"].get<double>(), 0.5);
-    EXPECT_GT(meters[0]["value"].get<double>(), -20.0);
+    EXPECT_LE(meters[0]["final"].get<double>(), 0.5);
+    EXPECT_GT(meters[0]["final"].get<double>(), -20.0);
     // "Range" is the De-Esser's band shape, "ZenDeesser::RANGE" its frequency.
     auto mixed = RunZenfx({"process", "-o", folder / "out2.wav", "--plugin", "De-Esser", "--set", "range=HF", "--set",
                            "ZenDeesser::RANGE=5k"});
@@ -265,6 +356,7 @@ protected:
         WriteAudio(in, {x}, kRate);
         WriteAudio(folder / "out.wav", {x}, kRate);
         WriteAudio(folder / "three.wav", {x, x, x}, kRate);
+        WriteAudio(folder / "fast.wav", {x}, 768000);
         std::ofstream(folder / "text.wav") << "this is not audio\n";
     }
 
@@ -274,7 +366,7 @@ protected:
             EXPECT_NE(result.exitCode, 0) << expected;
             EXPECT_EQ(Lines(result.err), 1u) << result.err;
             EXPECT_NE(result.err.find(expected), std::string::npos) << result.err;
-            EXPECT_EQ(folder.Files().size(), 4u) << expected << ": a partial or temporary file was left behind";
+            EXPECT_EQ(folder.Files().size(), 5u) << expected << ": a partial or temporary file was left behind";
         }
         EXPECT_EQ(ReadAudio(in).samples, x);
         EXPECT_EQ(ReadAudio(folder / "out.wav").samples, x);
@@ -297,9 +389,10 @@ TEST_F(ZenfxErrors, UnknownNamesAndBadValuesSayWhatIsWrong) {
         {{"process", "-o", o, "--plugin", "Soft Cliper"}, "did you mean 'Soft Clipper'"},
         {{"info", "Sft Clipper"}, "did you mean 'Soft Clipper'"},
         {Clipper({"process", "-o", o}, {"--set", "Treshold=3"}), "did you mean 'Threshold'"},
-        {Clipper({"process", "-o", o}, {"--set", "Threshold=30"}), "out of range (-18 to 18 dB)"},
+        {Clipper({"process", "-o", o}, {"--set", "Threshold=30"}), "out of range (-18 to 18 dB); a plain number is in dB, as in Threshold=0dB"},
         {Clipper({"process", "-o", o}, {"--set", "Threshold=loud"}), "not a value"},
         {Clipper({"process", "-o", o}, {"--set", "Threshold=3 Hz"}), "takes dB"},
+        {Clipper({"process", "-o", o}, {"--set", "Threshold=0x10"}), "is hexadecimal; give a decimal value"},
         {Clipper({"process", "-o", folder / "out.wav"}, {"--set", "Shape=7"}), "out of range"},
     });
 }
@@ -310,10 +403,18 @@ TEST_F(ZenfxErrors, FileAndUsageMistakesLeaveEveryFileAsItWas) {
         {Clipper({"process", folder / "text.wav", "-o", o}), "cannot read"},
         {Clipper({"process", "-o", folder / "o.mp3"}), "unknown file type"},
         {Clipper({"process", "-o", folder / "o.flac", "--format", "float"}), "cannot hold float"},
+        {Clipper({"process", "-o", o, "--format", "pcm12"}), "unknown --format 'pcm12'"},
         {{"--library", ZEN_TEST_LIBRARY_PATH, "process", folder / "three.wav", "-o", o, "--plugin", "Test Delay"},
          "'Test Delay' does not accept 3 channels (it takes 1 or 2)"},
         {Clipper({"process", in, "-o", in}), "is the input file"},
         {Clipper({"process", in, "-o", folder / "./in.wav"}), "is the input file"},
+        {Clipper({"process", folder.Path(), "-o", o}), "it is a folder, not an audio file"},
+        {Clipper({"process", "-", "-o", o}), "reading standard input ('-') is not supported"},
+        {Clipper({"process", in, "-o", "-"}), "writing to standard output ('-') is not supported"},
+        {Clipper({"process", in, "-o", folder / "dir/"}), "is a folder: give a file name in it"},
+        {Clipper({"process", in, "-o", "/dev/null"}), "'/dev/null' is not a regular file"},
+        {Clipper({"process", in, "-o", folder / "o"}), "it has no extension to tell the file type"},
+        {Clipper({"process", folder / "fast.wav", "-o", o}), "is at 768000 Hz; the plug-ins run at 8000 to 384000 Hz"},
         {Clipper({"process", "--set", "a=1", "-o", o}), "comes before any --plugin"},
         {{"process", "-o", o}, "at least one --plugin"},
         {Clipper({"process"}), "--output"},

@@ -158,12 +158,12 @@ TEST(ZenLimiter, ParametersAndMetersAsHostsSeeThem) {
     EXPECT_EQ(plugin.Meter("Input True Peak 2"), -30.0f);
     EXPECT_EQ(plugin.Meter("Output Peak 1"), -30.0f);
 
-    // A peak of 1e38 asks for a gain below the smallest normal float, 0 on
-    // the audio path, which reads -24 dB.
+    // A peak of 1e38 arrives held at 1e10 (+200 dBFS): the meter reads the
+    // gain that takes it under the ceiling, far below its scale but finite.
     Channels io(2, std::vector<float>(500, 0.0f));  // ends in the hold
     io[0][10] = 1e38f;
     plugin.Process(io, 512);
-    EXPECT_EQ(plugin.Meter("Gain Reduction"), -24.0f);
+    EXPECT_NEAR(plugin.Meter("Gain Reduction"), -200.2f, 0.05f);
 }
 
 TEST(ZenLimiter, LatencyIsTheImpulseDelayAndQuietMaterialPassesExactly) {
@@ -391,6 +391,22 @@ TEST(ZenLimiter, SoftRoundsOnlyBlocksOverTheCeilingAboveItsKnee) {
     plugin.Set("Soft", 1.0f);
     const std::vector<float> after = plugin.Run(std::vector<float>(sine.begin() + 12000, sine.end()), 1, 512)[0];
     EXPECT_GT(Distortion(after, 2400, 480.0, 48000.0), 1e-3);
+}
+
+// NaN and infinities arrive as silence and huge values at +200 dBFS: the
+// output stays finite and under the ceiling through all of them.
+TEST(ZenLimiter, NonFiniteAndHugeInputStayUnderTheCeiling) {
+    std::vector<float> input = zentest::Noise(9600, 0.5, 7);
+    input[1000] = NAN;
+    input[2000] = INFINITY;
+    input[3000] = -INFINITY;
+    std::fill(input.begin() + 4000, input.begin() + 4100, 1e19f);
+    std::fill(input.begin() + 6000, input.begin() + 6100, -3e38f);
+    const std::vector<float> output = Limit(input, {});
+    for (std::size_t n = 0; n < output.size(); ++n) {
+        ASSERT_TRUE(std::isfinite(output[n])) << n;
+        ASSERT_LE(std::fabs(output[n]), 1.0f) << n;
+    }
 }
 
 TEST(ZenLimiter, StereoSharesOneGainResetReproducesAndAChannelChangeStartsAfresh) {

@@ -135,9 +135,10 @@ private:
     std::mutex m_mutex;
 };
 
-// "Test NaN State": a one-pole smoother by "Smoothing" whose state nothing
-// clears, so it keeps a NaN or an infinity forever (0 times NaN is NaN, even
-// with no smoothing).
+// "Test NaN State": its own Process, written straight against the host
+// interface and so without the base's input guard, runs a one-pole smoother
+// by "Smoothing" whose state nothing clears: a NaN or an infinity stays in it
+// forever (0 times NaN is NaN, even with no smoothing).
 class ZenTestNanState : public ZenFaultyGain {
     Q_OBJECT
 
@@ -145,20 +146,47 @@ public:
     static constexpr zen::PluginDescriptor kDescriptor = Faulty("Test NaN State", "ZenTestNanState", 'N', 's');
     ZenTestNanState() : ZenFaultyGain(kDescriptor.className) {}
 
-protected:
-    void ProcessBlock(float* const* channels, std::uint32_t channelCount, std::uint32_t frames) noexcept override {
-        const float s = m_smoothing;
-        for (std::uint32_t c = 0; c < channelCount; ++c) {
+    bool Process(float* const* channels, std::uint64_t frames) noexcept override {
+        if (!IsPrepared() || channels == nullptr) return false;
+        if (IsBypassed()) return true;  // no latency: the input as it is
+        const float s = GetParameter(kSmoothing);
+        for (std::uint32_t c = 0; c < GetProcessChannelCount(); ++c) {
             float y = m_state[c];
-            for (std::uint32_t i = 0; i < frames; ++i) channels[c][i] = y = (1.0f - s) * channels[c][i] + s * y;
+            for (std::uint64_t i = 0; i < frames; ++i) channels[c][i] = y = (1.0f - s) * channels[c][i] + s * y;
             m_state[c] = y;
         }
-        ZenFaultyGain::ProcessBlock(channels, channelCount, frames);
+        return true;
     }
+
+protected:
     void ResetProcessing() override { std::fill(std::begin(m_state), std::end(m_state), 0.0f); }
 
 private:
     float m_state[kMaxChannels] = {};
+};
+
+// "Test Overflow": adds a trace of the fifth harmonic by the Chebyshev
+// polynomial 16x^5 - 20x^3 + 5x in float, bounded for full-scale input, but
+// x^5 overflows to infinity beyond about 1e7 (+140 dBFS).
+class ZenTestOverflow : public ZenFaultyGain {
+    Q_OBJECT
+
+public:
+    static constexpr zen::PluginDescriptor kDescriptor = Faulty("Test Overflow", "ZenTestOverflow", 'O', 'v');
+    static constexpr float kHarmonic = 0.01f;
+    ZenTestOverflow() : ZenFaultyGain(kDescriptor.className) {}
+
+protected:
+    void ProcessBlock(float* const* channels, std::uint32_t channelCount, std::uint32_t frames) noexcept override {
+        for (std::uint32_t c = 0; c < channelCount; ++c) {
+            for (std::uint32_t i = 0; i < frames; ++i) {
+                const float x = channels[c][i];
+                const float x2 = x * x;
+                channels[c][i] = x + kHarmonic * (16.0f * x2 * x2 * x - 20.0f * x2 * x + 5.0f * x);
+            }
+        }
+        ZenFaultyGain::ProcessBlock(channels, channelCount, frames);
+    }
 };
 
 // "Test Racy": hands "Gain" to the audio thread through a plain float, a data
@@ -215,6 +243,7 @@ template class ZenAudioPlugin<ZenTestBlockPeak>;
 template class ZenAudioPlugin<ZenTestIgnoredParameter>;
 template class ZenAudioPlugin<ZenTestLocking>;
 template class ZenAudioPlugin<ZenTestNanState>;
+template class ZenAudioPlugin<ZenTestOverflow>;
 template class ZenAudioPlugin<ZenTestRacy>;
 template class ZenAudioPlugin<ZenTestWrongLatency>;
 

@@ -144,9 +144,22 @@ void Clamp(const float* a, float lo, float hi, float* out, std::size_t n) {
                     [lo, hi](const auto& x, auto& y) { y[0] = V::Min(V::Max(x[0], V::Set1(lo)), V::Set1(hi)); });
 }
 
+// |x| <= limit passes; a larger finite x is held at the limit with its sign;
+// NaN and infinities (false in both ordered comparisons) become 0.
+template <class V>
+void Sanitize(const float* a, float limit, float* out, std::size_t n) {
+    Stream<V, 1, 1>({a}, {out}, n, [limit](const auto& x, auto& y) {
+        const auto magnitude = V::Abs(x[0]);
+        const auto within = V::Ge(V::Set1(limit), magnitude);
+        const auto finite = V::Ge(V::Set1(__FLT_MAX__), magnitude);
+        const auto held = V::And(finite, V::Or(V::And(V::Set1(-0.0f), x[0]), V::Set1(limit)));
+        y[0] = V::Select(within, x[0], held);
+    });
+}
+
 template <class V>
 constexpr kernels::VecKernels VecTable() {
-    return {Add<V>, Subtract<V>, Multiply<V>, Scale<V>, Abs<V>, Clamp<V>};
+    return {Add<V>, Subtract<V>, Multiply<V>, Scale<V>, Abs<V>, Clamp<V>, Sanitize<V>};
 }
 
 // y += a * x

@@ -34,6 +34,21 @@ std::int32_t FindParameter(zen::PluginInstance& instance, AudioPlugin& audio, co
     return index;
 }
 
+// "1 or 2", "1 to 32": the channel counts a plug-in takes (in = out).
+std::string AcceptedCounts(AudioPlugin& audio, const zen::PluginDescriptor& d) {
+    std::vector<std::uint32_t> counts;
+    const std::uint32_t inputs = audio.GetInputChannelCount(), outputs = audio.GetOutputChannelCount();
+    for (std::uint32_t n = 1; n <= std::max(d.inputChannelLimit, d.outputChannelLimit); ++n)
+        if (audio.ConfigureChannels(d.inputChannelLimit == 0 ? 0 : n, n)) counts.push_back(n);
+    audio.ConfigureChannels(inputs, outputs);
+    if (counts.empty()) return "none of the same count in and out";
+    if (counts.size() == 1) return std::to_string(counts[0]);
+    if (counts.size() == 2) return std::to_string(counts[0]) + " or " + std::to_string(counts[1]);
+    return std::to_string(counts.front()) + " to " + std::to_string(counts.back());
+}
+
+std::string Channels(std::uint32_t n) { return std::to_string(n) + (n == 1 ? " channel" : " channels"); }
+
 }  // namespace
 
 StudioModel::StudioModel(zen::PluginInterface& library, std::int64_t sessionId)
@@ -46,11 +61,16 @@ StudioModel::~StudioModel() {
     m_channels.clear();
 }
 
-std::size_t StudioModel::AddChannel(const std::string& name, std::uint32_t audioChannels) {
+std::size_t StudioModel::AddChannel(const std::string& name, std::uint32_t audioChannels,
+                                    std::uint32_t sourceChannels) {
     if (audioChannels < 1) throw HostError("channel '" + name + "' needs at least one audio channel");
+    if (sourceChannels > audioChannels)
+        throw HostError("channel '" + name + "' cannot narrow " + Channels(sourceChannels) + " to " +
+                        std::to_string(audioChannels));
     auto channel = std::make_unique<Channel>();
     channel->name = name;
     channel->audioChannels = audioChannels;
+    channel->sourceChannels = sourceChannels == 0 ? audioChannels : sourceChannels;
     channel->services =
         std::make_unique<ActionServices>(m_actions, static_cast<std::int64_t>(m_channels.size()), m_sessionId);
     m_channels.push_back(std::move(channel));
@@ -85,11 +105,17 @@ std::string StudioModel::FindKey(const std::string& plugin) const {
     throw HostError("unknown plug-in '" + plugin + "'");
 }
 
-void StudioModel::Configure(const Channel& channel, Slot& slot) const {
+void StudioModel::Configure(const Channel& channel, Slot& slot, bool first) const {
     const zen::PluginDescriptor& d = *slot.instance->GetDescriptor();
     const std::uint32_t n = channel.audioChannels;
-    if (!slot.audio->ConfigureChannels(d.inputChannelLimit == 0 ? 0 : n, n))
-        throw HostError("'" + slot.name + "' does not accept " + std::to_string(n) + " channel" + (n == 1 ? "" : "s"));
+    const std::uint32_t in = d.inputChannelLimit == 0 ? 0 : (first ? channel.sourceChannels : n);
+    if (!slot.audio->ConfigureChannels(in, n)) {
+        if (in == 0 || in == n)
+            throw HostError("'" + slot.name + "' does not accept " + Channels(n) + " (it takes " +
+                            AcceptedCounts(*slot.audio, d) + ")");
+        throw HostError("'" + slot.name + "' does not take " + Channels(in) + " in and " + std::to_string(n) +
+                        " out");
+    }
     if (m_prepared && !slot.audio->Prepare(static_cast<float>(m_sampleRate), m_maxBlock))
         throw HostError("'" + slot.name + "' cannot run at " + std::to_string(m_sampleRate) + " Hz in blocks of " +
                         std::to_string(m_maxBlock));
@@ -110,25 +136,33 @@ std::size_t StudioModel::InsertPlugin(std::size_t channel, const std::string& pl
     if (s.audio == nullptr || s.instance->GetDescriptor() == nullptr)
         throw HostError("the library could not create '" + plugin + "'");
     s.name = s.instance->GetName();
-    Configure(c, s);
     const std::size_t at = slot == kAppend ? c.chain.size() : slot;
+    Configure(c, s, at == 0);
     c.chain.insert(c.chain.begin() + static_cast<std::ptrdiff_t>(at), std::move(s));
+    if (at == 0 && c.chain.size() > 1) ConfigureAll(c);
     return at;
 }
 
 void StudioModel::RemovePlugin(std::size_t channel, std::size_t slot) {
     SlotAt(channel, slot);
-    auto& chain = ChannelAt(channel).chain;
-    chain.erase(chain.begin() + static_cast<std::ptrdiff_t>(slot));
+    Channel& c = ChannelAt(channel);
+    c.chain.erase(c.chain.begin() + static_cast<std::ptrdiff_t>(slot));
+    if (slot == 0) ConfigureAll(c);
 }
 
 void StudioModel::MovePlugin(std::size_t channel, std::size_t from, std::size_t to) {
     SlotAt(channel, from);
     SlotAt(channel, to);
-    auto& chain = ChannelAt(channel).chain;
-    Slot moving = std::move(chain[from]);
-    chain.erase(chain.begin() + static_cast<std::ptrdiff_t>(from));
-    chain.insert(chain.begin() + static_cast<std::ptrdiff_t>(to), std::move(moving));
+    Channel& c = ChannelAt(channel);
+    Slot moving = std::move(c.chain[from]);
+    c.chain.erase(c.chain.begin() + static_cast<std::ptrdiff_t>(from));
+    c.chain.insert(c.chain.begin() + static_cast<std::ptrdiff_t>(to), std::move(moving));
+    if (from == 0 || to == 0) ConfigureAll(c);
+}
+
+void StudioModel::ConfigureAll(Channel& channel) {
+    if (channel.sourceChannels == channel.audioChannels) return;  // every place has the same layout
+    for (std::size_t i = 0; i < channel.chain.size(); ++i) Configure(channel, channel.chain[i], i == 0);
 }
 
 void StudioModel::SetBypass(std::size_t channel, std::size_t slot, bool bypassed) {

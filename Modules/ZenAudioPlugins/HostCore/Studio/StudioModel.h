@@ -33,6 +33,9 @@ public:
     struct Channel {
         std::string name;
         std::uint32_t audioChannels = 2;
+        // Inputs of the first slot: fewer than audioChannels when it widens
+        // its source (mono to stereo); every later slot takes audioChannels.
+        std::uint32_t sourceChannels = 2;
         // Before the chain, so it outlives the instances that hold it.
         std::unique_ptr<ActionServices> services;
         std::vector<Slot> chain;  // not "slots": a toolkit keyword
@@ -46,14 +49,16 @@ public:
     zen::PluginInterface& Library() { return m_library; }
     ActionRegistry& Actions() { return m_actions; }
 
-    std::size_t AddChannel(const std::string& name, std::uint32_t audioChannels);
+    // `sourceChannels` 0: as many as `audioChannels`.
+    std::size_t AddChannel(const std::string& name, std::uint32_t audioChannels, std::uint32_t sourceChannels = 0);
     std::size_t ChannelCount() const { return m_channels.size(); }
     const Channel& GetChannel(std::size_t channel) const;
 
     // The audio plug-in by key, "zen:" and key, or display name (any case),
     // inserted before `slot` (kAppend: at the end), in the channel's layout
     // and prepared when the model is. Throws HostError naming the plug-in
-    // and the reason. Returns the slot's index.
+    // and the reason (for a layout, the channel counts it takes). Returns
+    // the slot's index.
     std::size_t InsertPlugin(std::size_t channel, const std::string& plugin, std::size_t slot = kAppend);
     void RemovePlugin(std::size_t channel, std::size_t slot);
     void MovePlugin(std::size_t channel, std::size_t from, std::size_t to);
@@ -73,7 +78,9 @@ private:
     Channel& ChannelAt(std::size_t channel);
     Slot& SlotAt(std::size_t channel, std::size_t slot);
     std::string FindKey(const std::string& plugin) const;
-    void Configure(const Channel& channel, Slot& slot) const;
+    void Configure(const Channel& channel, Slot& slot, bool first) const;
+    // After the first slot changed: each slot in its place's layout again.
+    void ConfigureAll(Channel& channel);
     void RegisterActions();
 
     zen::PluginInterface& m_library;

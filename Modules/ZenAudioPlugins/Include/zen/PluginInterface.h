@@ -1,14 +1,15 @@
 // The library's entry: GetZenPluginInterface and the interface it returns.
 //
-// Typical host session:
+// Typical host session (this compiles as it stands; a test sees to it):
 //
-//   auto* lib = zen::GetZenPluginInterface();          // any thread, once or often
-//   lib->SetHostContext(ctx); lib->SetHostServices(s);  // before creating instances
-//   for (auto& [key, entry] : lib->GetPluginList(zen::kAudioPluginKind)) ...
-//   zen::PluginInstance* inst = lib->CreatePlugin(zen::kAudioPluginKind, key);
-//   auto* audio = zen::InterfaceCast<zen::AudioPlugin>(inst);
-//   ... see AudioPlugin.h for the calling order ...
-//   delete inst;                                        // the host owns instances
+//   zen::PluginInterface* lib = GetZenPluginInterface();  // any thread, once or often
+//   lib->SetHostContext(ctx); lib->SetHostServices(s);    // before creating instances
+//   for (auto& [key, entry] : lib->GetPluginList(zen::kAudioPluginKind)) {
+//       zen::PluginInstance* inst = lib->CreatePlugin(zen::kAudioPluginKind, key);
+//       AudioPlugin* audio = zen::InterfaceCast<AudioPlugin>(inst);
+//       // ... see AudioPlugin.h for the calling order ...
+//       delete inst;                                      // the host owns instances
+//   }
 //
 // Failures are never exceptions: an unknown key or kind answers an empty list
 // or a null instance.

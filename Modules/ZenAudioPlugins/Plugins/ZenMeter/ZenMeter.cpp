@@ -26,6 +26,7 @@ float Lufs(double lufs) { return std::max(ZenMeter::kSilenceLufs, static_cast<fl
 ZenMeter::ZenMeter() {
     InitParameters(Definitions());
     InitMeters(Meters());
+    CountNonFiniteInput();
 }
 
 const zen::ParameterTableDefinition& ZenMeter::Definitions() {
@@ -89,6 +90,7 @@ void ZenMeter::UpdateProcessingParameter(std::uint32_t index, float value) {
             if (on && !m_resetHeld) {
                 m_loudness.Reset();
                 m_hopsPushed = 0;
+                m_nonFiniteAtReset = NonFiniteInputSamples();
                 ResetMeters();
             }
             m_resetHeld = on;
@@ -132,7 +134,8 @@ void ZenMeter::Publish() noexcept {
     PublishMeter(kRange, static_cast<float>(m_loudness.Range()));
     PublishMeter(kMaxMomentary, Lufs(m_loudness.MaxMomentary()));
     PublishMeter(kMaxShortTerm, Lufs(m_loudness.MaxShortTerm()));
-    PublishMeter(kInvalidSamples, static_cast<float>(m_loudness.InvalidSamples()));
+    const std::uint64_t invalid = m_loudness.InvalidSamples() + NonFiniteInputSamples() - m_nonFiniteAtReset;
+    PublishMeter(kInvalidSamples, static_cast<float>(invalid));
     float loudest = 0.0f;
     const auto channels = static_cast<std::uint32_t>(m_loudness.GetChannelCount());
     for (std::uint32_t c = 0; c < channels; ++c) {
@@ -149,6 +152,7 @@ void ZenMeter::Publish() noexcept {
 void ZenMeter::ResetProcessing() {
     m_loudness.Reset();
     m_hopsPushed = 0;
+    m_nonFiniteAtReset = NonFiniteInputSamples();
 }
 
 template class ZenAudioPlugin<ZenMeter>;

@@ -59,5 +59,7 @@ private:
     float m_lfeChoice = 0.0f;
     bool m_resetHeld = false;  // "Reset" is On: waits for Off before acting again
     std::uint64_t m_hopsPushed = 0;
+    // The guard's count of NaN and infinities at the last reset.
+    std::uint64_t m_nonFiniteAtReset = 0;
     float* m_chunk[kMaxChannels] = {};
 };

@@ -70,8 +70,8 @@ TEST(ZenfxValidate, EveryRegisteredPluginPasses) {
         // The checks every plug-in with audio input gets, whatever it declares.
         const std::set<std::string> passed = WithStatus(plugin, "pass");
         for (const char* id : {"lifecycle.channel-layouts", "lifecycle.sample-rates", "parameters.set-get",
-                               "parameters.state", "blocks.lengths", "signals.non-finite", "latency.bypass",
-                               "threads.parameters", "realtime.allocation", "realtime.locks"}) {
+                               "parameters.state", "blocks.lengths", "signals.non-finite", "signals.huge",
+                               "latency.bypass", "threads.parameters", "realtime.allocation", "realtime.locks"}) {
             // A plug-in without audio input (a sampler) has no input to feed these.
             const auto* check = FindCheck(plugin, id);
             if (check != nullptr && (*check)["status"] == "skip" && (*check)["reason"] == "no audio input") continue;
@@ -123,7 +123,14 @@ INSTANTIATE_TEST_SUITE_P(
                           {"parameters.set-get", "parameters.state", "threads.parameters"},
                           "'Gain' (index 0): set to -24, read back 0"},
                     Fault{"Test Wrong Latency", {"latency.impulse"}, "latency of 40 samples but an impulse comes out"},
-                    Fault{"Test NaN State", {"signals.non-finite"}, "still non-finite"},
+                    Fault{"Test NaN State",
+                          {"signals.non-finite"},
+                          "after one sample of NaN on channel 1 at frame 2148 with the defaults at 48000 Hz: NaN at "
+                          "frame 2148 on channel 1"},
+                    Fault{"Test Overflow",
+                          {"signals.huge"},
+                          "after one sample of 1e+18 on channel 1 at frame 2148 with the defaults at 48000 Hz: +Inf at "
+                          "frame 2148 on channel 1 (1 non-finite sample in all)"},
                     Fault{"Test Locking", {"realtime.locks"}, "does not declare LocksAudioPath"},
                     Fault{"Test Block Peak", {"blocks.split-invariance"}, "does not declare itself block-based"}),
     [](const testing::TestParamInfo<Fault>& param) {
@@ -167,6 +174,17 @@ TEST(ZenfxValidate, UsageMistakesAreOneLineErrors) {
         EXPECT_EQ(result.exitCode, 2) << args.back();
         EXPECT_EQ(std::count(result.err.begin(), result.err.end(), '\n'), 1) << result.err;
     }
+    // A --check that matches nothing would pass by checking nothing.
+    for (const char* check : {"nonexistent", "signal.huge"}) {
+        const auto none = RunZenfx({"validate", "--all", "--check", "lifecycle", "--check", check});
+        EXPECT_EQ(none.exitCode, 2) << none.out;
+        EXPECT_EQ(std::count(none.err.begin(), none.err.end(), '\n'), 1) << none.err;
+        EXPECT_NE(none.err.find(std::string("no check matches --check '") + check + "'"), std::string::npos)
+            << none.err;
+        EXPECT_TRUE(none.out.empty()) << none.out;
+    }
+    EXPECT_NE(RunZenfx({"validate", "--all", "--check", "signal.huge"}).err.find("did you mean 'signals.huge'"),
+              std::string::npos);
     const auto unknown = RunZenfx({"validate", "Soft Clipr"});
     EXPECT_EQ(unknown.exitCode, 1);
     EXPECT_NE(unknown.err.find("did you mean 'Soft Clipper'"), std::string::npos) << unknown.err;

@@ -164,7 +164,8 @@ std::vector<Kernel> Kernels() {
              {"Multiply", [](const Vec& v, auto a, auto b, auto o, std::size_t n) { v.Multiply(a, b, o, n); }},
              {"Scale", [](const Vec& v, auto a, auto, auto o, std::size_t n) { v.Scale(a, -1.7f, o, n); }},
              {"Abs", [](const Vec& v, auto a, auto, auto o, std::size_t n) { v.Abs(a, o, n); }},
-             {"Clamp", [](const Vec& v, auto a, auto, auto o, std::size_t n) { v.Clamp(a, -0.5f, 0.25f, o, n); }}})
+             {"Clamp", [](const Vec& v, auto a, auto, auto o, std::size_t n) { v.Clamp(a, -0.5f, 0.25f, o, n); }},
+             {"Sanitize", [](const Vec& v, auto a, auto, auto o, std::size_t n) { v.Sanitize(a, 0.25f, o, n); }}})
         all.push_back({std::string("Vec") + name + "AndInPlace", 2, 1, 2, 1, false,
                        Use<Vec>([] { return new Vec; }, [op = op](Vec& k, In in, Out out, std::size_t n) {
                            op(k, in[0], in[1], out[0], n);
