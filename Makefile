@@ -2,6 +2,7 @@
 # make test   the same set-up, then every test, also under ASan and UBSan, and
 #             the validator's thread checks under TSan
 # make bench  realtime factors of plug-ins and kernels
+# make compare  ours beside open peers from Debian (installs them as root)
 # make install [PREFIX=/usr/local]
 
 BUILD_DIR ?= build
@@ -14,7 +15,7 @@ CMAKE     ?= cmake
 COMMON_FLAGS := -G Ninja -DZEN_WERROR=ON
 ZENFX := $(BUILD_DIR)/bin/zenfx
 
-.PHONY: all setup configure build run test test-release test-asan test-tsan bench install clean
+.PHONY: all setup configure build run test test-release test-asan test-tsan bench compare install clean
 
 all: build
 
@@ -60,6 +61,10 @@ test-tsan: setup
 
 bench: build
 	$(BUILD_DIR)/bin/ZenBenchmarks --benchmark_counters_tabular=true
+
+# Not a test: prints one table, ours beside each peer on the same material.
+compare: build
+	@bench/peers.sh $(BUILD_DIR)
 
 install: build
 	$(CMAKE) --install $(BUILD_DIR) --prefix $(PREFIX)

@@ -2,6 +2,7 @@
 
 #include <cctype>
 #include <cstdio>
+#include <string>
 
 namespace zenlv2 {
 
@@ -12,13 +13,28 @@ struct Layout {
     std::uint32_t outputs;
 };
 
-// The layouts a user inserts on a track or bus; wider ones are left to hosts
-// of the library's own interface. Inputs 0: plug-ins without audio input.
-constexpr Layout kLayouts[] = {{1, 1}, {1, 2}, {2, 2}, {0, 1}, {0, 2}};
+// The layouts a user inserts on a track or bus: mono, stereo and the two
+// surround formats LV2 names (5.1, 7.1); other widths are left to hosts of
+// the library's own interface. Inputs 0: plug-ins without audio input.
+constexpr Layout kLayouts[] = {{1, 1}, {1, 2}, {2, 2}, {6, 6}, {8, 8}, {0, 1}, {0, 2}, {0, 6}, {0, 8}};
 
-std::string ChannelsName(std::uint32_t channels) { return channels == 1 ? "mono" : "stereo"; }
+std::string ChannelsName(std::uint32_t channels) {
+    switch (channels) {
+        case 1: return "mono";
+        case 2: return "stereo";
+        case 6: return "5.1";
+        case 8: return "7.1";
+        default: return std::to_string(channels) + "ch";
+    }
+}
 
-std::string ChannelsLabel(std::uint32_t channels) { return channels == 1 ? "Mono" : "Stereo"; }
+std::string ChannelsLabel(std::uint32_t channels) {
+    switch (channels) {
+        case 1: return "Mono";
+        case 2: return "Stereo";
+        default: return ChannelsName(channels);
+    }
+}
 
 std::string LayoutLabel(std::uint32_t inputs, std::uint32_t outputs) {
     if (inputs == 0 || inputs == outputs) return ChannelsLabel(outputs);

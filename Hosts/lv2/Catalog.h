@@ -1,6 +1,6 @@
 // Every LV2 plug-in the bundle offers: one per registered audio plug-in and
-// channel layout it accepts (mono, stereo, mono to stereo; outputs only for
-// plug-ins without audio input). The adapter and the .ttl generator build it
+// channel layout it accepts (mono, stereo, mono to stereo, 5.1, 7.1; outputs
+// only for plug-ins without audio input). The adapter and the .ttl generator build it
 // the same way from the same library, so URIs and layouts always agree.
 #pragma once
 
@@ -20,7 +20,7 @@ struct Variant {
     std::string name;  // display name, "Soft Clipper"
     std::uint32_t inputs = 0;
     std::uint32_t outputs = 0;
-    std::string layout;  // "mono", "stereo", "mono-to-stereo"
+    std::string layout;  // "mono", "stereo", "mono-to-stereo", "5.1", "7.1"
     std::string uri;     // "urn:zenaudioplugins:Soft%20Clipper:1517179747:stereo"
     std::string label;   // "Soft Clipper (Stereo)", or the plain name when it is the only layout
 };
@@ -36,7 +36,7 @@ public:
     // Percent-encoding of everything outside RFC 3986's unreserved characters.
     static std::string PercentEncode(const std::string& text);
 
-    // "mono", "stereo", "mono-to-stereo".
+    // "mono", "stereo", "mono-to-stereo", "5.1", "7.1".
     static std::string LayoutName(std::uint32_t inputs, std::uint32_t outputs);
 };
 

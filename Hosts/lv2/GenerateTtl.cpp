@@ -8,6 +8,7 @@
 #include <cstdio>
 #include <fstream>
 #include <map>
+#include <memory>
 #include <set>
 
 #include "Catalog.h"
@@ -38,6 +39,32 @@ void RemoveStaleFiles(const std::string& folder, const std::set<std::string>& ke
     closedir(dir);
 }
 
+// The plug-in's factory presets as port values. Loading a preset into a
+// fresh instance and reading every parameter back gives exactly what the
+// library would set.
+std::vector<zenlv2::Preset> PresetsOf(zenlv2::Library& library, const std::vector<zenlv2::Variant>& variants,
+                                      const zenlv2::PortMap& ports) {
+    std::vector<zenlv2::Preset> presets;
+    const std::string& key = variants.front().key;
+    std::map<std::uint32_t, std::string> symbols;  // parameter index -> port symbol
+    for (const zenlv2::Port& port : ports.Ports())
+        if (port.type == zenlv2::PortType::Parameter) symbols[port.source] = port.symbol;
+    auto lister = library.Create(key);
+    for (const std::string& name : zen::InterfaceCast<AudioPlugin>(lister.get())->GetPresetNames()) {
+        auto instance = library.Create(key);
+        AudioPlugin* audio = zen::InterfaceCast<AudioPlugin>(instance.get());
+        if (!audio->LoadPreset(name)) continue;
+        zenlv2::Preset preset;
+        preset.uri = zenlv2::TurtleWriter::PresetUri(key, name);
+        preset.label = name;
+        preset.file = zenlv2::TurtleWriter::FileName(key);
+        for (const zenlv2::Variant& variant : variants) preset.appliesTo.push_back(variant.uri);
+        for (const auto& [index, symbol] : symbols) preset.values.emplace_back(symbol, audio->GetParameter(index));
+        presets.push_back(std::move(preset));
+    }
+    return presets;
+}
+
 }  // namespace
 
 int main(int argc, char** argv) {
@@ -59,6 +86,9 @@ int main(int argc, char** argv) {
     }
 
     std::map<std::string, std::string> files;  // file name -> text
+    std::map<std::string, std::vector<zenlv2::Variant>> layouts;  // key -> its variants
+    for (const zenlv2::Variant& variant : variants) layouts[variant.key].push_back(variant);
+    std::vector<zenlv2::Preset> presets;
     for (const zenlv2::Variant& variant : variants) {
         auto instance = library.Create(variant.key);
         AudioPlugin* audio = zen::InterfaceCast<AudioPlugin>(instance.get());
@@ -71,7 +101,13 @@ int main(int argc, char** argv) {
         if (text.empty())
             text = "# Generated from the plug-in registry at build time; do not edit.\n" +
                    zenlv2::TurtleWriter::Prefixes() + zenlv2::TurtleWriter::Project();
-        text += zenlv2::TurtleWriter::Plugin(variant, zenlv2::PortMap(*audio, variant.inputs, variant.outputs));
+        const zenlv2::PortMap ports(*audio, variant.inputs, variant.outputs);
+        text += zenlv2::TurtleWriter::Plugin(variant, ports);
+        if (variant.uri == layouts[variant.key].front().uri)
+            for (zenlv2::Preset& preset : PresetsOf(library, layouts[variant.key], ports)) {
+                text += zenlv2::TurtleWriter::PresetData(preset);
+                presets.push_back(std::move(preset));
+            }
     }
 
     std::set<std::string> written = {"manifest.ttl"};
@@ -84,11 +120,11 @@ int main(int argc, char** argv) {
     }
     RemoveStaleFiles(folder, written);
     // The manifest last: it is the build's mark that the bundle is complete.
-    if (!WriteFile(folder + "/manifest.ttl", zenlv2::TurtleWriter::Manifest(variants, binary))) {
+    if (!WriteFile(folder + "/manifest.ttl", zenlv2::TurtleWriter::Manifest(variants, binary, presets))) {
         std::fprintf(stderr, "zen-lv2-ttl: cannot write %s/manifest.ttl\n", folder.c_str());
         return 1;
     }
-    std::printf("zen-lv2-ttl: %zu plug-ins in %zu layouts written to %s\n", files.size(), variants.size(),
-                folder.c_str());
+    std::printf("zen-lv2-ttl: %zu plug-ins in %zu layouts with %zu presets written to %s\n", files.size(),
+                variants.size(), presets.size(), folder.c_str());
     return 0;
 }

@@ -6,11 +6,22 @@ namespace zenlv2 {
 
 namespace {
 
-// "In", "Out" for mono; "In L", "In R" for stereo.
+// Loudspeaker names in the library's WAV order.
+constexpr const char* kFivePointOne[] = {"L", "R", "C", "LFE", "Ls", "Rs"};
+constexpr const char* kSevenPointOne[] = {"L", "R", "C", "LFE", "Lb", "Rb", "Ls", "Rs"};
+
+// "In", "Out" for mono; "In L", "In R" for stereo; "In LFE", "In Ls" for
+// 5.1 and 7.1; "In 3" for other widths. Symbols in lower case: "in_lfe".
 std::string ChannelSuffix(std::uint32_t channel, std::uint32_t count, bool symbol) {
     if (count == 1) return "";
-    if (count == 2) return symbol ? (channel == 0 ? "_l" : "_r") : (channel == 0 ? " L" : " R");
-    return (symbol ? "_" : " ") + std::to_string(channel + 1);
+    std::string name;
+    if (count == 2) name = channel == 0 ? "L" : "R";
+    else if (count == 6 && channel < 6) name = kFivePointOne[channel];
+    else if (count == 8 && channel < 8) name = kSevenPointOne[channel];
+    else name = std::to_string(channel + 1);
+    if (!symbol) return " " + name;
+    for (char& c : name) c = static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
+    return "_" + name;
 }
 
 }  // namespace

@@ -26,17 +26,38 @@ constexpr KnownUnit kKnownUnits[] = {
 
 bool IsWhole(float value) { return std::isfinite(value) && std::floor(value) == value; }
 
+// The group class of a channel count; the channels keep the library's WAV
+// order (L R C LFE, then the surrounds) and each port names its loudspeaker.
+const char* GroupClass(std::uint32_t channels) {
+    switch (channels) {
+        case 1: return "pg:MonoGroup";
+        case 2: return "pg:StereoGroup";
+        case 6: return "pg:FivePointOneGroup";
+        case 8: return "pg:SevenPointOneGroup";
+        default: return "pg:DiscreteGroup";
+    }
+}
+
 std::string Group(const std::string& uri, const char* direction, std::uint32_t channels, bool input) {
     std::ostringstream out;
-    out << "<" << uri << ":" << direction << ">\n\ta " << (channels == 1 ? "pg:MonoGroup" : "pg:StereoGroup")
-        << " ,\n\t\t" << (input ? "pg:InputGroup" : "pg:OutputGroup") << " ;\n\tlv2:symbol \"" << direction
+    out << "<" << uri << ":" << direction << ">\n\ta " << GroupClass(channels) << " ,\n\t\t"
+        << (input ? "pg:InputGroup" : "pg:OutputGroup") << " ;\n\tlv2:symbol \"" << direction
         << "\" ;\n\trdfs:label \"" << (input ? "Input" : "Output") << "\" .\n\n";
     return out.str();
 }
 
+// Empty where the layout names no loudspeaker for the channel.
 const char* Designation(std::uint32_t channel, std::uint32_t channels) {
-    if (channels == 1) return "pg:center";
-    return channel == 0 ? "pg:left" : "pg:right";
+    static constexpr const char* kSurround[] = {"pg:left",     "pg:right",     "pg:center",   "pg:lowFrequencyEffects",
+                                                "pg:rearLeft", "pg:rearRight", "pg:sideLeft", "pg:sideRight"};
+    switch (channels) {
+        case 1: return "pg:center";
+        case 2: return channel == 0 ? "pg:left" : "pg:right";
+        case 6:  // L R C LFE Ls Rs: the 3-2 surrounds are LV2's rear pair
+        case 8:  // L R C LFE Lb Rb Ls Rs
+            return channel < channels ? kSurround[channel] : "";
+        default: return "";
+    }
 }
 
 void Range(std::ostringstream& out, float minimum, float maximum, float defaultValue) {
@@ -85,8 +106,9 @@ std::string Ports(const std::string& uri, const PortMap& map) {
             case PortType::AudioInput:
             case PortType::AudioOutput: {
                 const bool in = port.type == PortType::AudioInput;
-                out << " ;\n\t\tpg:group <" << uri << (in ? ":in" : ":out") << "> ;\n\t\tlv2:designation "
-                    << Designation(port.source, in ? map.Inputs() : map.Outputs());
+                out << " ;\n\t\tpg:group <" << uri << (in ? ":in" : ":out") << ">";
+                const std::string designation = Designation(port.source, in ? map.Inputs() : map.Outputs());
+                if (!designation.empty()) out << " ;\n\t\tlv2:designation " << designation;
                 break;
             }
             case PortType::Enabled:
@@ -178,17 +200,40 @@ std::string TurtleWriter::Prefixes() {
            "@prefix opts: <http://lv2plug.in/ns/ext/options#> .\n"
            "@prefix bufsz: <http://lv2plug.in/ns/ext/buf-size#> .\n"
            "@prefix state: <http://lv2plug.in/ns/ext/state#> .\n"
+           "@prefix pset: <http://lv2plug.in/ns/ext/presets#> .\n"
            "@prefix urid: <http://lv2plug.in/ns/ext/urid#> .\n\n";
 }
 
-std::string TurtleWriter::Manifest(const std::vector<Variant>& variants, const std::string& binary) {
+std::string TurtleWriter::Manifest(const std::vector<Variant>& variants, const std::string& binary,
+                                   const std::vector<Preset>& presets) {
     std::ostringstream out;
     out << "# Generated from the plug-in registry at build time; do not edit.\n"
         << "@prefix lv2: <http://lv2plug.in/ns/lv2core#> .\n"
+        << "@prefix pset: <http://lv2plug.in/ns/ext/presets#> .\n"
         << "@prefix rdfs: <http://www.w3.org/2000/01/rdf-schema#> .\n\n";
     for (const Variant& variant : variants)
         out << "<" << variant.uri << ">\n\ta lv2:Plugin ;\n\tlv2:binary <" << binary << "> ;\n\trdfs:seeAlso <"
             << FileName(variant.key) << "> .\n\n";
+    for (const Preset& preset : presets) {
+        out << "<" << preset.uri << ">\n\ta pset:Preset";
+        for (std::size_t i = 0; i < preset.appliesTo.size(); ++i)
+            out << (i == 0 ? " ;\n\tlv2:appliesTo <" : " , <") << preset.appliesTo[i] << ">";
+        out << " ;\n\trdfs:seeAlso <" << preset.file << "> .\n\n";
+    }
+    return out.str();
+}
+
+std::string TurtleWriter::PresetUri(const std::string& key, const std::string& name) {
+    return Catalog::MakeUri(key, "preset") + ":" + Catalog::PercentEncode(name);
+}
+
+std::string TurtleWriter::PresetData(const Preset& preset) {
+    std::ostringstream out;
+    out << "<" << preset.uri << ">\n\ta pset:Preset ;\n\trdfs:label " << Quoted(preset.label);
+    for (std::size_t i = 0; i < preset.values.size(); ++i)
+        out << (i == 0 ? " ;\n\tlv2:port [\n" : " , [\n") << "\t\tlv2:symbol " << Quoted(preset.values[i].first)
+            << " ;\n\t\tpset:value " << Number(preset.values[i].second) << "\n\t]";
+    out << " .\n\n";
     return out.str();
 }
 

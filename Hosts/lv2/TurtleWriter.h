@@ -3,6 +3,7 @@
 #pragma once
 
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "Catalog.h"
@@ -10,13 +11,30 @@
 
 namespace zenlv2 {
 
+// A factory preset as LV2 hosts list it: the values of the parameter ports,
+// offered to every layout of its plug-in.
+struct Preset {
+    std::string uri;
+    std::string label;
+    std::string file;                    // the description file holding it
+    std::vector<std::string> appliesTo;  // variant URIs
+    std::vector<std::pair<std::string, float>> values;  // port symbol, value
+};
+
 class TurtleWriter {
 public:
     // Description file of a registry key: "soft-clipper-1517179747.ttl".
     static std::string FileName(const std::string& key);
 
-    // Every variant with the shared binary and its description file.
-    static std::string Manifest(const std::vector<Variant>& variants, const std::string& binary);
+    // Every variant with the shared binary and its description file, and
+    // every preset with the file that holds its values.
+    static std::string Manifest(const std::vector<Variant>& variants, const std::string& binary,
+                                const std::vector<Preset>& presets);
+
+    // "urn:zenaudioplugins:Soft%20Clipper:1517179747:preset:Gentle%20Rounding".
+    static std::string PresetUri(const std::string& key, const std::string& name);
+
+    static std::string PresetData(const Preset& preset);
 
     static std::string Prefixes();
 

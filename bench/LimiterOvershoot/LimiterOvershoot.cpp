@@ -25,24 +25,6 @@ namespace {
 constexpr double kRate = 48000.0;
 constexpr std::size_t kFrames = 5 * 48000;
 
-// Pink noise (about -3 dB per octave from a sum of one-pole filtered white
-// noises), scaled to a sample peak of 1.
-std::vector<float> PinkNoise(std::size_t frames, std::uint32_t seed) {
-    const std::vector<float> white = zentest::Noise(frames, 1.0, seed);
-    const double poles[] = {0.99886, 0.99332, 0.96900, 0.86650, 0.55000};
-    const double weights[] = {0.0555179, 0.0750759, 0.1538520, 0.3104856, 0.5329522};
-    double state[5] = {};
-    std::vector<float> pink(frames);
-    for (std::size_t n = 0; n < frames; ++n) {
-        double sum = 0.5362 * white[n];
-        for (int k = 0; k < 5; ++k) sum += state[k] = poles[k] * state[k] + weights[k] * white[n];
-        pink[n] = static_cast<float>(sum);
-    }
-    const float peak = zentest::Peak(pink);
-    for (float& x : pink) x /= peak;
-    return pink;
-}
-
 // Planar channels.
 std::vector<std::vector<float>> Read(const std::string& path, double& rate) {
     SF_INFO info{};
@@ -108,7 +90,7 @@ int main(int argc, char** argv) {
                 ceilingDb);
     std::printf("| material | input gain | Soft off | Soft on |\n|---|---|---|---|\n");
     const std::vector<float> white = zentest::Noise(kFrames, 1.0, 3);
-    const std::vector<float> pink = PinkNoise(kFrames, 5);
+    const std::vector<float> pink = zentest::PinkNoise(kFrames, 5);
     const std::vector<float> music = zentest::MusicLike(kRate, kFrames);
     for (float gain : {0.0f, 6.0f, 12.0f}) Row("white noise, peak 0 dBFS", white, kRate, ceilingDb, gain);
     for (float gain : {0.0f, 12.0f}) Row("pink noise, peak 0 dBFS", pink, kRate, ceilingDb, gain);

@@ -23,6 +23,22 @@ std::vector<float> Noise(std::size_t frames, double amplitude, std::uint32_t see
     return x;
 }
 
+std::vector<float> PinkNoise(std::size_t frames, std::uint32_t seed) {
+    const std::vector<float> white = Noise(frames, 1.0, seed);
+    const double poles[] = {0.99886, 0.99332, 0.96900, 0.86650, 0.55000};
+    const double weights[] = {0.0555179, 0.0750759, 0.1538520, 0.3104856, 0.5329522};
+    double state[5] = {};
+    std::vector<float> pink(frames);
+    for (std::size_t n = 0; n < frames; ++n) {
+        double sum = 0.5362 * white[n];
+        for (int k = 0; k < 5; ++k) sum += state[k] = poles[k] * state[k] + weights[k] * white[n];
+        pink[n] = static_cast<float>(sum);
+    }
+    const float peak = Peak(pink);
+    for (float& x : pink) x /= peak;
+    return pink;
+}
+
 std::vector<float> Impulse(std::size_t frames, std::size_t at, float value) {
     std::vector<float> x(frames, 0.0f);
     if (at < frames) x[at] = value;

@@ -12,6 +12,10 @@ std::vector<float> Sine(double frequency, double sampleRate, std::size_t frames,
                         double phase = 0.0);
 // Uniform white noise in [-amplitude, amplitude], reproducible by seed.
 std::vector<float> Noise(std::size_t frames, double amplitude = 1.0, std::uint32_t seed = 1);
+// Pink noise (about -3 dB per octave, from a sum of one-pole filtered white
+// noises), scaled to a sample peak of 1.
+std::vector<float> PinkNoise(std::size_t frames, std::uint32_t seed);
+
 std::vector<float> Impulse(std::size_t frames, std::size_t at = 0, float value = 1.0f);
 // Notes with harmonics and decaying envelopes over a kick, hi-hats and a
 // quiet 9 kHz tone, peaking near 1.5: dense, loud material for dynamics.

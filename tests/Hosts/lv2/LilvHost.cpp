@@ -2,6 +2,8 @@
 
 #include <lv2/atom/atom.h>
 #include <lv2/buf-size/buf-size.h>
+#include <lv2/port-groups/port-groups.h>
+#include <lv2/presets/presets.h>
 
 #include <algorithm>
 #include <cmath>
@@ -85,6 +87,8 @@ std::vector<Lv2Port> LilvHost::Ports(const LilvPlugin* plugin) const {
     LilvNode* inputClass = lilv_new_uri(m_world, LILV_URI_INPUT_PORT);
     LilvNode* audioClass = lilv_new_uri(m_world, LILV_URI_AUDIO_PORT);
     LilvNode* designation = lilv_new_uri(m_world, LV2_CORE__designation);
+    LilvNode* group = lilv_new_uri(m_world, LV2_PORT_GROUPS__group);
+    LilvNode* type = lilv_new_uri(m_world, LILV_NS_RDF "type");
     std::vector<Lv2Port> ports;
     for (std::uint32_t p = 0; p < lilv_plugin_get_num_ports(plugin); ++p) {
         const LilvPort* port = lilv_plugin_get_port_by_index(plugin, p);
@@ -99,6 +103,17 @@ std::vector<Lv2Port> LilvHost::Ports(const LilvPlugin* plugin) const {
         LilvNode* designated = lilv_port_get(plugin, port, designation);
         info.designation = AsString(designated);
         lilv_node_free(designated);
+        if (LilvNode* owner = lilv_port_get(plugin, port, group)) {
+            // The first type that is not one of the generic group classes.
+            LilvNodes* types = lilv_world_find_nodes(m_world, owner, type, nullptr);
+            LILV_FOREACH(nodes, i, types) {
+                const std::string uri = AsString(lilv_nodes_get(types, i));
+                if (uri != LV2_PORT_GROUPS__InputGroup && uri != LV2_PORT_GROUPS__OutputGroup && info.groupClass.empty())
+                    info.groupClass = uri;
+            }
+            lilv_nodes_free(types);
+            lilv_node_free(owner);
+        }
         LilvNode *def = nullptr, *min = nullptr, *max = nullptr;
         lilv_port_get_range(plugin, port, &def, &min, &max);
         info.hasRange = min != nullptr && max != nullptr;
@@ -124,7 +139,38 @@ std::vector<Lv2Port> LilvHost::Ports(const LilvPlugin* plugin) const {
     lilv_node_free(inputClass);
     lilv_node_free(audioClass);
     lilv_node_free(designation);
+    lilv_node_free(group);
+    lilv_node_free(type);
     return ports;
+}
+
+namespace {
+
+void CollectValue(const char* symbol, void* user, const void* value, std::uint32_t size, std::uint32_t) {
+    if (size == sizeof(float)) (*static_cast<std::map<std::string, float>*>(user))[symbol] = *static_cast<const float*>(value);
+}
+
+}  // namespace
+
+std::vector<Lv2Preset> LilvHost::Presets(const LilvPlugin* plugin) {
+    std::vector<Lv2Preset> presets;
+    LilvNode* presetClass = lilv_new_uri(m_world, LV2_PRESETS__Preset);
+    LilvNodes* related = lilv_plugin_get_related(plugin, presetClass);
+    LILV_FOREACH(nodes, i, related) {
+        const LilvNode* node = lilv_nodes_get(related, i);
+        lilv_world_load_resource(m_world, node);
+        LilvState* state = lilv_state_new_from_world(m_world, &m_map, node);
+        if (state == nullptr) continue;
+        Lv2Preset preset;
+        preset.uri = AsString(node);
+        if (const char* label = lilv_state_get_label(state)) preset.label = label;
+        lilv_state_restore(state, nullptr, CollectValue, &preset.values, 0, nullptr);
+        lilv_state_free(state);
+        presets.push_back(std::move(preset));
+    }
+    lilv_nodes_free(related);
+    lilv_node_free(presetClass);
+    return presets;
 }
 
 LilvRun::LilvRun(LilvHost& host, const LilvPlugin* plugin, double sampleRate)

@@ -8,6 +8,7 @@
 #include <lv2/urid/urid.h>
 
 #include <cstdint>
+#include <map>
 #include <string>
 #include <utility>
 #include <vector>
@@ -27,11 +28,19 @@ struct Lv2Port {
     bool input = false;
     bool audio = false;
     std::string designation;  // full URI, or empty
+    std::string groupClass;   // the port group's type for audio ports: full URI, or empty
     float minimum = 0.0f, maximum = 0.0f, defaultValue = 0.0f;
     bool hasRange = false;
     std::vector<std::string> properties;                 // full URIs
     std::vector<std::pair<float, std::string>> scalePoints;  // ordered by value
     bool Has(const char* propertyUri) const;
+};
+
+// A preset as a host reads it: label and port values by symbol.
+struct Lv2Preset {
+    std::string uri;
+    std::string label;
+    std::map<std::string, float> values;
 };
 
 class LilvHost {
@@ -47,6 +56,7 @@ public:
     const LilvPlugin* Find(const std::string& uri) const;
     std::string Name(const LilvPlugin* plugin) const;
     std::vector<Lv2Port> Ports(const LilvPlugin* plugin) const;
+    std::vector<Lv2Preset> Presets(const LilvPlugin* plugin);
     const LV2_Feature* const* Features() const { return m_features.data(); }
 
     LV2_URID Map(const char* uri);
