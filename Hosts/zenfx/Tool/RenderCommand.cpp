@@ -11,6 +11,7 @@
 #include "Commands.h"
 #include "NameSuggestions.h"
 #include "ParameterValue.h"
+#include "StageSettings.h"
 #include "TriggerList.h"
 #include "ZenfxError.h"
 
@@ -20,27 +21,6 @@ namespace {
 
 // Longest render: an hour of audio.
 constexpr std::uint64_t kMaxSeconds = 3600;
-
-void ApplyPreset(AudioPlugin& audio, const std::string& pluginName, const std::string& preset) {
-    const std::vector<std::string> names = audio.GetPresetNames();
-    for (const std::string& name : names)
-        if (EqualsIgnoreCase(name, preset)) {
-            if (!audio.LoadPreset(name)) throw ZenfxError("preset '" + name + "' of '" + pluginName + "' could not be loaded");
-            return;
-        }
-    throw ZenfxError("'" + pluginName + "' has no preset '" + preset + "'" + DidYouMean(preset, names));
-}
-
-void ApplySetting(AudioPlugin& audio, const std::string& pluginName, const std::string& assignment) {
-    const std::size_t equals = assignment.find('=');
-    if (equals == std::string::npos || equals == 0)
-        throw ZenfxError("--set '" + assignment + "' is not PARAM=VALUE", kExitUsage);
-    const std::uint32_t index = FindParameter(audio, pluginName, assignment.substr(0, equals));
-    zen::ParameterInfo info;
-    audio.GetParameterInfo(index, info);
-    if (!audio.SetParameter(index, ParseParameterValue(info, pluginName, assignment.substr(equals + 1))))
-        throw ZenfxError("'" + pluginName + "' refused " + assignment);
-}
 
 // Sets text fields of the state (a sample folder, ...) and reports what the
 // plug-in says it skipped while loading them.
@@ -83,10 +63,9 @@ int RunRender(PluginLibrary& library, const RenderOptions& options) {
                          " channels without audio input; render is for plug-ins without input (samplers)");
     const std::uint32_t pad = FindParameter(audio, name, "Pad");
     const std::uint32_t trigger = FindParameter(audio, name, "Trigger");
-    for (const auto& [action, argument] : options.actions) {
-        if (action == "--preset") ApplyPreset(audio, name, argument);
-        else ApplySetting(audio, name, argument);
-    }
+    StageSettings(audio, name, [](const std::string& message) {
+        std::cerr << "zenfx: warning: " << message << "\n";
+    }).Apply(options.actions);
     ApplyStateFields(audio, name, options.stateFields);
     if (!audio.SetParameter(trigger, 0.0f)) throw ZenfxError("'" + name + "' refused its trigger");
     if (!audio.Prepare(static_cast<float>(options.sampleRate), options.block))

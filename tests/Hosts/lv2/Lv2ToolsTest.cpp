@@ -126,7 +126,13 @@ TEST(Lv2Tools, Lv2applyProcessesAWavFileAsZenfxDoes) {
                 for (const zentest::Lv2Port& port : host.Ports(plugin))
                     if (port.input && !port.audio && port.name == info.label)
                         lv2.insert(lv2.end(), {"-c", port.symbol, value});
-                zenfx.insert(zenfx.end(), {"--set", info.identifier + "=" + value});
+                // zenfx reads a list by its caption first ("Voices=2" is the caption
+                // "2"), so a list value goes there as the caption it stands for.
+                std::string typed = value;
+                if (info.kind == zen::ParameterKind::List && !info.choices.empty())
+                    typed = info.choices[static_cast<std::size_t>(
+                        std::lround((zentest::ParameterValueAt(info, 0.3f) - info.minimum) / info.step))];
+                zenfx.insert(zenfx.end(), {"--set", info.identifier + "=" + typed});
             }
             lv2.push_back(variant.uri);
             const auto applied = RunLv2Tool("lv2apply", bundle, lv2);

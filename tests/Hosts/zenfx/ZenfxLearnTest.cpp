@@ -55,7 +55,7 @@ TEST(ZenfxLearn, LearnsFromTheRegionThenProcessesTheWholeFile) {
     const auto json = nlohmann::json::parse(meters);
     bool found = false;
     for (const auto& meter : json["plugins"][0]["meters"])
-        if (meter["name"] == "Profile Learnt") found = meter["value"] == 1.0;
+        if (meter["name"] == "Profile Learnt") found = meter["final"] == 1.0;
     EXPECT_TRUE(found);
 }
 
