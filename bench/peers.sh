@@ -106,7 +106,7 @@ done <"$WORK/jobs"
 
 # Pitch +3 semitones as whole processes on 30 s of stereo music, and the
 # tone bursts for cents and alignment (0 samples: in time with the input).
-seconds_of() { awk 'NR == 1 { start = $1 } END { printf "%.0f", 30 / ($1 - start) }'; }
+seconds_of() { awk 'NR == 1 { start = $1 } END { printf "%.1f", 30 / ($1 - start) }'; }
 pitch_row() {
     name=$1 tool=$2
     shift 2
