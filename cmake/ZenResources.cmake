@@ -28,7 +28,7 @@ function(zen_add_resource_trees target resources_dir)
     set(cpp ${out_dir}/qrc_${name}.cpp)
     add_custom_command(
       OUTPUT ${cpp}
-      COMMAND Qt5::rcc --name ${name} -o ${cpp}.raw ${qrc}
+      COMMAND Qt5::rcc --name ${name} -compress 9 -o ${cpp}.raw ${qrc}
       COMMAND ${CMAKE_COMMAND} -DIN=${cpp}.raw -DOUT=${cpp} -P ${ZEN_CMAKE_DIR}/StripRccInitializer.cmake
       DEPENDS ${files} ${qrc} ${ZEN_CMAKE_DIR}/StripRccInitializer.cmake
       COMMENT "Resource tree ${name}"

@@ -6,6 +6,7 @@
 #include <unistd.h>
 
 #include <cstdio>
+#include <cstdlib>
 #include <fstream>
 #include <map>
 #include <memory>
@@ -74,6 +75,9 @@ int main(int argc, char** argv) {
     }
     const std::string folder = argv[2];
     const std::string binary = argv[3];
+    // The bundle lists factory presets only: the building user's own presets
+    // (read from XDG_DATA_HOME) must not end up in it.
+    setenv("XDG_DATA_HOME", "/nonexistent", 1);
     zenlv2::Library library({argv[1]});
     if (!library.IsLoaded()) {
         std::fprintf(stderr, "zen-lv2-ttl: cannot load %s: %s\n", argv[1], library.Error().c_str());

@@ -3,6 +3,10 @@
 // meters of every kind).
 #include <gtest/gtest.h>
 
+#include <QDir>
+#include <QFile>
+#include <QTemporaryDir>
+
 #include <cmath>
 #include <iterator>
 #include <thread>
@@ -359,4 +363,38 @@ TEST(ZenAudioPluginImpl, PresetsComeFromTheResourceTrees) {
     EXPECT_TRUE(clipper.Audio().LoadPreset("Warm Drive"));
     EXPECT_EQ(clipper.Get("Threshold"), 6.0f);
     EXPECT_FALSE(clipper.Audio().LoadPreset("No Such Preset"));
+}
+
+TEST(ZenAudioPluginImpl, UserPresetsFollowTheFactoryOnesAndReplaceNone) {
+    const QTemporaryDir data;
+    ASSERT_TRUE(data.isValid());
+    const QByteArray previous = qgetenv("XDG_DATA_HOME");
+    qputenv("XDG_DATA_HOME", data.path().toUtf8());
+    const QString folder = data.path() + "/ZenAudioPlugins/Presets/ZenSoftClipper";
+    ASSERT_TRUE(QDir().mkpath(folder));
+
+    PluginHarness clipper("Soft Clipper");
+    const std::size_t factoryCount = clipper.Audio().GetPresetNames().size();
+    clipper.Set("Threshold", -3.0f);
+    const std::string mine = clipper.Audio().SaveState();
+    clipper.Set("Threshold", -20.0f);
+    const std::string impostor = clipper.Audio().SaveState();
+    const auto write = [&](const char* name, const std::string& text) {
+        QFile file(folder + "/" + name + ".json");
+        ASSERT_TRUE(file.open(QIODevice::WriteOnly));
+        file.write(text.data(), static_cast<qint64>(text.size()));
+    };
+    write("My Edge", mine);
+    write("Warm Drive", impostor);
+
+    const auto names = clipper.Audio().GetPresetNames();
+    ASSERT_EQ(names.size(), factoryCount + 1);
+    EXPECT_EQ(names.back(), "My Edge");
+    EXPECT_TRUE(clipper.Audio().LoadPreset("My Edge"));
+    EXPECT_EQ(clipper.Get("Threshold"), -3.0f);
+    EXPECT_TRUE(clipper.Audio().LoadPreset("Warm Drive"));
+    EXPECT_EQ(clipper.Get("Threshold"), 6.0f);
+
+    if (previous.isNull()) qunsetenv("XDG_DATA_HOME");
+    else qputenv("XDG_DATA_HOME", previous);
 }
