@@ -38,6 +38,18 @@ QString Reading(const LevelBars::Bar& bar) {
     return text;
 }
 
+void UpdateHold(LevelBars::Bar& bar, int holdRefreshes, float fall) {
+    if (!IsDecibels(bar.info)) return;
+    // A reduction holds its deepest reading and returns upwards.
+    const float sign = bar.hangs ? -1.0f : 1.0f;
+    if (sign * bar.value >= sign * bar.hold || !std::isfinite(bar.hold)) {
+        bar.hold = bar.value;
+        bar.holdAge = 0;
+    } else if (++bar.holdAge > holdRefreshes) {
+        bar.hold = sign * std::max(sign * bar.value, sign * bar.hold - fall);
+    }
+}
+
 }  // namespace
 
 LevelBars::LevelBars(std::vector<std::string> names, QWidget* parent) : EditorDisplay(parent), m_names(std::move(names)) {
@@ -58,7 +70,8 @@ std::vector<std::uint32_t> LevelBars::Resolve(const zen::EditorLink& link, const
 
 void LevelBars::Refresh(const zen::EditorLink& link) {
     const std::uint32_t count = link.GetMeterCount();
-    if (!m_resolved || count != m_meterCount) {
+    bool changed = !m_resolved || count != m_meterCount;
+    if (changed) {
         m_resolved = true;
         m_meterCount = count;
         m_bars.clear();
@@ -79,19 +92,15 @@ void LevelBars::Refresh(const zen::EditorLink& link) {
     const int holdRefreshes = static_cast<int>(kHoldSeconds * ZenEditor::kDisplayRate);
     const auto fall = static_cast<float>(kFallDecibelsPerSecond / ZenEditor::kDisplayRate);
     for (Bar& bar : m_bars) {
+        const float before = bar.value;
+        const float hold = bar.hold;
         bar.value = link.GetMeter(bar.meter);
-        if (!IsDecibels(bar.info)) continue;
-        // A reduction holds its deepest reading and returns upwards.
-        const float sign = bar.hangs ? -1.0f : 1.0f;
-        if (sign * bar.value >= sign * bar.hold || !std::isfinite(bar.hold)) {
-            bar.hold = bar.value;
-            bar.holdAge = 0;
-        } else if (++bar.holdAge > holdRefreshes) {
-            bar.hold = sign * std::max(sign * bar.value, sign * bar.hold - fall);
-        }
+        UpdateHold(bar, holdRefreshes, fall);
+        changed = changed || bar.value != before || bar.hold != hold;
     }
-    update();
+    if (changed) update();
 }
+
 
 double LevelBars::ColumnWidth() const {
     const QFontMetricsF metrics(font());
