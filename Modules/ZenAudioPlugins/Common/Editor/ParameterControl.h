@@ -7,6 +7,7 @@
 
 #include <QWidget>
 #include <cstdint>
+#include <vector>
 
 #include "zen/EditorLink.h"
 
@@ -37,6 +38,8 @@ public:
     // The taper's mapping, shared with tests.
     static float ValueToPosition(const zen::ParameterInfo& info, float value);
     static float PositionToValue(const zen::ParameterInfo& info, float position);
+    // The values a list or switch parameter takes, in order.
+    static std::vector<float> ListValues(const zen::ParameterInfo& info);
 
 signals:
     void ValueShown(float value);
@@ -44,8 +47,16 @@ signals:
 protected:
     ParameterControl(zen::EditorLink& link, std::uint32_t index, QWidget* parent);
 
+    // Sets the parameter inside a gesture the caller opened (a drag).
+    void ApplyValue(float value);
+    // Shows a value the link now holds; the control's own drawing.
+    virtual void ShowValue(float value) = 0;
+
     zen::EditorLink& m_link;
     std::uint32_t m_index;
     zen::ParameterInfo m_info;
     float m_shown = 0.0f;
+
+private:
+    bool m_synced = false;
 };
