@@ -20,11 +20,16 @@ TEST(FilterResponseTest, BiQuadCascadeAndGainMatchTheFiltersImpulseResponse) {
     const float rate = 44100.0f;
     BiQuad bell, highPass;
     for (BiQuad* b : {&bell, &highPass}) b->Prepare(rate, 4096);
-    for (auto [index, value] : {std::pair{BiQuad::kIn, 1.0f}, {BiQuad::kShape, float{BiQuad::kBell}},
-                                {BiQuad::kGain, 9.0f}, {BiQuad::kFreq, 2500.0f}, {BiQuad::kQ, 3.0f}})
+    for (auto [index, value] : {std::pair{BiQuad::kIn, 1.0f},
+                                {BiQuad::kShape, float{BiQuad::kBell}},
+                                {BiQuad::kGain, 9.0f},
+                                {BiQuad::kFreq, 2500.0f},
+                                {BiQuad::kQ, 3.0f}})
         bell.SetParameter(index, value);
-    for (auto [index, value] : {std::pair{BiQuad::kIn, 1.0f}, {BiQuad::kShape, float{BiQuad::kHighPass}},
-                                {BiQuad::kFreq, 150.0f}, {BiQuad::kQ, 0.9f}})
+    for (auto [index, value] : {std::pair{BiQuad::kIn, 1.0f},
+                                {BiQuad::kShape, float{BiQuad::kHighPass}},
+                                {BiQuad::kFreq, 150.0f},
+                                {BiQuad::kQ, 0.9f}})
         highPass.SetParameter(index, value);
 
     std::vector<float> impulse = zentest::Impulse(16384);
