@@ -134,6 +134,8 @@ std::complex<double> TrackingNotchBank::HumTransfer(double frequency, double fun
         const double c = std::cos(kTwoPi * fundamental * static_cast<double>(k + 1) / rate);
         g += m_step[k] * (2.0 * c * z1 - 2.0 * z2) / (1.0 - 2.0 * c * z1 + z2);
     }
+    // On a harmonic itself the canceller's gain is infinite: all of it is hum.
+    if (!std::isfinite(g.real()) || !std::isfinite(g.imag())) return 1.0;
     return g / (1.0 + g);
 }
 

@@ -1,6 +1,7 @@
 // Editor of "De-Hummer": the notch comb the cancellers make at the tracked
 // fundamental (from the bank's own steady-state transfer at the live
 // width, harmonics and amount), the tracked frequency and the hum found.
+#include <algorithm>
 #include <cmath>
 #include <memory>
 
@@ -35,8 +36,13 @@ struct Comb {
         const double fundamental = tracked.Read(link).value_or(static_cast<float>(nominal));
         const double amount = link.GetParameter(ZenHumRemoval::kAmount) / 100.0;
         const bool listen = link.GetParameter(ZenHumRemoval::kListen) >= 0.5f;
+        // The harmonics themselves too, so each null is drawn at its true depth.
+        std::vector<double> frequencies = display.Plot().SamplePositions(kResponsePoints);
+        const auto harmonics = static_cast<int>(std::lround(link.GetParameter(ZenHumRemoval::kHarmonics)));
+        for (int k = 1; k <= harmonics; ++k) frequencies.push_back(k * fundamental);
+        std::sort(frequencies.begin(), frequencies.end());
         std::vector<QPointF> points;
-        for (double f : display.Plot().SamplePositions(kResponsePoints)) {
+        for (double f : frequencies) {
             const std::complex<double> hum = amount * bank.HumTransfer(f, fundamental);
             const double magnitude = std::abs(listen ? hum : 1.0 - hum);
             points.emplace_back(f, magnitude > 0.0 ? 20.0 * std::log10(magnitude) : kFloorDb);

@@ -45,12 +45,12 @@ struct Crossover {
         for (std::uint32_t s = 0; s < Plugin::kMaxSplits; ++s)
             crossover.SetParameter(LinkwitzRileyCrossover::kFrequency1 + s, link.GetParameter(Plugin::kCrossover1 + s));
         const std::vector<double> frequencies = display.Plot().SamplePositions(kResponsePoints);
-        for (std::uint32_t b = 0; b < Plugin::kMaxBands; ++b)
-            display.SetCurve(b,
-                             b < crossover.GetBandCount()
-                                 ? FilterResponse::CrossoverBand(crossover, b).Curve(frequencies)
-                                 : std::vector<QPointF>{},
-                             BandName(b));
+        for (std::uint32_t b = 0; b < Plugin::kMaxBands; ++b) {
+            if (b < crossover.GetBandCount())
+                display.SetCurve(b, FilterResponse::CrossoverBand(crossover, b).Curve(frequencies), BandName(b));
+            else
+                display.SetCurve(b, {});
+        }
     }
 };
 
@@ -69,7 +69,7 @@ struct Laws {
         float deepest = -TransferCurve::kGainTolerance;
         for (std::uint32_t b = 0; b < Plugin::kMaxBands; ++b) {
             if (b >= bands) {
-                display.SetCurve(b, {}, BandName(b));
+                display.SetCurve(b, {});
                 continue;
             }
             auto value = [&](Plugin::BandParameter p) { return link.GetParameter(Plugin::Index(b, p)); };
@@ -83,7 +83,8 @@ struct Laws {
                                       SoftKneeCompressor::Reduction(zen::DbToLogUnits(static_cast<float>(x)), law));
             };
             const double makeup = bypassed ? 0.0 : value(Plugin::kMakeup);
-            display.SetCurve(b, TransferCurve::Points(gain, inputs, makeup), BandName(b));
+            // Unnamed: the colours are the crossover display's, whose legend names the bands.
+            display.SetCurve(b, TransferCurve::Points(gain, inputs, makeup));
             const std::optional<float> reduction = reductions[b].Read(link);
             if (reduction && *reduction < deepest) {
                 deepest = *reduction;
