@@ -69,3 +69,17 @@ TEST(TrackingNotchBank, NotchesAreExactNullsAndWidenWithTheHarmonic) {
         EXPECT_NEAR(zentest::Rms(x, x.size() - 24000) / (0.1 / std::sqrt(2.0)), p.gain, p.tolerance) << p.frequency;
     }
 }
+
+TEST(TrackingNotchBank, HumTransferIsTheMeasuredSteadyState) {
+    // Off the nulls, on the flanks and between notches: what a display draws
+    // is what a held bank does to a steady tone.
+    for (double f : {50.3, 50.5, 99.2, 252.5, 501.0, 775.0}) {
+        auto bank = Bank(50.0, false);
+        bank->SetParameter(TrackingNotchBank::kWidth, 2.0f);
+        std::vector<float> x = zentest::Sine(f, kRate, static_cast<std::size_t>(2 * kRate), 0.1);
+        float* channels[] = {x.data()};
+        bank->Process(channels, x.size());
+        const double measured = zentest::Rms(x, x.size() - 24000) / (0.1 / std::sqrt(2.0));
+        EXPECT_NEAR(measured, std::abs(1.0 - bank->HumTransfer(f, 50.0)), 0.003) << f;
+    }
+}

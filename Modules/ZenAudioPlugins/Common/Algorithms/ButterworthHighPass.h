@@ -38,6 +38,10 @@ public:
     // pole), for a corner `frequency` and a "Slope" value.
     static double RingSeconds(double frequency, int slope, double decayDb);
 
+    // The sections that run now (one, or two at 24 dB/oct).
+    int SectionCount() const { return m_fourthOrder ? 2 : 1; }
+    const BiQuad::Coefficients& SectionCoefficients(int section) const { return m_designs[section].GetCoefficients(); }
+
 private:
     void Design();
 

@@ -4,6 +4,7 @@
 // envelope never rises above the threshold, so the gain never exceeds unity.
 #pragma once
 
+#include <algorithm>
 #include <atomic>
 #include <cstdint>
 
@@ -32,6 +33,8 @@ public:
 
     // The gain of the last sample, in log units.
     float GetLastGain() const { return m_lastGain.load(std::memory_order_relaxed); }
+    // The static law: the gain (log units) at a steady level (log units).
+    float GainAt(float level) const { return (std::clamp(level, m_floor, m_threshold) - m_threshold) * m_slope; }
 
 private:
     void UpdateLaw();

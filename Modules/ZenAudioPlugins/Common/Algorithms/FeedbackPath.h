@@ -37,6 +37,10 @@ public:
     void SetCuts(double lowCut, double highCut);
     void Reset() noexcept;
 
+    // The two cuts as designed (a wire when off).
+    const BiQuad::Coefficients& LowCutCoefficients() const { return m_low; }
+    const BiQuad::Coefficients& HighCutCoefficients() const { return m_high; }
+
     float Process(std::uint32_t channel, float x) noexcept {
         State& s = m_states[channel];
         const double v = Section(m_low, s.low, std::isfinite(x) ? x : 0.0f);

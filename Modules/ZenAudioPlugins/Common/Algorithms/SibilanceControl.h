@@ -53,6 +53,8 @@ public:
 
     // The smoothed gain in log units.
     float GetGain() const { return m_gain; }
+    // The detector band as designed now (for displays).
+    const BiQuad::Coefficients& BandCoefficients() const { return m_band.GetCoefficients(); }
 
 private:
     void ProcessPiece(float* const* channels, std::uint64_t channelCount, std::uint64_t count) noexcept;

@@ -36,6 +36,12 @@ public:
     // square root of the band's linear gain or its inverse).
     static double RingSeconds(double gainDb, double frequency, double q, double decayDb);
 
+    // Band 0 (low shelf), 1 (bell) or 2 (high shelf) as it runs now: the
+    // wire while it is switched out.
+    BiQuad::Coefficients BandCoefficients(int band) const {
+        return m_enabled[band] ? m_designs[band].GetCoefficients() : BiQuad::Coefficients{};
+    }
+
 private:
     BiQuad m_designs[3];
     zen::SvfSection m_bands[3];

@@ -125,6 +125,20 @@ void TrackingNotchBank::UpdateFrequency() noexcept {
     SetFrequency(next);
 }
 
+std::complex<double> TrackingNotchBank::HumTransfer(double frequency, double fundamental) const {
+    const double rate = GetSampleRate();
+    const std::complex<double> z1 = std::polar(1.0, -kTwoPi * frequency / rate);
+    const std::complex<double> z2 = z1 * z1;
+    std::complex<double> g = 0.0;
+    for (std::size_t k = 0; k < m_harmonics; ++k) {
+        const double c = std::cos(kTwoPi * fundamental * static_cast<double>(k + 1) / rate);
+        g += m_step[k] * (2.0 * c * z1 - 2.0 * z2) / (1.0 - 2.0 * c * z1 + z2);
+    }
+    // On a harmonic itself the canceller's gain is infinite: all of it is hum.
+    if (!std::isfinite(g.real()) || !std::isfinite(g.imag())) return 1.0;
+    return g / (1.0 + g);
+}
+
 void TrackingNotchBank::EstimateHum(const float* const* input, float* const* hum, std::uint64_t count) noexcept {
     const std::size_t harmonics = m_harmonics;
     std::array<std::complex<double>, kMaxHarmonics> reference;

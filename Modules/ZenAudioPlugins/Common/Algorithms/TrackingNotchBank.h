@@ -57,6 +57,12 @@ public:
     // The fundamental the notches sit on now (Hz).
     double GetTrackedFrequency() const { return m_frequency; }
 
+    // What the bank takes as hum at `frequency` with the notches held on
+    // `fundamental`: the steady state of the cancellers, each an integrator
+    // of its harmonic's error, G = sum a_k (2 cos w_k z^-1 - 2 z^-2) /
+    // (1 - 2 cos w_k z^-1 + z^-2), so the hum is G / (1 + G) of the input.
+    std::complex<double> HumTransfer(double frequency, double fundamental) const;
+
 private:
     struct ChannelState {
         std::array<std::complex<double>, kMaxHarmonics> weight{};    // the cancellers

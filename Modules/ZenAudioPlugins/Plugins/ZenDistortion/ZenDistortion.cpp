@@ -16,15 +16,18 @@ constexpr double kTwoPi = 6.283185307179586;
 // The tail ends when the DC blocker's memory has fallen by 100 dB.
 constexpr double kTailNepers = 11.5;
 
-// Half the tilt above the pivot, half below: the high band's gain.
-float TiltGain(float db) { return std::pow(10.0f, db / 40.0f); }
-
 }  // namespace
 
 ZenDistortion::ZenDistortion() : m_oversampler(kOversampling, true) {
     InitParameters(Definitions());
     InitMeters(Meters());
 }
+
+float ZenDistortion::TiltGain(float db) { return std::pow(10.0f, db / 40.0f); }
+
+double ZenDistortion::DcPole(double sampleRate) { return std::exp(-kTwoPi * kDcBlockHz / sampleRate); }
+
+double ZenDistortion::ToneCoefficient(double sampleRate) { return 1.0 - std::exp(-kTwoPi * kTonePivotHz / sampleRate); }
 
 const zen::ParameterTableDefinition& ZenDistortion::Definitions() {
     using namespace zen;
@@ -90,8 +93,8 @@ void ZenDistortion::PrepareProcessing(float sampleRate, std::uint32_t maxBlockSi
     m_dry.assign(maxBlockSize, 0.0f);
     m_pre.assign(static_cast<std::size_t>(maxBlockSize) * kOversampling, 0.0f);
     m_post.assign(m_pre.size(), 0.0f);
-    m_dcPole = std::exp(-kTwoPi * kDcBlockHz / sampleRate);
-    m_toneCoefficient = 1.0 - std::exp(-kTwoPi * kTonePivotHz / sampleRate);
+    m_dcPole = DcPole(sampleRate);
+    m_toneCoefficient = ToneCoefficient(sampleRate);
     SetLatency(m_oversampler.GetLatency());
     ResetProcessing();
 }

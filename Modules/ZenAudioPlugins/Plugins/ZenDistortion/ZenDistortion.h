@@ -41,6 +41,12 @@ public:
     static const zen::ParameterTableDefinition& Definitions();
     static const zen::MeterTableDefinition& Meters();
 
+    // The tone's treble gain t for "Tone" in dB (the lows get 1/t), the
+    // DC blocker's pole and the tilt's one-pole low-pass coefficient.
+    static float TiltGain(float db);
+    static double DcPole(double sampleRate);
+    static double ToneCoefficient(double sampleRate);
+
     std::uint32_t GetTailLength() const override;
     bool ApplyNeutralSetting() override;
 

@@ -13,14 +13,10 @@ const zen::PluginDescriptor ZenStereoEcho::kDescriptor = {
     "Echo", 1.0, zen::kPluginStateOffered, zen::MakePluginCode('Z', 'e', 'n', 'y'),
     2, 2, "ZenStereoEcho", 0, 0, -1, nullptr};
 
-namespace {
-
-double TimeMs(float time, int sync, float tempo) {
+double ZenStereoEcho::TimeMs(float time, int sync, float tempo) {
     const double ms = sync > 0 ? zen::NoteValueMs(sync, tempo) : time;
-    return std::min(std::max(ms, ZenStereoEcho::kMinTimeMs), ZenStereoEcho::kMaxTimeMs);
+    return std::min(std::max(ms, kMinTimeMs), kMaxTimeMs);
 }
-
-}  // namespace
 
 ZenStereoEcho::ZenStereoEcho() {
     InitParameters(Definitions());

@@ -43,6 +43,9 @@ public:
     static const zen::ParameterTableDefinition& Definitions();
     static const zen::MeterTableDefinition& Meters();
 
+    // The echo time: "Time", or the note value "Sync" (when not 0) at "Tempo", within the range.
+    static double TimeMs(float time, int sync, float tempo);
+
     // The tape's curve at drive gain k: unity gain for small signals, a
     // Pade form of tanh(k x) / k, reaching +-1/k from k |x| = 3.
     static float Saturate(float x, float k) noexcept {
