@@ -47,6 +47,11 @@ QSize GoniometerDisplay::sizeHint() const {
     return {16 * line, 18 * line};
 }
 
+QSize GoniometerDisplay::minimumSizeHint() const {
+    const int line = fontMetrics().height();
+    return {12 * line, 14 * line};
+}
+
 void GoniometerDisplay::paintEvent(QPaintEvent*) {
     QPainter painter(this);
     painter.setRenderHint(QPainter::Antialiasing);
@@ -58,7 +63,7 @@ void GoniometerDisplay::paintEvent(QPaintEvent*) {
     painter.drawText(QRectF(0, 0, width(), line), Qt::AlignHCenter | Qt::AlignTop, m_title);
 
     const double barHeight = m_correlationMeter >= 0 ? 2.5 * line : 0.0;
-    const QRectF area(line, 1.5 * line, width() - 2 * line, height() - 2 * line - barHeight);
+    const QRectF area(line, 2.5 * line, width() - 2 * line, height() - 3 * line - barHeight);
     const double radius = std::max(1.0, std::min(area.width(), area.height()) / 2.0);
     const QPointF centre = area.center();
 

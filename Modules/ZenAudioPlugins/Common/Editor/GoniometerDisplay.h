@@ -33,6 +33,7 @@ public:
 protected:
     void paintEvent(QPaintEvent* event) override;
     QSize sizeHint() const override;
+    QSize minimumSizeHint() const override;
 
 private:
     static constexpr std::uint32_t kReadChunk = 1024;

@@ -2,6 +2,7 @@
 
 #include <QPainter>
 #include <algorithm>
+#include <cmath>
 
 ReadoutDisplay::ReadoutDisplay(const QString& caption, Update update, QWidget* parent)
     : EditorDisplay(parent), m_caption(caption), m_update(std::move(update)), m_text("–"), m_widest("+00.00 dB") {
@@ -14,7 +15,9 @@ ReadoutDisplay* ReadoutDisplay::ForMeter(const QString& caption, std::uint32_t m
         [meter, decimals](const zen::EditorLink& link) {
             zen::MeterInfo info;
             link.GetMeterInfo(meter, info);
-            const QString value = QString::number(static_cast<double>(link.GetMeter(meter)), 'f', decimals);
+            double reading = link.GetMeter(meter);
+            if (std::fabs(reading) < 0.5 * std::pow(10.0, -decimals)) reading = 0.0;  // no "-0.00"
+            const QString value = QString::number(reading, 'f', decimals);
             return info.unit.empty() ? value : value + " " + QString::fromStdString(info.unit);
         },
         parent);

@@ -57,6 +57,11 @@ QSize RoomView::sizeHint() const {
     return {16 * line, 18 * line};
 }
 
+QSize RoomView::minimumSizeHint() const {
+    const int line = fontMetrics().height();
+    return {12 * line, 12 * line};
+}
+
 void RoomView::paintEvent(QPaintEvent*) {
     QPainter painter(this);
     painter.setRenderHint(QPainter::Antialiasing);

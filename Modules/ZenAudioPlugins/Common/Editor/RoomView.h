@@ -27,6 +27,7 @@ public:
 protected:
     void paintEvent(QPaintEvent* event) override;
     QSize sizeHint() const override;
+    QSize minimumSizeHint() const override;
 
 private:
     QString m_title;

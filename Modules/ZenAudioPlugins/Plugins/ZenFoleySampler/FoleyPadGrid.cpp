@@ -36,6 +36,7 @@ void FoleyPadGrid::ShowPads(std::uint32_t count) {
         auto* button = new QPushButton(QString::number(i + 1), this);
         button->setCheckable(true);
         button->setMinimumWidth(button->fontMetrics().horizontalAdvance("000") * 2);
+        button->setMinimumHeight(button->fontMetrics().height() * 2);
         const std::uint32_t number = i + 1;
         connect(button, &QPushButton::pressed, this, [this, number] { Press(number); });
         connect(button, &QPushButton::released, this, [this] { Release(); });
@@ -64,7 +65,16 @@ void FoleyPadGrid::Refresh(const zen::EditorLink& link) {
     if (pads == 0) pads = m_builtInPads;
     ShowPads(pads);
     const auto selected = static_cast<std::uint32_t>(std::lround(link.GetParameter(m_pad)));
-    for (std::uint32_t i = 0; i < m_buttons.size(); ++i) m_buttons[i]->setChecked(i + 1 == selected);
+    for (std::uint32_t i = 0; i < m_buttons.size(); ++i) {
+        QPushButton* button = m_buttons[i];
+        const bool chosen = i + 1 == selected;
+        if (button->isChecked() == chosen) continue;
+        button->setChecked(chosen);
+        // The chosen pad in the highlight colour, so it reads at a glance.
+        QPalette colours = palette();
+        if (chosen) colours.setColor(QPalette::Button, colours.color(QPalette::Highlight));
+        button->setPalette(colours);
+    }
 
     const int voices = static_cast<int>(std::lround(link.GetMeter(m_voicesMeter)));
     QString status = m_lastPlayed > 0 ? tr("Last played: pad %1").arg(m_lastPlayed) : tr("Press a pad to play it");
