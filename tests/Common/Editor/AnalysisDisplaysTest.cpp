@@ -4,6 +4,7 @@
 // the decay law of the engine's lines.
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cmath>
 
 #include "Common/Editor/DecayDisplay.h"
@@ -69,6 +70,19 @@ TEST(AnalysisDisplays, SpectrumRecordPointsAreItsPowersInDb) {
     EXPECT_NEAR(peak[0].y(), 10.0 * std::log10(2.0), 1e-5);
     // A record that claims more bins than it holds draws nothing.
     EXPECT_TRUE(SpectrumDisplay::RecordPoints(record, 6, false, 48000.0).empty());
+
+    // The largest analysis, thinned for drawing, keeps a one-bin peak and its frequency's place.
+    constexpr std::size_t kBins = 16385;
+    std::vector<float> large(1 + 2 * kBins, 1e-6f);
+    large[0] = kBins;
+    large[1 + 12345] = 0.25f;
+    const std::vector<QPointF> thinned =
+        SpectrumDisplay::Thinned(SpectrumDisplay::RecordPoints(large.data(), large.size(), false, 48000.0));
+    ASSERT_LE(thinned.size(), SpectrumDisplay::kMaxPoints);
+    const auto loudest = std::max_element(thinned.begin(), thinned.end(),
+                                          [](const QPointF& a, const QPointF& b) { return a.y() < b.y(); });
+    EXPECT_NEAR(loudest->y(), 10.0 * std::log10(0.25), 1e-5);
+    EXPECT_NEAR(loudest->x(), 12345.0 * 24000.0 / (kBins - 1), 24000.0 * 0.01);
 }
 
 TEST(AnalysisDisplays, GoniometerPutsEachChannelOnItsDiagonal) {

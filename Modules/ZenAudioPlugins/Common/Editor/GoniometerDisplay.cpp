@@ -1,6 +1,7 @@
 #include "GoniometerDisplay.h"
 
 #include <QPainter>
+#include <QPolygonF>
 #include <algorithm>
 #include <cmath>
 
@@ -83,18 +84,22 @@ void GoniometerDisplay::paintEvent(QPaintEvent*) {
     painter.drawText(QRectF(centre + QPointF(diagonal, -diagonal - line), label), Qt::AlignCenter, "R");
     painter.drawText(QRectF(centre + QPointF(-line / 2, -radius - line), label), Qt::AlignCenter, "M");
 
-    // Full scale on one channel reaches the circle's diagonal.
-    painter.setPen(Qt::NoPen);
-    const double dot = std::max(1.0, line / 8.0);
+    // Full scale on one channel reaches the circle's diagonal. Older points
+    // fade in a few steps, each drawn in one call.
+    const double dot = std::max(1.5, line / 4.0);
     const std::size_t count = m_points.size();
-    for (std::size_t i = 0; i < count; ++i) {
-        const QPointF& p = m_points[i];
+    QPolygonF slice;
+    for (std::size_t step = 0; step < kFadeSteps; ++step) {
+        const std::size_t from = count * step / kFadeSteps, to = count * (step + 1) / kFadeSteps;
+        slice.clear();
+        for (std::size_t i = from; i < to; ++i) {
+            const QPointF& p = m_points[i];
+            if (p.x() * p.x() + p.y() * p.y() <= 1.0) slice << centre + QPointF(p.x() * radius, -p.y() * radius);
+        }
         QColor colour = kTrace;
-        colour.setAlphaF(0.15 + 0.85 * static_cast<double>(i + 1) / static_cast<double>(count));
-        painter.setBrush(colour);
-        const QPointF pixel = centre + QPointF(p.x() * radius, -p.y() * radius);
-        if (std::hypot(pixel.x() - centre.x(), pixel.y() - centre.y()) <= radius)
-            painter.drawEllipse(pixel, dot, dot);
+        colour.setAlphaF(0.15 + 0.85 * static_cast<double>(step + 1) / kFadeSteps);
+        painter.setPen(QPen(colour, dot, Qt::SolidLine, Qt::RoundCap));
+        painter.drawPoints(slice);
     }
 
     if (m_correlationMeter < 0) return;

@@ -37,6 +37,7 @@ protected:
 
 private:
     static constexpr std::uint32_t kReadChunk = 1024;
+    static constexpr std::size_t kFadeSteps = 8;
 
     QString m_title;
     std::uint32_t m_ring;

@@ -41,6 +41,25 @@ std::vector<QPointF> SpectrumDisplay::RecordPoints(const float* record, std::siz
     return points;
 }
 
+std::vector<QPointF> SpectrumDisplay::Thinned(std::vector<QPointF> points) {
+    if (points.size() <= kMaxPoints) return points;
+    const double low = std::log(points.front().x()), high = std::log(points.back().x());
+    const double perBand = static_cast<double>(kMaxPoints - 1) / std::max(high - low, 1e-9);
+    std::vector<QPointF> bands;
+    bands.reserve(kMaxPoints);
+    long band = -1;
+    for (const QPointF& p : points) {
+        const auto at = static_cast<long>((std::log(p.x()) - low) * perBand);
+        if (at != band) {
+            bands.push_back(p);
+            band = at;
+        } else if (p.y() > bands.back().y()) {
+            bands.back().setY(p.y());
+        }
+    }
+    return bands;
+}
+
 bool SpectrumDisplay::Drain(const zen::EditorLink& link, Reader& reader) {
     zen::MeterInfo info;
     if (!link.GetMeterInfo(reader.trace.meter, info) || info.size == 0) return false;
@@ -75,6 +94,6 @@ void SpectrumDisplay::Read(const zen::EditorLink& link) {
             reader.trace.source == Source::Array
                 ? ArrayPoints(reader.values.data(), reader.values.size(), rate)
                 : RecordPoints(reader.values.data(), reader.values.size(), reader.trace.source == Source::RingPeak, rate);
-        SetCurve(i, std::move(points), reader.trace.name, i == 0);
+        SetCurve(i, Thinned(std::move(points)), reader.trace.name, i == 0);
     }
 }

@@ -35,6 +35,11 @@ public:
     static std::vector<QPointF> ArrayPoints(const float* values, std::size_t count, double sampleRate);
     // A spectrum ring record's powers (`peaks` false) or held peaks, in dB.
     static std::vector<QPointF> RecordPoints(const float* record, std::size_t width, bool peaks, double sampleRate);
+    // More points than a plot has pixels, merged into kMaxPoints bands even
+    // on the logarithmic axis, each at its loudest (so no peak is lost).
+    static std::vector<QPointF> Thinned(std::vector<QPointF> points);
+
+    static constexpr std::size_t kMaxPoints = 512;
 
 private:
     struct Reader {
