@@ -8,6 +8,7 @@
 #include <QLabel>
 #include <QPushButton>
 #include <QScrollArea>
+#include <QScrollBar>
 #include <QSignalBlocker>
 #include <QStyle>
 #include <QStyleFactory>
@@ -276,6 +277,7 @@ void ZenEditor::BuildDefaultLayout() {
         auto* bars = new LevelBars(std::move(names), box);
         column->addWidget(bars);
         m_layout->meterDisplays.push_back(bars);
+        bars->Refresh(*m_link);
         PlaceGroup(box, 2);
     }
 }
@@ -305,10 +307,14 @@ void ZenEditor::Finish() {
     const QSize need = m_layout->groupArea->sizeHint();
     const QFontMetrics metrics(font());
     if (need.height() > metrics.height() * kScrollLines || need.width() > metrics.averageCharWidth() * kScrollCharacters) {
+        // Only the height scrolls: groups stay side by side as laid out.
         auto* scroll = new QScrollArea;
         scroll->setWidget(m_layout->groupArea);
         scroll->setWidgetResizable(true);
         scroll->setFrameShape(QFrame::NoFrame);
+        scroll->setHorizontalScrollBarPolicy(Qt::ScrollBarAlwaysOff);
+        scroll->setMinimumWidth(need.width() + scroll->verticalScrollBar()->sizeHint().width());
+        scroll->setMinimumHeight(std::min(need.height(), metrics.height() * kScrollLines));
         scroll->setPalette(palette());
         scroll->viewport()->setAutoFillBackground(false);
         m_layout->root->addWidget(scroll, 1);
