@@ -14,9 +14,8 @@ const QColor kNegative(230, 90, 80);
 }  // namespace
 
 GoniometerDisplay::GoniometerDisplay(const QString& title, std::uint32_t ring, int correlation, QWidget* parent)
-    : EditorDisplay(parent), m_title(title), m_ring(ring), m_correlationMeter(correlation) {
+    : TitledDisplay(title, {16, 18}, {12, 14}, parent), m_ring(ring), m_correlationMeter(correlation) {
     m_buffer.resize(2 * kReadChunk);
-    setSizePolicy(QSizePolicy::Expanding, QSizePolicy::Expanding);
 }
 
 void GoniometerDisplay::Refresh(const zen::EditorLink& link) {
@@ -43,25 +42,10 @@ void GoniometerDisplay::Refresh(const zen::EditorLink& link) {
     if (changed) update();
 }
 
-QSize GoniometerDisplay::sizeHint() const {
-    const int line = fontMetrics().height();
-    return {16 * line, 18 * line};
-}
-
-QSize GoniometerDisplay::minimumSizeHint() const {
-    const int line = fontMetrics().height();
-    return {12 * line, 14 * line};
-}
-
 void GoniometerDisplay::paintEvent(QPaintEvent*) {
     QPainter painter(this);
-    painter.setRenderHint(QPainter::Antialiasing);
+    const double line = PaintTitle(painter);
     const QPalette& colours = palette();
-    const QFontMetricsF metrics(font());
-    const double line = metrics.height();
-
-    painter.setPen(colours.color(QPalette::WindowText));
-    painter.drawText(QRectF(0, 0, width(), line), Qt::AlignHCenter | Qt::AlignTop, m_title);
 
     const double barHeight = m_correlationMeter >= 0 ? 2.5 * line : 0.0;
     const QRectF area(line, 2.5 * line, width() - 2 * line, height() - 3 * line - barHeight);

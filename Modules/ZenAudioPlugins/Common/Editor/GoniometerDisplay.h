@@ -11,9 +11,9 @@
 #include <deque>
 #include <vector>
 
-#include "EditorDisplay.h"
+#include "TitledDisplay.h"
 
-class GoniometerDisplay : public EditorDisplay {
+class GoniometerDisplay : public TitledDisplay {
     Q_OBJECT
 
 public:
@@ -32,14 +32,11 @@ public:
 
 protected:
     void paintEvent(QPaintEvent* event) override;
-    QSize sizeHint() const override;
-    QSize minimumSizeHint() const override;
 
 private:
     static constexpr std::uint32_t kReadChunk = 1024;
     static constexpr std::size_t kFadeSteps = 8;
 
-    QString m_title;
     std::uint32_t m_ring;
     int m_correlationMeter;
     std::uint64_t m_cursor = 0;

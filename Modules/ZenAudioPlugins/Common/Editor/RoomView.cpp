@@ -20,14 +20,11 @@ const QColor kSource(250, 190, 80);
 
 RoomView::RoomView(const QString& title, std::uint32_t length, std::uint32_t width, std::uint32_t height,
                    std::uint32_t distance, QWidget* parent)
-    : EditorDisplay(parent),
-      m_title(title),
+    : TitledDisplay(title, {16, 18}, {12, 12}, parent),
       m_lengthIndex(length),
       m_widthIndex(width),
       m_heightIndex(height),
-      m_distanceIndex(distance) {
-    setSizePolicy(QSizePolicy::Expanding, QSizePolicy::Expanding);
-}
+      m_distanceIndex(distance) {}
 
 QPointF RoomView::SourcePosition(float length, float width, float distance) {
     // No parameter moves the source's direction: it stays where the engine's
@@ -52,23 +49,10 @@ void RoomView::Refresh(const zen::EditorLink& link) {
     update();
 }
 
-QSize RoomView::sizeHint() const {
-    const int line = fontMetrics().height();
-    return {16 * line, 18 * line};
-}
-
-QSize RoomView::minimumSizeHint() const {
-    const int line = fontMetrics().height();
-    return {12 * line, 12 * line};
-}
-
 void RoomView::paintEvent(QPaintEvent*) {
     QPainter painter(this);
-    painter.setRenderHint(QPainter::Antialiasing);
+    const double line = PaintTitle(painter);
     const QPalette& colours = palette();
-    const double line = QFontMetricsF(font()).height();
-    painter.setPen(colours.color(QPalette::WindowText));
-    painter.drawText(QRectF(0, 0, width(), line), Qt::AlignHCenter | Qt::AlignTop, m_title);
     const QString size = QString("%1 × %2 × %3 m")
                              .arg(static_cast<double>(m_length), 0, 'f', 1)
                              .arg(static_cast<double>(m_width), 0, 'f', 1)

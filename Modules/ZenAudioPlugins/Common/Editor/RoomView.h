@@ -7,9 +7,9 @@
 #include <QString>
 #include <cstdint>
 
-#include "EditorDisplay.h"
+#include "TitledDisplay.h"
 
-class RoomView : public EditorDisplay {
+class RoomView : public TitledDisplay {
     Q_OBJECT
 
 public:
@@ -26,11 +26,8 @@ public:
 
 protected:
     void paintEvent(QPaintEvent* event) override;
-    QSize sizeHint() const override;
-    QSize minimumSizeHint() const override;
 
 private:
-    QString m_title;
     std::uint32_t m_lengthIndex, m_widthIndex, m_heightIndex, m_distanceIndex;
     float m_length = 0.0f, m_width = 0.0f, m_height = 0.0f, m_distance = 0.0f;
 };

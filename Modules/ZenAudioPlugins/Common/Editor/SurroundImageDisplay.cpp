@@ -19,13 +19,10 @@ const QColor kSpeaker(250, 190, 80);
 
 SurroundImageDisplay::SurroundImageDisplay(const QString& title, std::uint32_t direction, std::uint32_t spread,
                                            std::vector<std::uint32_t> levels, QWidget* parent)
-    : EditorDisplay(parent),
-      m_title(title),
+    : TitledDisplay(title, {16, 16}, {12, 12}, parent),
       m_directionMeter(direction),
       m_spreadMeter(spread),
-      m_levelMeters(std::move(levels)) {
-    setSizePolicy(QSizePolicy::Expanding, QSizePolicy::Expanding);
-}
+      m_levelMeters(std::move(levels)) {}
 
 void SurroundImageDisplay::Refresh(const zen::EditorLink& link) {
     const std::size_t channels = std::min<std::size_t>(link.GetInputChannelCount(), m_levelMeters.size());
@@ -39,23 +36,10 @@ void SurroundImageDisplay::Refresh(const zen::EditorLink& link) {
     update();
 }
 
-QSize SurroundImageDisplay::sizeHint() const {
-    const int line = fontMetrics().height();
-    return {16 * line, 16 * line};
-}
-
-QSize SurroundImageDisplay::minimumSizeHint() const {
-    const int line = fontMetrics().height();
-    return {12 * line, 12 * line};
-}
-
 void SurroundImageDisplay::paintEvent(QPaintEvent*) {
     QPainter painter(this);
-    painter.setRenderHint(QPainter::Antialiasing);
+    const double line = PaintTitle(painter);
     const QPalette& colours = palette();
-    const double line = QFontMetricsF(font()).height();
-    painter.setPen(colours.color(QPalette::WindowText));
-    painter.drawText(QRectF(0, 0, width(), line), Qt::AlignHCenter | Qt::AlignTop, m_title);
 
     const QRectF area(line, 2.0 * line, width() - 2.0 * line, height() - 3.0 * line);
     const double radius = std::max(1.0, std::min(area.width(), area.height()) / 2.0 - line);

@@ -8,9 +8,9 @@
 #include <cstdint>
 #include <vector>
 
-#include "EditorDisplay.h"
+#include "TitledDisplay.h"
 
-class SurroundImageDisplay : public EditorDisplay {
+class SurroundImageDisplay : public TitledDisplay {
     Q_OBJECT
 
 public:
@@ -23,11 +23,8 @@ public:
 
 protected:
     void paintEvent(QPaintEvent* event) override;
-    QSize sizeHint() const override;
-    QSize minimumSizeHint() const override;
 
 private:
-    QString m_title;
     std::uint32_t m_directionMeter, m_spreadMeter;
     std::vector<std::uint32_t> m_levelMeters;
     float m_direction = 0.0f, m_spread = 0.0f;
