@@ -23,6 +23,13 @@ ReadoutDisplay* ReadoutDisplay::ForMeter(const QString& caption, std::uint32_t m
         parent);
 }
 
+ReadoutDisplay* ReadoutDisplay::ForState(const QString& caption, std::uint32_t meter, const QString& off,
+                                         const QString& on, QWidget* parent) {
+    return new ReadoutDisplay(
+        caption, [meter, off, on](const zen::EditorLink& link) { return link.GetMeter(meter) > 0.5f ? on : off; },
+        parent);
+}
+
 QFont ReadoutDisplay::ValueFont() const {
     QFont large = font();
     large.setPointSizeF(large.pointSizeF() * kValueScale);

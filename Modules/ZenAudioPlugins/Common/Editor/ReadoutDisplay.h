@@ -19,6 +19,9 @@ public:
     // A meter's reading with `decimals` places and the meter's unit.
     static ReadoutDisplay* ForMeter(const QString& caption, std::uint32_t meter, int decimals,
                                     QWidget* parent = nullptr);
+    // A meter that reads 0 or 1 as one of two words.
+    static ReadoutDisplay* ForState(const QString& caption, std::uint32_t meter, const QString& off, const QString& on,
+                                    QWidget* parent = nullptr);
 
     void Refresh(const zen::EditorLink& link) override;
     const QString& Text() const { return m_text; }

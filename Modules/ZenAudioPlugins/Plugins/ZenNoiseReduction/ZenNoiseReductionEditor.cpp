@@ -27,12 +27,8 @@ void BuildNoiseReductionEditor(ZenEditor& editor) {
                                                 SpectrumDisplay::Source::Array}}),
                           2);
     if (profile >= 0)
-        editor.AddDisplay(new ReadoutDisplay(QObject::tr("Profile"),
-                                             [profile](const zen::EditorLink& link) {
-                                                 return link.GetMeter(static_cast<std::uint32_t>(profile)) > 0.5f
-                                                            ? QObject::tr("Learnt")
-                                                            : QObject::tr("None");
-                                             }),
+        editor.AddDisplay(ReadoutDisplay::ForState(QObject::tr("Profile"), static_cast<std::uint32_t>(profile),
+                                                   QObject::tr("None"), QObject::tr("Learnt")),
                           0);
     editor.AddMeters(QObject::tr("Reduction"), {"REDUCTION"});
     editor.AddGroup(QObject::tr("Reduction"), {"REDUCTION", "SENSITIVITY", "SMOOTHING"});

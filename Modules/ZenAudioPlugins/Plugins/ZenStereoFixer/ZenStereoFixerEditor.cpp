@@ -17,12 +17,8 @@ void BuildStereoFixerEditor(ZenEditor& editor) {
     if (balance >= 0)
         editor.AddDisplay(ReadoutDisplay::ForMeter(QObject::tr("Balance"), static_cast<std::uint32_t>(balance), 1), 1);
     if (folded >= 0)
-        editor.AddDisplay(new ReadoutDisplay(QObject::tr("Fold-Down"),
-                                             [folded](const zen::EditorLink& link) {
-                                                 return link.GetMeter(static_cast<std::uint32_t>(folded)) > 0.5f
-                                                            ? QObject::tr("Mono")
-                                                            : QObject::tr("Stereo");
-                                             }),
+        editor.AddDisplay(ReadoutDisplay::ForState(QObject::tr("Fold-Down"), static_cast<std::uint32_t>(folded),
+                                                   QObject::tr("Stereo"), QObject::tr("Mono")),
                           1);
     editor.AddGroup(QObject::tr("Channels"), {"SWAP", "LEFT_POLARITY", "RIGHT_POLARITY"});
     editor.AddGroup(QObject::tr("Alignment"), {"AUTO_ALIGN", "BALANCE"});
