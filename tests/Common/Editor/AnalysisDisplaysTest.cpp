@@ -112,6 +112,10 @@ TEST(AnalysisDisplays, GoniometerPutsEachChannelOnItsDiagonal) {
         }
         EXPECT_NEAR(largest, 0.5, 1e-3);  // the sample peak's distance from the centre
         EXPECT_EQ(display.Correlation(), plugin.Meter("Correlation"));
+
+        // With no audio coming (transport stopped) the cloud empties instead of freezing.
+        for (std::size_t i = 0; i < GoniometerDisplay::kEmptyingRefreshes; ++i) display.Refresh(link);
+        EXPECT_TRUE(display.Points().empty());
     }
 }
 

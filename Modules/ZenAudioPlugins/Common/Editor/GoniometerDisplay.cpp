@@ -32,7 +32,11 @@ void GoniometerDisplay::Refresh(const zen::EditorLink& link) {
             changed |= read.records > 0;
             if (read.records < kReadChunk) break;
         }
-        while (m_points.size() > kShownPoints) m_points.pop_front();
+        // Without new points (transport stopped) the cloud empties over a few refreshes.
+        std::size_t keep = kShownPoints;
+        if (!changed) keep = m_points.size() > kShownPoints / kEmptyingRefreshes ? m_points.size() - kShownPoints / kEmptyingRefreshes : 0;
+        changed |= m_points.size() > keep;
+        while (m_points.size() > keep) m_points.pop_front();
     }
     if (m_correlationMeter >= 0) {
         const float correlation = std::clamp(link.GetMeter(static_cast<std::uint32_t>(m_correlationMeter)), -1.0f, 1.0f);
