@@ -31,6 +31,7 @@ constexpr int kRowCells = 12;
 // scrolls rather than growing the editor past a screen.
 constexpr int kScrollLines = 40;
 constexpr int kScrollCharacters = 200;
+constexpr double kTitleScale = 1.35;  // the plug-in's name over the body text
 
 std::string Tail(const std::string& identifier) {
     const std::size_t colon = identifier.rfind("::");
@@ -139,7 +140,10 @@ void ZenEditor::BuildHeader(const QString& title) {
     auto* header = new QHBoxLayout;
     auto* name = new QLabel(title);
     QFont big = name->font();
-    big.setPointSizeF(big.pointSizeF() * 1.35);
+    if (big.pointSizeF() > 0.0)
+        big.setPointSizeF(big.pointSizeF() * kTitleScale);
+    else
+        big.setPixelSize(static_cast<int>(big.pixelSize() * kTitleScale));
     big.setBold(true);
     name->setFont(big);
     header->addWidget(name);
@@ -207,9 +211,16 @@ void ZenEditor::AddGroup(const QString& title, const std::vector<std::string>& p
     std::vector<std::uint32_t> indices;
     for (const std::string& name : parameters) {
         const int index = FindParameter(name.c_str());
-        if (index < 0 || m_controls[static_cast<std::size_t>(index)] != nullptr) continue;
+        // Each parameter has one control: the first group that names it.
+        if (index < 0 || m_controls[static_cast<std::size_t>(index)] != nullptr ||
+            std::find(indices.begin(), indices.end(), static_cast<std::uint32_t>(index)) != indices.end())
+            continue;
         indices.push_back(static_cast<std::uint32_t>(index));
     }
+    PlaceControls(title, indices, static_cast<int>(std::min<std::size_t>(indices.size(), kGroupColumns)));
+}
+
+void ZenEditor::PlaceControls(const QString& title, const std::vector<std::uint32_t>& indices, int cells) {
     if (indices.empty()) return;
     auto* box = new QGroupBox(title);
     auto* grid = new QGridLayout(box);
@@ -221,7 +232,7 @@ void ZenEditor::AddGroup(const QString& title, const std::vector<std::string>& p
         grid->addWidget(control, static_cast<int>(i) / kGroupColumns, static_cast<int>(i) % kGroupColumns,
                         Qt::AlignHCenter | Qt::AlignTop);
     }
-    PlaceGroup(box, static_cast<int>(std::min<std::size_t>(indices.size(), kGroupColumns)));
+    PlaceGroup(box, cells);
 }
 
 void ZenEditor::AddDisplay(EditorDisplay* display, int stretch) {
@@ -249,19 +260,7 @@ void ZenEditor::OnRefresh(std::function<void()> callback) {
 void ZenEditor::BuildDefaultLayout() {
     std::vector<std::uint32_t> all(m_controls.size());
     for (std::uint32_t i = 0; i < all.size(); ++i) all[i] = i;
-    if (!all.empty()) {
-        auto* box = new QGroupBox(tr("Parameters"));
-        auto* grid = new QGridLayout(box);
-        for (std::size_t i = 0; i < all.size(); ++i) {
-            ParameterControl* control = ParameterControl::Create(*m_link, all[i], box);
-            if (control == nullptr) continue;
-            m_controls[i] = control;
-            m_layout->groupOf[i] = box->title();
-            grid->addWidget(control, static_cast<int>(i) / kGroupColumns, static_cast<int>(i) % kGroupColumns,
-                            Qt::AlignHCenter | Qt::AlignTop);
-        }
-        PlaceGroup(box, kRowCells);
-    }
+    PlaceControls(tr("Parameters"), all, kRowCells);
     // Every level and value meter by its name, once per plug-in.
     std::vector<std::string> names;
     zen::MeterInfo info;
@@ -287,19 +286,7 @@ void ZenEditor::Finish() {
     std::vector<std::uint32_t> left;
     for (std::uint32_t i = 0; i < m_controls.size(); ++i)
         if (m_controls[i] == nullptr) left.push_back(i);
-    if (!left.empty()) {
-        auto* box = new QGroupBox(tr("Other"));
-        auto* grid = new QGridLayout(box);
-        for (std::size_t i = 0; i < left.size(); ++i) {
-            ParameterControl* control = ParameterControl::Create(*m_link, left[i], box);
-            if (control == nullptr) continue;
-            m_controls[left[i]] = control;
-            m_layout->groupOf[left[i]] = box->title();
-            grid->addWidget(control, static_cast<int>(i) / kGroupColumns, static_cast<int>(i) % kGroupColumns,
-                            Qt::AlignHCenter | Qt::AlignTop);
-        }
-        PlaceGroup(box, static_cast<int>(std::min<std::size_t>(left.size(), kGroupColumns)));
-    }
+    PlaceControls(tr("Other"), left, static_cast<int>(std::min<std::size_t>(left.size(), kGroupColumns)));
     m_layout->groupRows->addStretch(1);
     if (m_displays.empty()) m_layout->root->setStretchFactor(m_layout->displayRow, 0);
 
