@@ -204,9 +204,13 @@ void ZenEditor::PlaceGroup(QWidget* group, int cells) {
 }
 
 void ZenEditor::AddGroup(const QString& title, std::initializer_list<const char*> parameters) {
+    AddGroup(title, std::vector<std::string>(parameters.begin(), parameters.end()));
+}
+
+void ZenEditor::AddGroup(const QString& title, const std::vector<std::string>& parameters) {
     std::vector<std::uint32_t> indices;
-    for (const char* name : parameters) {
-        const int index = FindParameter(name);
+    for (const std::string& name : parameters) {
+        const int index = FindParameter(name.c_str());
         // Each parameter has one control: the first group that names it.
         if (index < 0 || m_controls[static_cast<std::size_t>(index)] != nullptr ||
             std::find(indices.begin(), indices.end(), static_cast<std::uint32_t>(index)) != indices.end())

@@ -16,6 +16,7 @@
 #include <functional>
 #include <initializer_list>
 #include <memory>
+#include <string>
 #include <vector>
 
 #include "zen/EditorLink.h"
@@ -54,6 +55,8 @@ public:
     // the named meters ("INPUT_PEAK" takes every channel's
     // "INPUT_PEAK_<n>").
     void AddGroup(const QString& title, std::initializer_list<const char*> parameters);
+    // The same with names made at run time (the control plug-ins' records).
+    void AddGroup(const QString& title, const std::vector<std::string>& parameters);
     void AddDisplay(EditorDisplay* display, int stretch = 1);
     void AddMeters(const QString& title, std::initializer_list<const char*> meters);
     // Runs at every refresh, after the displays.
