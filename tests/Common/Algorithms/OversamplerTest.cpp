@@ -65,22 +65,27 @@ TEST(Oversampler, ImagesAndAliasesStayBelowTheStopBand) {
     }
 }
 
-TEST(Oversampler, AHalfSampleStageKeepsTheRoundTripOnWholeSamples) {
-    Oversampler over(4, true);
-    over.SetChannelCount(2);
-    over.Prepare(48000.0f, 512);
-    std::vector<float> h = zentest::Impulse(512, 10);
-    float* high = over.Up(1, h.data(), h.size());
-    // The mean of each sample and the one before: half a sample late.
-    float previous = 0.0f;
-    for (std::size_t n = 0; n < 4 * h.size(); ++n) {
-        const float x = high[n];
-        high[n] = 0.5f * (x + previous);
-        previous = x;
+TEST(Oversampler, AStageOfAHalfOrAWholeSampleKeepsTheRoundTripOnWholeSamples) {
+    // The stage averages each sample with the ones before: a box of two
+    // (half a sample late) or a triangle of three (a whole sample late).
+    const std::vector<std::vector<float>> stages = {{0.5f, 0.5f}, {0.25f, 0.5f, 0.25f}};
+    for (std::size_t halfSamples : {1u, 2u}) {
+        const std::vector<float>& taps = stages[halfSamples - 1];
+        Oversampler over(8, halfSamples);
+        over.SetChannelCount(2);
+        over.Prepare(48000.0f, 512);
+        std::vector<float> h = zentest::Impulse(512, 10);
+        float* high = over.Up(1, h.data(), h.size());
+        std::vector<float> in(high, high + 8 * h.size());
+        for (std::size_t n = 0; n < in.size(); ++n) {
+            double sum = 0.0;
+            for (std::size_t k = 0; k < taps.size() && k <= n; ++k) sum += taps[k] * in[n - k];
+            high[n] = static_cast<float>(sum);
+        }
+        over.Down(1, h.data(), h.size());
+        const std::size_t peak = zentest::ArgPeak(h);
+        EXPECT_EQ(peak, 10 + over.GetLatency()) << halfSamples;
+        EXPECT_NEAR(h[peak - 1], h[peak + 1], 1e-6f) << halfSamples;
+        EXPECT_NEAR(h[peak - 7], h[peak + 7], 1e-6f) << halfSamples;
     }
-    over.Down(1, h.data(), h.size());
-    const std::size_t peak = zentest::ArgPeak(h);
-    EXPECT_EQ(peak, 10 + over.GetLatency());
-    EXPECT_NEAR(h[peak - 1], h[peak + 1], 1e-6f);
-    EXPECT_NEAR(h[peak - 7], h[peak + 7], 1e-6f);
 }

@@ -14,9 +14,10 @@ double KaiserLength(double attenuationDb, double df) { return (attenuationDb - 7
 
 }  // namespace
 
-Oversampler::Oversampler(std::size_t factor, bool stageHalfSample)
-    : m_factor(factor), m_stageHalfSample(stageHalfSample), m_tapsPerPhase(TapsPerPhase()) {
+Oversampler::Oversampler(std::size_t factor, std::size_t stageHalfSamples)
+    : m_factor(factor), m_stageHalfSamples(stageHalfSamples), m_tapsPerPhase(TapsPerPhase()) {
     if (factor != 2 && factor != 4 && factor != 8) throw std::invalid_argument("Oversampler: factor 2, 4 or 8");
+    if (stageHalfSamples > 2) throw std::invalid_argument("Oversampler: a stage delay of 0, 1 or 2 half samples");
 }
 
 Oversampler::~Oversampler() = default;
@@ -36,7 +37,7 @@ bool Oversampler::Prepare(float sampleRate, std::uint32_t maxBlock) {
     const std::size_t taps = m_factor * m_tapsPerPhase;
     // Delays (Nu - 1) / 2 + (Nd - 1) / 2 plus the stage's must leave the
     // decimator's phase on a whole base-rate sample: Nu + Nd + 2 x stage = 2 taps.
-    const std::vector<float> up = Prototype(m_factor, m_stageHalfSample ? taps - 1 : taps);
+    const std::vector<float> up = Prototype(m_factor, taps - m_stageHalfSamples);
     const std::vector<float> down = Prototype(m_factor, taps);
     for (Channel& channel : m_channels) {
         channel.up = std::make_unique<ora::numeric::Upsampler>(

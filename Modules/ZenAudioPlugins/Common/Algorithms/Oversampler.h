@@ -9,7 +9,7 @@
 // the base Nyquist frequency on, so that nothing the stage makes above the
 // host's band folds back louder than that. The round trip delays by a whole
 // number of base-rate samples, GetLatency(), counting the stage's own delay
-// when it is half a high-rate sample (a first-order antiderivative shaper).
+// of a half or a whole high-rate sample (an antiderivative shaper).
 #pragma once
 
 #include <cstdint>
@@ -30,9 +30,9 @@ public:
     static constexpr double kStopbandEdge = 0.5;   // of the base rate
     static constexpr double kStopbandDb = 90.0;
 
-    // `factor` 2, 4 or 8; `stageHalfSample`: the owner's stage delays by half
-    // a high-rate sample, and the round trip makes up the other half.
-    explicit Oversampler(std::size_t factor = kDefaultFactor, bool stageHalfSample = false);
+    // `factor` 2, 4 or 8; `stageHalfSamples` (0, 1 or 2): how far the owner's
+    // stage delays, in half high-rate samples; the filters make up the rest.
+    explicit Oversampler(std::size_t factor = kDefaultFactor, std::size_t stageHalfSamples = 0);
     ~Oversampler() override;
 
     // Builds the filters for the channel count and maxBlock base-rate frames.
@@ -40,7 +40,7 @@ public:
     void SetChannelCount(std::uint64_t channels) override;
     void Reset() override;
     // The round trip alone: the input low-passed and delayed by GetLatency()
-    // (half a high-rate sample less when the stage's half sample is counted).
+    // (less the stage's delay).
     bool Process(float* const* channels, std::uint64_t count) override;
 
     // `frames` base-rate samples (at most the prepared block) into the
@@ -56,8 +56,8 @@ public:
     std::size_t GetTapsPerPhase() const { return m_tapsPerPhase; }
 
     // The low-pass at the high rate (unit DC gain): the decimator's, of
-    // factor x taps-per-phase coefficients; the interpolator's is one shorter
-    // when the stage delays by half a sample.
+    // factor x taps-per-phase coefficients; the interpolator's is shorter by
+    // the stage's half samples.
     static std::vector<float> Prototype(std::size_t factor, std::size_t taps);
     // Taps per phase the Kaiser design needs for the band edges and the stop band.
     static std::size_t TapsPerPhase();
@@ -70,7 +70,7 @@ private:
     };
 
     const std::size_t m_factor;
-    const bool m_stageHalfSample;
+    const std::size_t m_stageHalfSamples;
     const std::size_t m_tapsPerPhase;
     std::vector<Channel> m_channels;
 };

@@ -21,7 +21,7 @@ float TiltGain(float db) { return std::pow(10.0f, db / 40.0f); }
 
 }  // namespace
 
-ZenDistortion::ZenDistortion() : m_oversampler(kOversampling, true) {
+ZenDistortion::ZenDistortion() : m_oversampler(kOversampling, Waveshaper::kDelayHalfSamples) {
     InitParameters(Definitions());
     InitMeters(Meters());
 }
