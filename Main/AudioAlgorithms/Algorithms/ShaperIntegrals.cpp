@@ -7,6 +7,8 @@ namespace ora::numeric {
 namespace simd {
 void ShaperIntegrals_m256(const ShaperShape& shape, const float* pre, const float* in, double* u, double* f2,
                           std::size_t n);
+void ShaperMean_m256(const double* u, const double* f2, double smallStep, double* mean, unsigned char* small,
+                     std::size_t n);
 }  // namespace simd
 
 namespace {
@@ -16,10 +18,17 @@ void ShaperIntegrals_ref(const ShaperShape& shape, const float* pre, const float
     simd::ShaperIntegralBlock<simd::PlainLanes>(shape, pre, in, u, f2, n);
 }
 
+void ShaperMean_ref(const double* u, const double* f2, double smallStep, double* mean, unsigned char* small,
+                    std::size_t n) {
+    simd::ShaperMeanBlock<simd::PlainLanes>(u, f2, smallStep, mean, small, n);
+}
+
 }  // namespace
 
 ShaperIntegrals::ShaperIntegrals() : m_form(system::ChooseKernelFormWithoutFma()) {
-    m_kernel = m_form == system::KernelForm::M256 ? &simd::ShaperIntegrals_m256 : &ShaperIntegrals_ref;
+    const bool wide = m_form == system::KernelForm::M256;
+    m_kernel = wide ? &simd::ShaperIntegrals_m256 : &ShaperIntegrals_ref;
+    m_mean = wide ? &simd::ShaperMean_m256 : &ShaperMean_ref;
     if (m_form != system::KernelForm::M256) m_form = system::KernelForm::Ref;
 }
 

@@ -33,6 +33,8 @@ struct ShaperShape {
 
 using ShaperIntegralKernel = void (*)(const ShaperShape& shape, const float* pre, const float* in, double* u,
                                       double* f2, std::size_t n);
+using ShaperMeanKernel = void (*)(const double* u, const double* f2, double smallStep, double* mean,
+                                  unsigned char* small, std::size_t n);
 
 class ShaperIntegrals {
 public:
@@ -46,11 +48,23 @@ public:
     // One value, the reference form's arithmetic.
     static double Evaluate(const ShaperShape& shape, double u) noexcept;
 
+    // The triangle-weighted mean of the curve around each u[i + 1]:
+    // mean[i] = 2 (D(u[i+2], u[i+1]) - D(u[i+1], u[i])) / (u[i+2] - u[i]),
+    // D(a, b) = (F2(a) - F2(b)) / (a - b), for i < n (u and f2 hold n + 2
+    // values). Where a step or the span is at most smallStep x (1 + |its
+    // later end|) the divisions lose too many digits: small[i] is 1 and
+    // mean[i] is left for the caller, else small[i] is 0.
+    void Mean(const double* u, const double* f2, double smallStep, double* mean, unsigned char* small,
+              std::size_t n) const noexcept {
+        m_mean(u, f2, smallStep, mean, small, n);
+    }
+
     system::KernelForm GetForm() const { return m_form; }
 
 private:
     system::KernelForm m_form;
     ShaperIntegralKernel m_kernel;
+    ShaperMeanKernel m_mean;
 };
 
 }  // namespace ora::numeric

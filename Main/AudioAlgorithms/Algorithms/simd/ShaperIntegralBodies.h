@@ -34,6 +34,8 @@ struct PlainLanes {
     static constexpr std::size_t kWidth = 1;
     static D Dup(double v) { return v; }
     static D Load(const float* p) { return static_cast<double>(*p); }
+    static D LoadDouble(const double* p) { return *p; }
+    static void StoreFlags(unsigned char* p, U mask) { *p = mask != 0 ? 1 : 0; }
     static void Store(double* p, D v) { *p = v; }
     static U Bits(D v) {
         U b;
@@ -149,6 +151,42 @@ inline void ShaperIntegralBlock(const ShaperShape& shape, const float* pre, cons
     for (; i < n; ++i) {
         u[i] = static_cast<double>(pre[i]) * static_cast<double>(in[i]);
         f2[i] = ShaperSecondIntegral<PlainLanes>(shape, u[i]);
+    }
+}
+
+template <class L>
+inline typename L::D ShaperAbs(typename L::D v) {
+    return L::FromBits(L::Bits(v) & ~kShaperSignBit);
+}
+
+// Lanes L of the mean, the rest one by one; each output in the same order of operations.
+template <class L>
+inline void ShaperMeanBlock(const double* u, const double* f2, double smallStep, double* mean, unsigned char* small,
+                            std::size_t n) {
+    std::size_t i = 0;
+    for (; i + L::kWidth <= n; i += L::kWidth) {
+        using D = typename L::D;
+        const D u0 = L::LoadDouble(u + i + 2), u1 = L::LoadDouble(u + i + 1), u2 = L::LoadDouble(u + i);
+        const D f0 = L::LoadDouble(f2 + i + 2), f1 = L::LoadDouble(f2 + i + 1), f2b = L::LoadDouble(f2 + i);
+        const D step01 = u0 - u1, step12 = u1 - u2, span = u0 - u2;
+        const D one = L::Dup(1.0), tolerance = L::Dup(smallStep);
+        const typename L::U tiny = L::Mask(ShaperAbs<L>(step01) <= tolerance * (one + ShaperAbs<L>(u0))) |
+                                   L::Mask(ShaperAbs<L>(step12) <= tolerance * (one + ShaperAbs<L>(u1))) |
+                                   L::Mask(ShaperAbs<L>(span) <= tolerance * (one + ShaperAbs<L>(u0)));
+        // Tiny lanes divide by 1 instead; their result is not used.
+        const D safe = ShaperBlend<L>(tiny, one, step01 * step12 * span);
+        L::Store(mean + i, L::Dup(2.0) * ((f0 - f1) * step12 - (f1 - f2b) * step01) / safe);
+        L::StoreFlags(small + i, tiny);
+    }
+    for (; i < n; ++i) {
+        const double u0 = u[i + 2], u1 = u[i + 1], u2 = u[i];
+        const double step01 = u0 - u1, step12 = u1 - u2, span = u0 - u2;
+        const bool tiny = std::fabs(step01) <= smallStep * (1.0 + std::fabs(u0)) ||
+                          std::fabs(step12) <= smallStep * (1.0 + std::fabs(u1)) ||
+                          std::fabs(span) <= smallStep * (1.0 + std::fabs(u0));
+        const double safe = tiny ? 1.0 : step01 * step12 * span;
+        mean[i] = 2.0 * ((f2[i + 2] - f2[i + 1]) * step12 - (f2[i + 1] - f2[i]) * step01) / safe;
+        small[i] = tiny ? 1 : 0;
     }
 }
 

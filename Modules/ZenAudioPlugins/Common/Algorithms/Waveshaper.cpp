@@ -135,6 +135,8 @@ float Waveshaper::ShapeWith(History& h, float* samples, const float* pre, const 
                             std::uint64_t count) noexcept {
     // Driven inputs and their F2 a chunk at a time, behind the last two of the chunk before.
     std::array<double, kChunk + 2> u, f2;
+    std::array<double, kChunk> mean;
+    std::array<unsigned char, kChunk> small;
     u[0] = h.u2;
     u[1] = h.u1;
     // Only the inputs are kept between blocks, so a change of curve starts clean.
@@ -145,29 +147,30 @@ float Waveshaper::ShapeWith(History& h, float* samples, const float* pre, const 
         const std::size_t n = static_cast<std::size_t>(std::min<std::uint64_t>(kChunk, count - done));
         float* x = samples + done;
         m_integrals.Evaluate(m_shape, pre + done, x, u.data() + 2, f2.data() + 2, n);
-        StepMean d12 = MeanOverStep<C>(u[1], u[0], f2[1], f2[0]);
+        m_integrals.Mean(u.data(), f2.data(), kSmallStep, mean.data(), small.data(), n);
         for (std::size_t i = 0; i < n; ++i) {
-            const double u0 = u[i + 2], u1 = u[i + 1], u2 = u[i];
-            const StepMean d01 = MeanOverStep<C>(u0, u1, f2[i + 2], f2[i + 1]);
-            const double span = u0 - u2;
-            double mean;
-            if (std::fabs(span) > kSmallStep * (1.0 + std::fabs(u0))) {
-                // 2 (D(u0, u1) - D(u1, u2)) / (u0 - u2) over one common denominator.
-                mean = 2.0 * (d01.numerator * d12.denominator - d12.numerator * d01.denominator) /
-                       (d01.denominator * d12.denominator * span);
-            } else {
-                // The triangle folds onto the line from u1 to the ends' midpoint.
-                const double middle = 0.5 * (u0 + u2);
-                const double half = middle - u1;
-                mean = std::fabs(half) > kSmallStep * (1.0 + std::fabs(u1))
-                           ? 2.0 / half *
-                                 (Antiderivative(C, middle) + (f2[i + 1] - SecondAntiderivative(C, middle)) / half)
-                           : Apply(C, 0.5 * (middle + u1));
+            double m = mean[i];
+            if (small[i] != 0) {
+                const double u0 = u[i + 2], u1 = u[i + 1], u2 = u[i];
+                const StepMean d01 = MeanOverStep<C>(u0, u1, f2[i + 2], f2[i + 1]);
+                const StepMean d12 = MeanOverStep<C>(u1, u2, f2[i + 1], f2[i]);
+                const double span = u0 - u2;
+                if (std::fabs(span) > kSmallStep * (1.0 + std::fabs(u0))) {
+                    m = 2.0 * (d01.numerator * d12.denominator - d12.numerator * d01.denominator) /
+                        (d01.denominator * d12.denominator * span);
+                } else {
+                    // The triangle folds onto the line from u1 to the ends' midpoint.
+                    const double middle = 0.5 * (u0 + u2);
+                    const double half = middle - u1;
+                    m = std::fabs(half) > kSmallStep * (1.0 + std::fabs(u1))
+                            ? 2.0 / half *
+                                  (Antiderivative(C, middle) + (f2[i + 1] - SecondAntiderivative(C, middle)) / half)
+                            : Apply(C, 0.5 * (middle + u1));
+                }
             }
             // The mean of the curve lies within its range; rounding of huge inputs may not.
-            x[i] = static_cast<float>(post[done + i] * std::clamp(mean, -1.0, 1.0));
-            peak = std::max(peak, std::fabs(u0));
-            d12 = d01;
+            x[i] = static_cast<float>(post[done + i] * std::clamp(m, -1.0, 1.0));
+            peak = std::max(peak, std::fabs(u[i + 2]));
         }
         u[0] = u[n];
         u[1] = u[n + 1];

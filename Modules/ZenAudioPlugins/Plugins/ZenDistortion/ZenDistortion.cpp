@@ -67,7 +67,7 @@ const zen::MeterTableDefinition& ZenDistortion::Meters() {
 
 std::uint32_t ZenDistortion::GetTailLength() const {
     const double dcDecay = kTailNepers / (kTwoPi * kDcBlockHz) * GetSampleRate();
-    return static_cast<std::uint32_t>(Oversampler::TapsPerPhase() + std::ceil(dcDecay));
+    return static_cast<std::uint32_t>(m_oversampler.GetLatency() + 1 + std::ceil(dcDecay));
 }
 
 bool ZenDistortion::ApplyNeutralSetting() {

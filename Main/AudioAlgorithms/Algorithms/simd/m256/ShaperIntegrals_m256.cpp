@@ -19,6 +19,14 @@ struct WideLanes {
         return __builtin_convertvector(f, v4df);
     }
     static void Store(double* p, D v) { std::memcpy(p, &v, sizeof v); }
+    static D LoadDouble(const double* p) {
+        D v;
+        std::memcpy(&v, p, sizeof v);
+        return v;
+    }
+    static void StoreFlags(unsigned char* p, U mask) {
+        for (int k = 0; k < 4; ++k) p[k] = mask[k] != 0 ? 1 : 0;
+    }
     static U Bits(D v) { return (U)v; }
     static D FromBits(U b) { return (D)b; }
     static D Sqrt(D v) { return __builtin_ia32_sqrtpd256(v); }
@@ -33,6 +41,11 @@ struct WideLanes {
 void ShaperIntegrals_m256(const ShaperShape& shape, const float* pre, const float* in, double* u, double* f2,
                           std::size_t n) {
     ShaperIntegralBlock<WideLanes>(shape, pre, in, u, f2, n);
+}
+
+void ShaperMean_m256(const double* u, const double* f2, double smallStep, double* mean, unsigned char* small,
+                     std::size_t n) {
+    ShaperMeanBlock<WideLanes>(u, f2, smallStep, mean, small, n);
 }
 
 }  // namespace ora::numeric::simd
