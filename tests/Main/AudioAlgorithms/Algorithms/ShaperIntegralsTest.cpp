@@ -1,5 +1,6 @@
 // ShaperIntegrals: each curve's second antiderivative against the library's
-// functions in long double, and every form against the reference bit for bit.
+// functions in long double, and every form against the reference bit for bit
+// (the antiderivatives, the means and which steps are too small).
 #include <gtest/gtest.h>
 
 #include <cmath>
@@ -63,6 +64,20 @@ TEST(ShaperIntegrals, EveryFormAgreesWithTheReferenceBitForBit) {
             if (!kerneltest::Runnable(form)) continue;
             ora::system::ScopedDispatch forced(form.level, form.fma);
             ShaperIntegrals kernel;
+            // The mean over the reference's values: the same flags, and the same means where unflagged.
+            std::vector<double> mean(total - 2), refMean(total - 2);
+            std::vector<unsigned char> small(total - 2), refSmall(total - 2);
+            kernel.Mean(refU.data(), refF2.data(), 1e-3, mean.data(), small.data(), total - 2);
+            {
+                ora::system::ScopedDispatch plain(ora::system::InstructionLevel::None, false);
+                ShaperIntegrals().Mean(refU.data(), refF2.data(), 1e-3, refMean.data(), refSmall.data(), total - 2);
+            }
+            for (std::size_t i = 0; i + 2 < total; ++i) {
+                ASSERT_EQ(small[i], refSmall[i]) << i;
+                if (small[i] == 0) {
+                    ASSERT_EQ(mean[i], refMean[i]) << i;
+                }
+            }
             std::size_t done = 0;
             for (std::size_t length : kerneltest::AwkwardLengths()) {
                 std::vector<double> u(length), f2(length);
