@@ -1,6 +1,6 @@
 #include "Support/Realtime.h"
 
-// Stereo at the defaults ("Tube", 12 dB of drive), four times oversampled.
+// Stereo at the defaults ("Tube", 12 dB of drive), eight times oversampled.
 static void BM_Distortion_Stereo48k(benchmark::State& state) { zenbench::RunPlugin(state, "Distortion", 2); }
 BENCHMARK(BM_Distortion_Stereo48k);
 

@@ -45,27 +45,35 @@ TEST(Waveshaper, EachCurvesLaw) {
             if (curve != W::kTube) {
                 EXPECT_NEAR(W::Apply(curve, -u), -W::Apply(curve, u), 1e-12) << curve;
             }
-            // The antiderivative's slope is the curve.
+            // Each antiderivative's slope is the one below it.
             const double slope = (W::Antiderivative(curve, u + 1e-5) - W::Antiderivative(curve, u - 1e-5)) / 2e-5;
             EXPECT_NEAR(slope, W::Apply(curve, u), 1e-5) << curve << " at " << u;
+            const double slope2 =
+                (W::SecondAntiderivative(curve, u + 1e-5) - W::SecondAntiderivative(curve, u - 1e-5)) / 2e-5;
+            EXPECT_NEAR(slope2, W::Antiderivative(curve, u), 1e-5) << curve << " at " << u;
         }
     }
 }
 
-TEST(Waveshaper, OutputIsTheCurvesMeanOverEachStepWithinTheCeiling) {
+TEST(Waveshaper, OutputIsTheCurvesTriangleWeightedMeanWithinTheCeiling) {
     for (auto curve : kCurves) {
         // A held input gives the curve itself, scaled into the ceiling.
         const std::vector<float> held = Shaped(curve, std::vector<float>(8, 0.3f), 4.0f, 0.5f);
         EXPECT_NEAR(held.back(), 0.5 * Waveshaper::Apply(curve, 1.2), 1e-6) << curve;
-        // A ramp across the corners: the mean of the curve along each step.
-        std::vector<float> ramp(200);
-        for (std::size_t n = 0; n < ramp.size(); ++n) ramp[n] = 0.05f * static_cast<float>(n) - 5.0f;
+        // A ramp across the corners (and longer than a chunk): the mean of
+        // the curve over the two steps around the previous input, weighted
+        // by a triangle that peaks there.
+        std::vector<float> ramp(600);
+        for (std::size_t n = 0; n < ramp.size(); ++n) ramp[n] = 0.02f * static_cast<float>(n) - 6.0f;
         const std::vector<float> y = Shaped(curve, ramp, 1.0f, 1.0f);
-        for (std::size_t n = 1; n < ramp.size(); ++n) {
+        for (std::size_t n = 2; n < ramp.size(); ++n) {
             double mean = 0.0;
-            for (int k = 0; k < 1000; ++k)
-                mean += Waveshaper::Apply(curve, ramp[n - 1] + (ramp[n] - ramp[n - 1]) * (k + 0.5) / 1000.0);
-            EXPECT_NEAR(y[n], mean / 1000.0, 1e-5) << curve << " at " << ramp[n];
+            const double centre = ramp[n - 1], step = 0.5 * (ramp[n] - ramp[n - 2]);
+            for (int k = 0; k < 2000; ++k) {
+                const double t = (k + 0.5) / 1000.0 - 1.0;
+                mean += (1.0 - std::fabs(t)) * Waveshaper::Apply(curve, centre + step * t);
+            }
+            ASSERT_NEAR(y[n], mean / 1000.0, 1e-5) << curve << " at " << ramp[n];
         }
         // Huge inputs stay finite and within the ceiling.
         const std::vector<float> wild = Shaped(curve, {1e6f, -1e6f, 3e5f, 1e6f, 1e6f}, 1000.0f, 0.25f);

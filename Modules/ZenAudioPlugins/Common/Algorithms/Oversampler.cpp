@@ -14,35 +14,45 @@ double KaiserLength(double attenuationDb, double df) { return (attenuationDb - 7
 
 }  // namespace
 
-Oversampler::Oversampler(std::size_t factor, bool stageHalfSample)
-    : m_factor(factor), m_stageHalfSample(stageHalfSample), m_tapsPerPhase(TapsPerPhase()) {
+Oversampler::Oversampler(std::size_t factor, std::size_t stageHalfSamples)
+    : m_factor(factor),
+      m_stageHalfSamples(stageHalfSamples),
+      m_downTaps(TapsPerPhase(kStopbandEdge)),
+      m_upTaps(TapsPerPhase(kImageStopbandEdge) + (TapsPerPhase(kImageStopbandEdge) + m_downTaps) % 2) {
     if (factor != 2 && factor != 4 && factor != 8) throw std::invalid_argument("Oversampler: factor 2, 4 or 8");
+    if (stageHalfSamples > 2) throw std::invalid_argument("Oversampler: a stage delay of 0, 1 or 2 half samples");
 }
 
 Oversampler::~Oversampler() = default;
 
-std::size_t Oversampler::TapsPerPhase() {
+std::size_t Oversampler::TapsPerPhase(double stopEdge) {
     // The transition band scales with the factor, so the taps per phase do not.
-    return static_cast<std::size_t>(std::ceil(KaiserLength(kStopbandDb, kStopbandEdge - kPassbandEdge)));
+    return static_cast<std::size_t>(std::ceil(KaiserLength(kStopbandDb, stopEdge - kPassbandEdge)));
 }
 
-std::vector<float> Oversampler::Prototype(std::size_t factor, std::size_t taps) {
-    const double cutoff = 0.5 * (kPassbandEdge + kStopbandEdge) / static_cast<double>(factor);
+std::uint32_t Oversampler::GetLatency() const {
+    // (Nu - 1) / 2 + (Nd - 1) / 2 + stage - (factor - 1) high-rate samples,
+    // the last for the decimator keeping the last sample of each group.
+    return static_cast<std::uint32_t>((m_upTaps + m_downTaps - 2) / 2);
+}
+
+std::vector<float> Oversampler::Prototype(std::size_t factor, std::size_t taps, double stopEdge) {
+    const double cutoff = 0.5 * (kPassbandEdge + stopEdge) / static_cast<double>(factor);
     return ora::numeric::KaiserLowPass(taps, cutoff, KaiserBeta(kStopbandDb));
 }
 
 bool Oversampler::Prepare(float sampleRate, std::uint32_t maxBlock) {
     const std::size_t block = maxBlock > 0 ? maxBlock : 1;
-    const std::size_t taps = m_factor * m_tapsPerPhase;
     // Delays (Nu - 1) / 2 + (Nd - 1) / 2 plus the stage's must leave the
-    // decimator's phase on a whole base-rate sample: Nu + Nd + 2 x stage = 2 taps.
-    const std::vector<float> up = Prototype(m_factor, m_stageHalfSample ? taps - 1 : taps);
-    const std::vector<float> down = Prototype(m_factor, taps);
+    // decimator's phase on a whole base-rate sample: Nu + Nd + 2 x stage a
+    // multiple of 2 x factor.
+    const std::vector<float> up = Prototype(m_factor, m_factor * m_upTaps - m_stageHalfSamples, kImageStopbandEdge);
+    const std::vector<float> down = Prototype(m_factor, m_factor * m_downTaps, kStopbandEdge);
     for (Channel& channel : m_channels) {
         channel.up = std::make_unique<ora::numeric::Upsampler>(
-            ora::numeric::UpsamplerConfig{m_factor, m_tapsPerPhase, up, 1, block});
+            ora::numeric::UpsamplerConfig{m_factor, m_upTaps, up, 1, block});
         channel.down = std::make_unique<ora::numeric::Downsampler>(
-            ora::numeric::DownsamplerConfig{m_factor, m_tapsPerPhase, down, 1, block * m_factor});
+            ora::numeric::DownsamplerConfig{m_factor, m_downTaps, down, 1, block * m_factor});
         channel.high.Resize(block * m_factor);
     }
     return ZenAudioAlgorithm::Prepare(sampleRate, maxBlock);

@@ -4,12 +4,15 @@
 // a block into the channel's high-rate buffer, the owner processes that
 // buffer in place, Down() decimates it back.
 //
-// Both directions use one linear-phase Kaiser low-pass, flat (within
-// 0.001 dB) up to kPassbandEdge of the base rate and kStopbandDb down from
-// the base Nyquist frequency on, so that nothing the stage makes above the
-// host's band folds back louder than that. The round trip delays by a whole
+// Both directions use linear-phase Kaiser low-passes, flat (within
+// 0.001 dB) up to kPassbandEdge of the base rate and kStopbandDb down: the
+// decimator from the base Nyquist frequency on, so that nothing the stage
+// makes above the host's band folds back louder than that; the interpolator
+// from kImageStopbandEdge on, where the images of the pass band begin (what
+// the input holds between the pass band and Nyquist frequency is imaged
+// less), which halves its length. The round trip delays by a whole
 // number of base-rate samples, GetLatency(), counting the stage's own delay
-// when it is half a high-rate sample (a first-order antiderivative shaper).
+// of a half or a whole high-rate sample (an antiderivative shaper).
 #pragma once
 
 #include <cstdint>
@@ -28,11 +31,12 @@ public:
     static constexpr std::size_t kDefaultFactor = 4;
     static constexpr double kPassbandEdge = 0.42;  // of the base rate: 20.2 kHz at 48 kHz
     static constexpr double kStopbandEdge = 0.5;   // of the base rate
+    static constexpr double kImageStopbandEdge = 1.0 - kPassbandEdge;
     static constexpr double kStopbandDb = 90.0;
 
-    // `factor` 2, 4 or 8; `stageHalfSample`: the owner's stage delays by half
-    // a high-rate sample, and the round trip makes up the other half.
-    explicit Oversampler(std::size_t factor = kDefaultFactor, bool stageHalfSample = false);
+    // `factor` 2, 4 or 8; `stageHalfSamples` (0, 1 or 2): how far the owner's
+    // stage delays, in half high-rate samples; the filters make up the rest.
+    explicit Oversampler(std::size_t factor = kDefaultFactor, std::size_t stageHalfSamples = 0);
     ~Oversampler() override;
 
     // Builds the filters for the channel count and maxBlock base-rate frames.
@@ -40,7 +44,7 @@ public:
     void SetChannelCount(std::uint64_t channels) override;
     void Reset() override;
     // The round trip alone: the input low-passed and delayed by GetLatency()
-    // (half a high-rate sample less when the stage's half sample is counted).
+    // (less the stage's delay).
     bool Process(float* const* channels, std::uint64_t count) override;
 
     // `frames` base-rate samples (at most the prepared block) into the
@@ -52,15 +56,14 @@ public:
 
     std::size_t GetFactor() const { return m_factor; }
     // Round-trip delay in base-rate samples, the stage's included.
-    std::uint32_t GetLatency() const { return static_cast<std::uint32_t>(m_tapsPerPhase - 1); }
-    std::size_t GetTapsPerPhase() const { return m_tapsPerPhase; }
+    std::uint32_t GetLatency() const;
 
-    // The low-pass at the high rate (unit DC gain): the decimator's, of
-    // factor x taps-per-phase coefficients; the interpolator's is one shorter
-    // when the stage delays by half a sample.
-    static std::vector<float> Prototype(std::size_t factor, std::size_t taps);
-    // Taps per phase the Kaiser design needs for the band edges and the stop band.
-    static std::size_t TapsPerPhase();
+    // A low-pass at the high rate (unit DC gain) from the pass band to
+    // `stopEdge` of the base rate: the decimator's, of factor x its taps per
+    // phase coefficients; the interpolator's is shorter by the stage's half samples.
+    static std::vector<float> Prototype(std::size_t factor, std::size_t taps, double stopEdge);
+    // Taps per phase the Kaiser design needs from the pass band to `stopEdge`.
+    static std::size_t TapsPerPhase(double stopEdge);
 
 private:
     struct Channel {
@@ -70,7 +73,8 @@ private:
     };
 
     const std::size_t m_factor;
-    const bool m_stageHalfSample;
-    const std::size_t m_tapsPerPhase;
+    const std::size_t m_stageHalfSamples;
+    const std::size_t m_downTaps;  // per phase
+    const std::size_t m_upTaps;    // per phase, so that the two sum to an even number
     std::vector<Channel> m_channels;
 };

@@ -7,8 +7,10 @@
 
 namespace {
 
-// Below this step between driven inputs the mean is the curve at the midpoint.
-constexpr double kSmallStep = 1e-7;
+// Below this step between driven inputs (relative to their size) the
+// differences of the second antiderivative lose too many digits to divide,
+// and the curve at the midpoint is as close.
+constexpr double kSmallStep = 1e-5;
 
 double Sigmoid(double v) { return v / std::sqrt(1.0 + v * v); }
 
@@ -78,52 +80,121 @@ double Waveshaper::Antiderivative(Curve curve, double u) noexcept {
 
 bool Waveshaper::SetParameter(std::uint64_t index, float value) {
     if (!ZenAudioAlgorithm::SetParameter(index, value)) return false;
-    if (index == kCurve) m_curve = static_cast<Curve>(std::clamp(static_cast<int>(std::lround(value)), 0, 3));
+    if (index == kCurve) {
+        m_curve = static_cast<Curve>(std::clamp(static_cast<int>(std::lround(value)), 0, 3));
+        m_shape = IntegralShape(m_curve);
+    }
     return true;
 }
 
 void Waveshaper::SetChannelCount(std::uint64_t channels) {
     ZenAudioAlgorithm::SetChannelCount(channels);
-    m_last.resize(channels, 0.0);
+    m_history.resize(channels, History{});
 }
 
-void Waveshaper::Reset() { std::fill(m_last.begin(), m_last.end(), 0.0); }
+void Waveshaper::Reset() { std::fill(m_history.begin(), m_history.end(), History{}); }
+
+ora::numeric::ShaperShape Waveshaper::IntegralShape(Curve curve) {
+    using ora::numeric::ShaperCurve;
+    switch (curve) {
+        case kTape: return {ShaperCurve::Tape};
+        case kTube: {
+            const Tube& t = TubeConstants();
+            return {ShaperCurve::Tube, t.k, kTubeBias, t.gBias, t.scale};
+        }
+        case kHard: return {ShaperCurve::Hard};
+        case kFoldBack: return {ShaperCurve::FoldBack};
+    }
+    return {};
+}
+
+double Waveshaper::SecondAntiderivative(Curve curve, double u) noexcept {
+    return ora::numeric::ShaperIntegrals::Evaluate(IntegralShape(curve), u);
+}
+
+namespace {
+
+// The curve's first antiderivative averaged over the step from b to a,
+// (F2(a) - F2(b)) / (a - b), kept as a fraction so that the output costs one
+// division; taken at the midpoint when the step is too small to divide by.
+struct StepMean {
+    double numerator, denominator;
+};
 
 template <Waveshaper::Curve C>
-float Waveshaper::ShapeWith(double& last, float* samples, const float* pre, const float* post,
+inline StepMean MeanOverStep(double a, double b, double f2a, double f2b) noexcept {
+    const double step = a - b;
+    if (std::fabs(step) > kSmallStep * (1.0 + std::fabs(a))) return {f2a - f2b, step};
+    return {Waveshaper::Antiderivative(C, 0.5 * (a + b)), 1.0};
+}
+
+}  // namespace
+
+template <Waveshaper::Curve C>
+float Waveshaper::ShapeWith(History& h, float* samples, const float* pre, const float* post,
                             std::uint64_t count) noexcept {
-    double u0 = last;
-    double f0 = Antiderivative(C, u0);
+    // Driven inputs and their F2 a chunk at a time, behind the last two of the chunk before.
+    std::array<double, kChunk + 2> u, f2;
+    std::array<double, kChunk> mean;
+    std::array<unsigned char, kChunk> small;
+    u[0] = h.u2;
+    u[1] = h.u1;
+    // Only the inputs are kept between blocks, so a change of curve starts clean.
+    f2[0] = SecondAntiderivative(C, u[0]);
+    f2[1] = SecondAntiderivative(C, u[1]);
     double peak = 0.0;
-    for (std::uint64_t i = 0; i < count; ++i) {
-        const double u1 = static_cast<double>(pre[i]) * samples[i];
-        const double f1 = Antiderivative(C, u1);
-        const double step = u1 - u0;
-        const double mean =
-            std::fabs(step) > kSmallStep * (1.0 + std::fabs(u1)) ? (f1 - f0) / step : Apply(C, 0.5 * (u0 + u1));
-        samples[i] = static_cast<float>(post[i] * mean);
-        peak = std::max(peak, std::fabs(u1));
-        u0 = u1;
-        f0 = f1;
+    for (std::uint64_t done = 0; done < count; done += kChunk) {
+        const std::size_t n = static_cast<std::size_t>(std::min<std::uint64_t>(kChunk, count - done));
+        float* x = samples + done;
+        m_integrals.Evaluate(m_shape, pre + done, x, u.data() + 2, f2.data() + 2, n);
+        m_integrals.Mean(u.data(), f2.data(), kSmallStep, mean.data(), small.data(), n);
+        for (std::size_t i = 0; i < n; ++i) {
+            double m = mean[i];
+            if (small[i] != 0) {
+                const double u0 = u[i + 2], u1 = u[i + 1], u2 = u[i];
+                const StepMean d01 = MeanOverStep<C>(u0, u1, f2[i + 2], f2[i + 1]);
+                const StepMean d12 = MeanOverStep<C>(u1, u2, f2[i + 1], f2[i]);
+                const double span = u0 - u2;
+                if (std::fabs(span) > kSmallStep * (1.0 + std::fabs(u0))) {
+                    m = 2.0 * (d01.numerator * d12.denominator - d12.numerator * d01.denominator) /
+                        (d01.denominator * d12.denominator * span);
+                } else {
+                    // The triangle folds onto the line from u1 to the ends' midpoint.
+                    const double middle = 0.5 * (u0 + u2);
+                    const double half = middle - u1;
+                    m = std::fabs(half) > kSmallStep * (1.0 + std::fabs(u1))
+                            ? 2.0 / half *
+                                  (Antiderivative(C, middle) + (f2[i + 1] - SecondAntiderivative(C, middle)) / half)
+                            : Apply(C, 0.5 * (middle + u1));
+                }
+            }
+            // The mean of the curve lies within its range; rounding of huge inputs may not.
+            x[i] = static_cast<float>(post[done + i] * std::clamp(m, -1.0, 1.0));
+            peak = std::max(peak, std::fabs(u[i + 2]));
+        }
+        u[0] = u[n];
+        u[1] = u[n + 1];
+        f2[0] = f2[n];
+        f2[1] = f2[n + 1];
     }
-    last = u0;
+    h = {u[1], u[0]};
     return static_cast<float>(peak);
 }
 
 float Waveshaper::Shape(std::uint64_t channel, float* samples, const float* pre, const float* post,
                         std::uint64_t count) noexcept {
-    double& last = m_last[channel];
+    History& h = m_history[channel];
     switch (m_curve) {
-        case kTape: return ShapeWith<kTape>(last, samples, pre, post, count);
-        case kTube: return ShapeWith<kTube>(last, samples, pre, post, count);
-        case kHard: return ShapeWith<kHard>(last, samples, pre, post, count);
-        case kFoldBack: return ShapeWith<kFoldBack>(last, samples, pre, post, count);
+        case kTape: return ShapeWith<kTape>(h, samples, pre, post, count);
+        case kTube: return ShapeWith<kTube>(h, samples, pre, post, count);
+        case kHard: return ShapeWith<kHard>(h, samples, pre, post, count);
+        case kFoldBack: return ShapeWith<kFoldBack>(h, samples, pre, post, count);
     }
     return 0.0f;
 }
 
 bool Waveshaper::ProcessChannel(std::uint64_t channel, float* samples, std::uint64_t count) {
-    if (channel >= m_last.size()) return false;
+    if (channel >= m_history.size()) return false;
     static const std::array<float, 64> kUnit = [] {
         std::array<float, 64> unit;
         unit.fill(1.0f);
@@ -135,6 +206,6 @@ bool Waveshaper::ProcessChannel(std::uint64_t channel, float* samples, std::uint
 }
 
 bool Waveshaper::Process(float* const* channels, std::uint64_t count) {
-    for (std::uint64_t c = 0; c < m_last.size(); ++c) ProcessChannel(c, channels[c], count);
+    for (std::uint64_t c = 0; c < m_history.size(); ++c) ProcessChannel(c, channels[c], count);
     return true;
 }

@@ -1,9 +1,12 @@
-// The saturation curves of a distortion, memoryless but for one sample:
-// each output is the curve's mean over the straight line from the previous
-// driven input to this one, (F(u1) - F(u0)) / (u1 - u0) with F the curve's
-// antiderivative. That mean is the curve low-passed by a one-sample box, so
-// the corners of the hard and fold-back curves alias far less; it delays by
-// half a sample. Run it oversampled (Oversampler with stageHalfSample).
+// The saturation curves of a distortion, memoryless but for two samples:
+// each output is the curve's mean along the straight lines through the last
+// three driven inputs, weighted by a triangle two steps wide. With F2 the
+// curve's second antiderivative and D(a, b) = (F2(a) - F2(b)) / (a - b),
+// y = 2 (D(u0, u1) - D(u1, u2)) / (u0 - u2). That mean is the curve
+// low-passed by a triangle (a box twice over), so what the curve makes
+// above the sampling rate folds back far weaker: it falls as the square of
+// the one-box form's. It delays by one sample. Run it oversampled
+// (Oversampler with a stage delay of two half samples).
 //
 // Curves, for a driven input u, full output at +-1:
 //   "Tape"      u / sqrt(1 + u^2): symmetric, gradual, odd harmonics;
@@ -24,6 +27,7 @@
 #include <vector>
 
 #include "../ZenAudioAlgorithm.h"
+#include "Algorithms/ShaperIntegrals.h"
 
 class Waveshaper : public ZenAudioAlgorithm {
     Q_OBJECT
@@ -51,15 +55,28 @@ public:
                 std::uint64_t count) noexcept;
 
     Curve GetCurve() const { return m_curve; }
-    // The curve and its antiderivative (F(0) = 0 up to a constant).
+    // The curve, its antiderivative and its second antiderivative (each up to a constant).
     static double Apply(Curve curve, double u) noexcept;
     static double Antiderivative(Curve curve, double u) noexcept;
+    static double SecondAntiderivative(Curve curve, double u) noexcept;
+    static ora::numeric::ShaperShape IntegralShape(Curve curve);
     static double TubeUpperLimit();
 
+    // How far the output lags the input, in half samples.
+    static constexpr std::size_t kDelayHalfSamples = 2;
+
 private:
+    static constexpr std::size_t kChunk = 256;  // high-rate samples evaluated at once
+
+    struct History {
+        double u1 = 0.0, u2 = 0.0;  // the last two driven inputs
+    };
+
     template <Curve C>
-    float ShapeWith(double& last, float* samples, const float* pre, const float* post, std::uint64_t count) noexcept;
+    float ShapeWith(History& h, float* samples, const float* pre, const float* post, std::uint64_t count) noexcept;
 
     Curve m_curve = kTube;
-    std::vector<double> m_last;  // per channel, the previous driven input
+    ora::numeric::ShaperShape m_shape = IntegralShape(kTube);
+    ora::numeric::ShaperIntegrals m_integrals;
+    std::vector<History> m_history;  // per channel
 };

@@ -46,7 +46,8 @@ public:
     static constexpr float kLargestInput = 1e3f;
     // Engine-rate frames of the resampled objects.
     static constexpr std::uint32_t kEngineFrame = 1024;
-    static constexpr std::uint32_t kConverterTapsPerPhase = 32;
+    // Enough for the converters to pass 20 kHz at a 44.1 kHz engine rate.
+    static constexpr std::uint32_t kConverterTapsPerPhase = 48;
 
     zn_reverb_u15();
     ~zn_reverb_u15() override;

@@ -18,7 +18,7 @@ constexpr double kTailNepers = 11.5;
 
 }  // namespace
 
-ZenDistortion::ZenDistortion() : m_oversampler(kOversampling, true) {
+ZenDistortion::ZenDistortion() : m_oversampler(kOversampling, Waveshaper::kDelayHalfSamples) {
     InitParameters(Definitions());
     InitMeters(Meters());
 }
@@ -70,7 +70,7 @@ const zen::MeterTableDefinition& ZenDistortion::Meters() {
 
 std::uint32_t ZenDistortion::GetTailLength() const {
     const double dcDecay = kTailNepers / (kTwoPi * kDcBlockHz) * GetSampleRate();
-    return static_cast<std::uint32_t>(Oversampler::TapsPerPhase() + std::ceil(dcDecay));
+    return static_cast<std::uint32_t>(m_oversampler.GetLatency() + 1 + std::ceil(dcDecay));
 }
 
 bool ZenDistortion::ApplyNeutralSetting() {

@@ -1,8 +1,9 @@
 // "Distortion": drives the signal into a saturation curve ("Tape", "Tube",
 // "Hard", "Fold-back") whose output never exceeds "Ceiling", then a tilt
-// "Tone", a dry/wet "Mix" and an "Output Level". The curve runs at four
-// times the host's rate, so aliasing stays far below the harmonics; the dry
-// signal is delayed to match the reported latency.
+// "Tone", a dry/wet "Mix" and an "Output Level". The curve runs at eight
+// times the host's rate, low-passed by its second antiderivative, so that
+// even at full drive aliasing stays far below the harmonics; the dry signal
+// is delayed to match the reported latency.
 //
 // "Ceiling" spans 24 dB below full scale and "Output Level" 24 dB either
 // side of 0 dB: lowering the ceiling by a share of its range and raising
@@ -28,7 +29,7 @@ public:
     // channel's input and output peak.
     enum Meter : std::uint32_t { kSaturation, kInputPeak, kOutputPeak };
 
-    static constexpr std::size_t kOversampling = 4;
+    static constexpr std::size_t kOversampling = 8;
     static constexpr float kCeilingRangeDb = 24.0f;
     // The tilt turns about this frequency; the wet path's DC blocker sits at kDcBlockHz.
     static constexpr double kTonePivotHz = 1000.0;

@@ -1,0 +1,193 @@
+// The ShaperIntegrals arithmetic on one lane type L (PlainLanes: a double;
+// the 256-bit form's four doubles), written once so that both forms take
+// the same steps. L gives D (the values), U (their bits as unsigned
+// integers), Dup, Bits, FromBits, Sqrt and Mask (a comparison as all-ones
+// or zero bits).
+#pragma once
+
+#include <cstdint>
+#include <cstring>
+#include <cmath>
+
+#include "Algorithms/ShaperIntegrals.h"
+
+namespace ora::numeric::simd {
+
+constexpr std::uint64_t kShaperSignBit = 0x8000000000000000ull;
+constexpr std::uint64_t kShaperMantissa = 0x000FFFFFFFFFFFFFull;
+constexpr std::uint64_t kShaperSqrtHalfBits = 0x3FE6A09E667F3BCDull;  // sqrt(1/2)
+constexpr std::uint64_t kShaperOneBits = 0x3FF0000000000000ull;
+constexpr std::uint64_t kShaperTwoTo52Bits = 0x4330000000000000ull;
+constexpr double kShaperTwoTo52 = 4503599627370496.0;
+constexpr double kShaperLn2Hi = 6.93147180369123816490e-01;
+constexpr double kShaperLn2Lo = 1.90821492927058770002e-10;
+// pi in three parts, the first two short enough that n times them is exact.
+constexpr double kShaperPiA = 3.14159250259399414062;
+constexpr double kShaperPiB = 1.50995788317231926667e-7;
+constexpr double kShaperPiC = 1.07806057163162381058e-14;
+constexpr double kShaperInversePi = 0.31830988618379067154;
+constexpr double kShaperRoundingShift = 6755399441055744.0;  // 1.5 x 2^52: adding it rounds to a whole number
+
+struct PlainLanes {
+    using D = double;
+    using U = std::uint64_t;
+    static constexpr std::size_t kWidth = 1;
+    static D Dup(double v) { return v; }
+    static D Load(const float* p) { return static_cast<double>(*p); }
+    static D LoadDouble(const double* p) { return *p; }
+    static void StoreFlags(unsigned char* p, U mask) { *p = mask != 0 ? 1 : 0; }
+    static void Store(double* p, D v) { *p = v; }
+    static U Bits(D v) {
+        U b;
+        std::memcpy(&b, &v, sizeof b);
+        return b;
+    }
+    static D FromBits(U b) {
+        D v;
+        std::memcpy(&v, &b, sizeof v);
+        return v;
+    }
+    static D Sqrt(D v) { return std::sqrt(v); }
+    static U Mask(bool condition) { return condition ? ~U{0} : U{0}; }
+};
+
+template <class L>
+inline typename L::D ShaperBlend(typename L::U mask, typename L::D yes, typename L::D no) {
+    return L::FromBits((mask & L::Bits(yes)) | (~mask & L::Bits(no)));
+}
+
+// sin u for |u| below about 1e6: u less the nearest multiple of pi, then
+// the Taylor series to the 19th power (the next term is below 3e-16).
+template <class L>
+inline typename L::D ShaperSine(typename L::D u) {
+    using D = typename L::D;
+    const D shifted = u * L::Dup(kShaperInversePi) + L::Dup(kShaperRoundingShift);
+    const D n = shifted - L::Dup(kShaperRoundingShift);
+    const D r = ((u - n * L::Dup(kShaperPiA)) - n * L::Dup(kShaperPiB)) - n * L::Dup(kShaperPiC);
+    const D r2 = r * r;
+    D p = L::Dup(-1.0 / 121645100408832000.0);
+    p = p * r2 + L::Dup(1.0 / 355687428096000.0);
+    p = p * r2 + L::Dup(-1.0 / 1307674368000.0);
+    p = p * r2 + L::Dup(1.0 / 6227020800.0);
+    p = p * r2 + L::Dup(-1.0 / 39916800.0);
+    p = p * r2 + L::Dup(1.0 / 362880.0);
+    p = p * r2 + L::Dup(-1.0 / 5040.0);
+    p = p * r2 + L::Dup(1.0 / 120.0);
+    p = p * r2 + L::Dup(-1.0 / 6.0);
+    const D s = r + r * r2 * p;
+    // An odd multiple of pi turns the sign: its parity is the shifted value's lowest bit.
+    return L::FromBits(L::Bits(s) ^ (L::Bits(shifted) << 63));
+}
+
+// ln a for finite a >= 1: a = 2^k m with sqrt(1/2) <= m < sqrt(2), and
+// ln m = 2 atanh(s), s = (m - 1) / (m + 1), |s| <= 0.172, to s^21.
+template <class L>
+inline typename L::D ShaperLog(typename L::D a) {
+    using D = typename L::D;
+    using U = typename L::U;
+    const U shifted = L::Bits(a) + (kShaperOneBits - kShaperSqrtHalfBits);
+    const U biased = shifted >> 52;  // k + 1023
+    const D m = L::FromBits((shifted & kShaperMantissa) + kShaperSqrtHalfBits);
+    const D k = (L::FromBits(biased | kShaperTwoTo52Bits) - L::Dup(kShaperTwoTo52)) - L::Dup(1023.0);
+    const D s = (m - L::Dup(1.0)) / (m + L::Dup(1.0));
+    const D z = s * s;
+    D p = L::Dup(1.0 / 21.0);
+    p = p * z + L::Dup(1.0 / 19.0);
+    p = p * z + L::Dup(1.0 / 17.0);
+    p = p * z + L::Dup(1.0 / 15.0);
+    p = p * z + L::Dup(1.0 / 13.0);
+    p = p * z + L::Dup(1.0 / 11.0);
+    p = p * z + L::Dup(1.0 / 9.0);
+    p = p * z + L::Dup(1.0 / 7.0);
+    p = p * z + L::Dup(1.0 / 5.0);
+    p = p * z + L::Dup(1.0 / 3.0);
+    const D logM = L::Dup(2.0) * s + L::Dup(2.0) * s * z * p;
+    return k * L::Dup(kShaperLn2Hi) + (k * L::Dup(kShaperLn2Lo) + logM);
+}
+
+// R(v) = (v sqrt(1 + v^2) + asinh v) / 2, asinh from the root at hand.
+template <class L>
+inline typename L::D ShaperRootIntegral(typename L::D v) {
+    using D = typename L::D;
+    const D r = L::Sqrt(L::Dup(1.0) + v * v);
+    const D magnitude = L::FromBits(L::Bits(v) & ~kShaperSignBit);
+    const D asinh = L::FromBits(L::Bits(ShaperLog<L>(magnitude + r)) | (L::Bits(v) & kShaperSignBit));
+    return L::Dup(0.5) * (v * r + asinh);
+}
+
+template <class L>
+inline typename L::D ShaperSecondIntegral(const ShaperShape& shape, typename L::D u) {
+    using D = typename L::D;
+    switch (shape.curve) {
+        case ShaperCurve::Tape: return ShaperRootIntegral<L>(u);
+        case ShaperCurve::Tube: {
+            const D v = L::Dup(shape.k) * u + L::Dup(shape.bias);
+            return (ShaperRootIntegral<L>(v) * L::Dup(1.0 / (shape.k * shape.k)) -
+                    L::Dup(0.5 * shape.biasLevel) * u * u) *
+                   L::Dup(shape.scale);
+        }
+        case ShaperCurve::Hard: {
+            const D m = L::FromBits(L::Bits(u) & ~kShaperSignBit);
+            const D inside = u * u * u * L::Dup(1.0 / 6.0);
+            const D outsideMagnitude = L::Dup(0.5) * m * m - L::Dup(0.5) * m + L::Dup(1.0 / 6.0);
+            const D outside = L::FromBits(L::Bits(outsideMagnitude) | (L::Bits(u) & kShaperSignBit));
+            return ShaperBlend<L>(L::Mask(m <= L::Dup(1.0)), inside, outside);
+        }
+        case ShaperCurve::FoldBack: return u - ShaperSine<L>(u);
+    }
+    return u;
+}
+
+// The kernel on lanes L, the rest one by one.
+template <class L>
+inline void ShaperIntegralBlock(const ShaperShape& shape, const float* pre, const float* in, double* u, double* f2,
+                                std::size_t n) {
+    std::size_t i = 0;
+    for (; i + L::kWidth <= n; i += L::kWidth) {
+        const typename L::D driven = L::Load(pre + i) * L::Load(in + i);
+        L::Store(u + i, driven);
+        L::Store(f2 + i, ShaperSecondIntegral<L>(shape, driven));
+    }
+    for (; i < n; ++i) {
+        u[i] = static_cast<double>(pre[i]) * static_cast<double>(in[i]);
+        f2[i] = ShaperSecondIntegral<PlainLanes>(shape, u[i]);
+    }
+}
+
+template <class L>
+inline typename L::D ShaperAbs(typename L::D v) {
+    return L::FromBits(L::Bits(v) & ~kShaperSignBit);
+}
+
+// Lanes L of the mean, the rest one by one; each output in the same order of operations.
+template <class L>
+inline void ShaperMeanBlock(const double* u, const double* f2, double smallStep, double* mean, unsigned char* small,
+                            std::size_t n) {
+    std::size_t i = 0;
+    for (; i + L::kWidth <= n; i += L::kWidth) {
+        using D = typename L::D;
+        const D u0 = L::LoadDouble(u + i + 2), u1 = L::LoadDouble(u + i + 1), u2 = L::LoadDouble(u + i);
+        const D f0 = L::LoadDouble(f2 + i + 2), f1 = L::LoadDouble(f2 + i + 1), f2b = L::LoadDouble(f2 + i);
+        const D step01 = u0 - u1, step12 = u1 - u2, span = u0 - u2;
+        const D one = L::Dup(1.0), tolerance = L::Dup(smallStep);
+        const typename L::U tiny = L::Mask(ShaperAbs<L>(step01) <= tolerance * (one + ShaperAbs<L>(u0))) |
+                                   L::Mask(ShaperAbs<L>(step12) <= tolerance * (one + ShaperAbs<L>(u1))) |
+                                   L::Mask(ShaperAbs<L>(span) <= tolerance * (one + ShaperAbs<L>(u0)));
+        // Tiny lanes divide by 1 instead; their result is not used.
+        const D safe = ShaperBlend<L>(tiny, one, step01 * step12 * span);
+        L::Store(mean + i, L::Dup(2.0) * ((f0 - f1) * step12 - (f1 - f2b) * step01) / safe);
+        L::StoreFlags(small + i, tiny);
+    }
+    for (; i < n; ++i) {
+        const double u0 = u[i + 2], u1 = u[i + 1], u2 = u[i];
+        const double step01 = u0 - u1, step12 = u1 - u2, span = u0 - u2;
+        const bool tiny = std::fabs(step01) <= smallStep * (1.0 + std::fabs(u0)) ||
+                          std::fabs(step12) <= smallStep * (1.0 + std::fabs(u1)) ||
+                          std::fabs(span) <= smallStep * (1.0 + std::fabs(u0));
+        const double safe = tiny ? 1.0 : step01 * step12 * span;
+        mean[i] = 2.0 * ((f2[i + 2] - f2[i + 1]) * step12 - (f2[i + 1] - f2[i]) * step01) / safe;
+        small[i] = tiny ? 1 : 0;
+    }
+}
+
+}  // namespace ora::numeric::simd
