@@ -1,0 +1,85 @@
+#include "EditorHost.h"
+
+#include <QApplication>
+#include <QBuffer>
+#include <QImage>
+#include <QPixmap>
+#include <QTimer>
+#include <QWidget>
+#include <cstdlib>
+
+#include "HostCore/Settings/AtomicFile.h"
+#include "ZenfxError.h"
+
+namespace zenfx {
+
+namespace {
+
+// QApplication keeps a reference to argc and reads argv for its lifetime.
+int g_argc = 1;
+char g_name[] = "zenfx";
+char* g_argv[] = {g_name, nullptr};
+
+zen::PluginParameters* ParametersOf(zen::PluginInstance& instance) {
+    if (auto* audio = zen::InterfaceCast<AudioPlugin>(&instance)) return audio;
+    return zen::InterfaceCast<ControlPlugin>(&instance);
+}
+
+}  // namespace
+
+EditorHost::EditorHost(bool offscreen, int scale) {
+    if (scale != 1 && scale != 2) throw ZenfxError("--scale must be 1 or 2", kExitUsage);
+    if (offscreen) {
+        const char* platform = std::getenv("QT_QPA_PLATFORM");
+        if (platform == nullptr || *platform == '\0') setenv("QT_QPA_PLATFORM", "offscreen", 1);
+        // Scaling from the screen's density would make pictures differ by machine.
+        setenv("QT_SCALE_FACTOR", scale == 2 ? "2" : "1", 1);
+        unsetenv("QT_AUTO_SCREEN_SCALE_FACTOR");
+        unsetenv("QT_SCREEN_SCALE_FACTORS");
+    } else if (scale == 2) {
+        setenv("QT_SCALE_FACTOR", "2", 1);
+    }
+    m_application = std::make_unique<QApplication>(g_argc, g_argv);
+}
+
+EditorHost::~EditorHost() = default;
+
+std::unique_ptr<QWidget> EditorHost::CreateEditor(zen::PluginInstance& instance) {
+    zen::PluginParameters* parameters = ParametersOf(instance);
+    std::unique_ptr<QWidget> editor(parameters ? static_cast<QWidget*>(parameters->CreateEditor(nullptr)) : nullptr);
+    if (!editor) throw ZenfxError(std::string("'") + instance.GetName() + "' has no editor");
+    editor->setWindowTitle(QString::fromStdString(instance.GetName()));
+    return editor;
+}
+
+void EditorHost::Refresh(QWidget& editor, int count) {
+    if (!editor.isVisible()) editor.show();
+    QApplication::processEvents();
+    const QList<QTimer*> clocks = editor.findChildren<QTimer*>();
+    for (int i = 0; i < count; ++i) {
+        for (QTimer* clock : clocks) {
+            clock->stop();
+            QMetaObject::invokeMethod(clock, "timeout", Qt::DirectConnection);
+        }
+        QApplication::processEvents();
+    }
+    for (QTimer* clock : clocks) clock->stop();
+    editor.adjustSize();
+    QApplication::processEvents();
+}
+
+QSize EditorHost::WritePng(QWidget& editor, const std::string& path) {
+    const QImage image = editor.grab().toImage();
+    QByteArray png;
+    QBuffer buffer(&png);
+    buffer.open(QIODevice::WriteOnly);
+    if (image.isNull() || !image.save(&buffer, "PNG")) throw ZenfxError("cannot render the editor as PNG");
+    zen::host::AtomicFile file(path);
+    file.Write(std::string(png.constData(), static_cast<std::size_t>(png.size())));
+    file.Commit();
+    return image.size();
+}
+
+int EditorHost::Run() { return QApplication::exec(); }
+
+}  // namespace zenfx
