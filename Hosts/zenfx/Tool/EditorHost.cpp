@@ -36,8 +36,13 @@ EditorHost::EditorHost(bool offscreen, int scale) {
         setenv("QT_SCALE_FACTOR", scale == 2 ? "2" : "1", 1);
         unsetenv("QT_AUTO_SCREEN_SCALE_FACTOR");
         unsetenv("QT_SCREEN_SCALE_FACTORS");
-    } else if (scale == 2) {
-        setenv("QT_SCALE_FACTOR", "2", 1);
+    } else {
+        // Qt aborts the process when it finds no display; say so instead.
+        const char* platform = std::getenv("QT_QPA_PLATFORM");
+        const bool named = platform != nullptr && *platform != '\0';
+        if (!named && std::getenv("DISPLAY") == nullptr && std::getenv("WAYLAND_DISPLAY") == nullptr)
+            throw ZenfxError("no display to show the editor on (DISPLAY is not set); zenfx screenshot needs none");
+        if (scale == 2) setenv("QT_SCALE_FACTOR", "2", 1);
     }
     m_application = std::make_unique<QApplication>(g_argc, g_argv);
 }
