@@ -57,18 +57,22 @@ std::unique_ptr<QWidget> EditorHost::CreateEditor(zen::PluginInstance& instance)
     return editor;
 }
 
-void EditorHost::Refresh(QWidget& editor, int count) {
+void EditorHost::HoldClock(QWidget& editor) {
+    // Showing starts the clock; it is stopped before any event could run it.
     if (!editor.isVisible()) editor.show();
+    for (QTimer* clock : editor.findChildren<QTimer*>()) clock->stop();
     QApplication::processEvents();
-    const QList<QTimer*> clocks = editor.findChildren<QTimer*>();
-    for (int i = 0; i < count; ++i) {
-        for (QTimer* clock : clocks) {
-            clock->stop();
-            QMetaObject::invokeMethod(clock, "timeout", Qt::DirectConnection);
-        }
-        QApplication::processEvents();
+}
+
+void EditorHost::Refresh(QWidget& editor) {
+    for (QTimer* clock : editor.findChildren<QTimer*>()) {
+        clock->stop();
+        QMetaObject::invokeMethod(clock, "timeout", Qt::DirectConnection);
     }
-    for (QTimer* clock : clocks) clock->stop();
+}
+
+void EditorHost::Settle(QWidget& editor) {
+    QApplication::processEvents();
     editor.adjustSize();
     QApplication::processEvents();
 }

@@ -29,9 +29,14 @@ public:
     // ZenfxError when the plug-in builds none.
     static std::unique_ptr<QWidget> CreateEditor(zen::PluginInstance& instance);
 
-    // Runs the editor's refreshes `count` times, its clock stopped, so a
-    // picture depends on what was processed and not on when it was taken.
-    static void Refresh(QWidget& editor, int count);
+    // Shows the editor with its clock stopped: from then on it refreshes
+    // only on Refresh, so a picture depends on what was processed and not on
+    // when it was taken.
+    static void HoldClock(QWidget& editor);
+    // One refresh, as the editor's clock does it.
+    static void Refresh(QWidget& editor);
+    // Lays out and paints what the refreshes left, at the editor's preferred size.
+    static void Settle(QWidget& editor);
 
     // The editor as a PNG, replacing `path` atomically; the picture's size
     // in pixels. Throws ZenfxError or HostError.

@@ -19,9 +19,11 @@ namespace zenfx {
 namespace {
 
 constexpr std::uint32_t kBlock = 512;
-// Enough for every display to have drawn what the meters hold and for
-// histories to show more than one point.
-constexpr int kRefreshes = 4;
+// The editor refreshes as often per second of audio as its clock does per
+// second of a session, so histories and rings fill as they would live.
+constexpr int kRefreshRate = 30;
+// After the input, so displays that smooth or fall back settle on the last reading.
+constexpr int kFinalRefreshes = 4;
 
 std::string Seconds(double seconds) {
     std::ostringstream out;
@@ -43,6 +45,7 @@ int RunScreenshot(PluginLibrary& library, const ScreenshotOptions& options) {
     if (!options.preset.empty()) LoadPresetByName(*instance, options.preset);
 
     std::string processed;
+    std::unique_ptr<QWidget> editor;
     if (plugin.kind == zen::kAudioPluginKind) {
         std::unique_ptr<AudioSource> source;
         if (options.input.empty()) source = std::make_unique<DemoMaterial>();
@@ -57,19 +60,31 @@ int RunScreenshot(PluginLibrary& library, const ScreenshotOptions& options) {
         const std::vector<float> samples = ReadFrames(*source, static_cast<std::int64_t>(at * rate + 0.5));
         const auto channels = static_cast<std::uint32_t>(source->Channels());
         PluginFeed feed(*instance, channels, rate, kBlock);
+        editor = EditorHost::CreateEditor(*instance);
+        EditorHost::HoldClock(*editor);
         const std::size_t frames = samples.size() / channels;
-        for (std::size_t done = 0; done < frames; done += kBlock) {
-            const auto count = static_cast<std::uint32_t>(std::min<std::size_t>(kBlock, frames - done));
+        const std::size_t period = static_cast<std::size_t>(rate / kRefreshRate);
+        std::size_t nextRefresh = period;
+        for (std::size_t done = 0; done < frames;) {
+            const auto count = static_cast<std::uint32_t>(std::min<std::size_t>(
+                {std::size_t{kBlock}, frames - done, nextRefresh - done}));
             if (!feed.Process(samples.data() + done * channels, count))
                 throw ZenfxError("'" + plugin.entry.name + "' failed to process");
+            done += count;
+            if (done == nextRefresh) {
+                EditorHost::Refresh(*editor);
+                nextRefresh += period;
+            }
         }
         processed = " after " + Seconds(at) + " of " + source->Description();
-    } else if (!options.input.empty()) {
-        throw ZenfxError("'" + plugin.entry.name + "' is a control plug-in: it takes no audio", kExitUsage);
+    } else {
+        if (!options.input.empty())
+            throw ZenfxError("'" + plugin.entry.name + "' is a control plug-in: it takes no audio", kExitUsage);
+        editor = EditorHost::CreateEditor(*instance);
+        EditorHost::HoldClock(*editor);
     }
-
-    const std::unique_ptr<QWidget> editor = EditorHost::CreateEditor(*instance);
-    EditorHost::Refresh(*editor, kRefreshes);
+    for (int i = 0; i < kFinalRefreshes; ++i) EditorHost::Refresh(*editor);
+    EditorHost::Settle(*editor);
     const QSize size = EditorHost::WritePng(*editor, options.output);
     std::cout << "zenfx: wrote " << options.output << " (" << size.width() << "x" << size.height()
               << " px): the editor of '" << plugin.entry.name << "'" << processed << "\n";
