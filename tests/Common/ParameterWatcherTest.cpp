@@ -12,20 +12,12 @@
 #include "Common/ParameterWatcher.h"
 #include "Common/ZenAudioPluginImpl.h"
 #include "Support/PluginHarness.h"
+#include "Support/TestApplication.h"
 
+using zentest::EnsureApplication;
 using zentest::PluginHarness;
 
 namespace {
-
-// The watcher's timer needs an application's event loop.
-void EnsureApplication() {
-    static int argc = 1;
-    static char name[] = "ZenAudioPluginsTests";
-    static char* argv[] = {name, nullptr};
-    static QCoreApplication* application =
-        QCoreApplication::instance() != nullptr ? QCoreApplication::instance() : new QCoreApplication(argc, argv);
-    (void)application;
-}
 
 // What a watcher emitted, and on which thread.
 struct Recorder {

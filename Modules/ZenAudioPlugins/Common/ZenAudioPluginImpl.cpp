@@ -7,6 +7,8 @@
 
 #include "GlobalSmoothing.h"
 #include "OnePoleSmoother.h"
+#include "Editor/InstanceEditorLink.h"
+#include "Editor/ZenEditor.h"
 #include "StateText.h"
 #include "ScopedDenormalFlush.h"
 
@@ -124,7 +126,14 @@ bool ZenAudioPluginImpl::LoadPreset(const std::string& name) {
     return zen::StateText::ReadPreset(m_descriptor->className, name, text) && LoadState(text);
 }
 
-void* ZenAudioPluginImpl::CreateEditor(void*) { return nullptr; }
+void* ZenAudioPluginImpl::CreateEditor(void* parentWidget) {
+    return static_cast<QWidget*>(ZenEditor::Create(m_descriptor->className, QString::fromUtf8(GetName()), std::make_unique<InstanceEditorLink>(*this),
+                             static_cast<QWidget*>(parentWidget)));
+}
+
+void* ZenAudioPluginImpl::CreateEditorFor(zen::EditorLink& link, void* parentWidget) {
+    return static_cast<QWidget*>(ZenEditor::Create(m_descriptor->className, QString::fromUtf8(GetName()), link, static_cast<QWidget*>(parentWidget)));
+}
 
 bool ZenAudioPluginImpl::ApplyNeutralSetting() {
     for (std::uint32_t i = 0; i < m_parameters.GetCount(); ++i)

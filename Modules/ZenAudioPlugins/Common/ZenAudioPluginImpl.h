@@ -90,6 +90,7 @@ public:
     std::vector<std::string> GetPresetNames() const override;
     bool LoadPreset(const std::string& name) override;
     void* CreateEditor(void* parentWidget) override;
+    void* CreateEditorFor(zen::EditorLink& link, void* parentWidget) override;
 
     // AudioPlugin
     bool ConfigureChannels(std::uint32_t inputs, std::uint32_t outputs) override;

@@ -3,6 +3,8 @@
 #include <cmath>
 #include <cstring>
 
+#include "Editor/InstanceEditorLink.h"
+#include "Editor/ZenEditor.h"
 #include "StateText.h"
 
 void ZenControlPluginImpl::AttachToHost(const char* registryName, const char* className, zen::HostServices* hostServices) {
@@ -58,7 +60,14 @@ bool ZenControlPluginImpl::LoadPreset(const std::string& name) {
     return zen::StateText::ReadPreset(m_className, name, text) && LoadState(text);
 }
 
-void* ZenControlPluginImpl::CreateEditor(void*) { return nullptr; }
+void* ZenControlPluginImpl::CreateEditor(void* parentWidget) {
+    return static_cast<QWidget*>(ZenEditor::Create(m_className, QString::fromUtf8(m_name), std::make_unique<InstanceEditorLink>(*this),
+                             static_cast<QWidget*>(parentWidget)));
+}
+
+void* ZenControlPluginImpl::CreateEditorFor(zen::EditorLink& link, void* parentWidget) {
+    return static_cast<QWidget*>(ZenEditor::Create(m_className, QString::fromUtf8(m_name), link, static_cast<QWidget*>(parentWidget)));
+}
 
 std::int32_t ZenControlPluginImpl::FindParameter(const char* identifierOrLabel) const {
     return identifierOrLabel != nullptr ? m_parameters.Find(QString::fromUtf8(identifierOrLabel)) : -1;

@@ -46,6 +46,7 @@ public:
     std::vector<std::string> GetPresetNames() const override;
     bool LoadPreset(const std::string& name) override;
     void* CreateEditor(void* parentWidget) override;
+    void* CreateEditorFor(zen::EditorLink& link, void* parentWidget) override;
 
     // ZenControlValueHost
     std::int32_t FindParameter(const char* identifierOrLabel) const override;

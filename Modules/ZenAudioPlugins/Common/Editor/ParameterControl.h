@@ -44,8 +44,16 @@ signals:
 protected:
     ParameterControl(zen::EditorLink& link, std::uint32_t index, QWidget* parent);
 
+    // Sets the parameter inside a gesture the caller opened (a drag).
+    void ApplyValue(float value);
+    // Shows a value the link now holds; the control's own drawing.
+    virtual void ShowValue(float value) = 0;
+
     zen::EditorLink& m_link;
     std::uint32_t m_index;
     zen::ParameterInfo m_info;
     float m_shown = 0.0f;
+
+private:
+    bool m_synced = false;
 };

@@ -35,7 +35,22 @@ public:
     // on a logarithmic axis): where response curves are sampled.
     std::vector<double> SamplePositions(int count) const;
 
+    // The axis as set.
+    double MinimumX() const { return m_xMin; }
+    double MaximumX() const { return m_xMax; }
+    double MinimumY() const { return m_yMin; }
+    double MaximumY() const { return m_yMax; }
+    Scale HorizontalScale() const { return m_xScale; }
+
+    // Grid positions: 1-2-5 per decade on a logarithmic axis, round steps
+    // otherwise; levels every 6 dB (3, 12 or 24 by range).
+    std::vector<double> HorizontalTicks() const;
+    double VerticalStep() const;
+
 private:
+    double ToPixelX(double x) const;
+    QString HorizontalLabel(double x) const;
+
     double m_xMin = 20.0, m_xMax = 20000.0, m_yMin = -24.0, m_yMax = 24.0;
     Scale m_xScale = Scale::Logarithmic;
     QString m_xUnit = "Hz", m_yUnit = "dB";

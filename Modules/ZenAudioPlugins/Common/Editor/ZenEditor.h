@@ -63,12 +63,24 @@ public:
     ParameterControl* Control(std::uint32_t parameterIndex) const;
     const std::vector<EditorDisplay*>& Displays() const { return m_displays; }
     void RefreshNow();  // one refresh, as the timer does
+    bool IsRefreshing() const;  // the timer runs (while shown)
+
+    // The group a layout placed a parameter in; empty when it has no control.
+    QString GroupOf(std::uint32_t parameterIndex) const;
+
+protected:
+    void showEvent(QShowEvent* event) override;
+    void hideEvent(QHideEvent* event) override;
 
 private:
     ZenEditor(const char* className, const QString& title, zen::EditorLink& link,
               std::unique_ptr<zen::EditorLink> ownedLink, QWidget* parent);
     void BuildDefaultLayout();
     void Finish();
+    void BuildHeader(const QString& title);
+    void ApplyLook();
+    // Next free grid cell of the group area for a group of `cells` controls.
+    void PlaceGroup(QWidget* group, int cells);
 
     std::unique_ptr<zen::EditorLink> m_ownedLink;
     zen::EditorLink* m_link;

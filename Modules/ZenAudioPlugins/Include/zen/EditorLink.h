@@ -52,6 +52,8 @@ public:
     virtual std::uint32_t GetLatency() const = 0;
     virtual bool IsBypassed() const = 0;
     virtual void SetBypass(bool bypassed) = 0;
+    // False for a control plug-in: no audio, so no bypass or latency to show.
+    virtual bool HasAudio() const { return true; }
 
     // Factory presets; an empty list when the link cannot load them.
     virtual std::vector<std::string> GetPresetNames() const = 0;

@@ -9,6 +9,8 @@
 
 namespace zen {
 
+class EditorLink;
+
 class PluginParameters {
 public:
     // Number of parameters; fixed for the instance's life. Any thread.
@@ -43,8 +45,22 @@ public:
     virtual bool LoadPreset(const std::string& name) = 0;
 
     // Builds the plug-in's editor panel as a child of a toolkit widget
-    // (QWidget*). Null when the plug-in has no editor. UI thread.
+    // (QWidget*, may be null for a top-level window) and returns it as a
+    // QWidget*. The editor talks to this instance: it reads parameters and
+    // meters about 30 times a second on the UI thread, never from the audio
+    // thread, so an open editor does not change what Process does. Null when
+    // the plug-in has no editor. The host owns the returned widget (or its
+    // parent does) and deletes it before the instance; a deleted editor
+    // leaves no timer or thread behind. UI thread; allocates.
     virtual void* CreateEditor(void* parentWidget) = 0;
+
+    // Builds the same editor over a link the host supplies, for a host that
+    // keeps the running instance out of the UI's reach (an LV2 UI over
+    // control ports, a remote panel): the editor reads and sets everything
+    // through `link`, which must outlive it; this instance only lends its
+    // class's layout, so it need not be prepared. Returns a QWidget* child
+    // of `parentWidget`, or null. UI thread; allocates.
+    virtual void* CreateEditorFor(EditorLink& link, void* parentWidget) = 0;
 
 protected:
     ~PluginParameters() = default;  // destroyed through PluginInstance

@@ -1,0 +1,36 @@
+#include "ParameterChoice.h"
+
+#include <QComboBox>
+#include <QLabel>
+#include <QSignalBlocker>
+#include <QVBoxLayout>
+#include <cmath>
+
+ParameterChoice::ParameterChoice(zen::EditorLink& link, std::uint32_t index, QWidget* parent)
+    : ParameterControl(link, index, parent), m_box(new QComboBox(this)) {
+    auto* layout = new QVBoxLayout(this);
+    layout->setContentsMargins(0, 0, 0, 0);
+    auto* label = new QLabel(QString::fromStdString(m_info.label), this);
+    label->setAlignment(Qt::AlignHCenter);
+    layout->addStretch();
+    layout->addWidget(label);
+    layout->addWidget(m_box);
+    layout->addStretch();
+    const float stride = m_info.step > 0.0f ? m_info.step : 1.0f;
+    const auto count = static_cast<int>(std::floor((m_info.maximum - m_info.minimum) / stride + 0.5f)) + 1;
+    for (int i = 0; i < count; ++i) {
+        const float value = m_info.minimum + static_cast<float>(i) * stride;
+        m_box->addItem(ValueText(value), value);
+    }
+    connect(m_box, QOverload<int>::of(&QComboBox::activated), this,
+            [this](int item) { SetValueFromUser(m_box->itemData(item).toFloat()); });
+}
+
+void ParameterChoice::ShowValue(float value) {
+    const QSignalBlocker blocker(m_box);
+    int nearest = 0;
+    for (int i = 1; i < m_box->count(); ++i)
+        if (std::fabs(m_box->itemData(i).toFloat() - value) < std::fabs(m_box->itemData(nearest).toFloat() - value))
+            nearest = i;
+    m_box->setCurrentIndex(nearest);
+}
