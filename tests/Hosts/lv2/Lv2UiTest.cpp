@@ -175,7 +175,7 @@ TEST(Lv2Ui, JalvQt5ShowsTheUiOfRepresentativePlugins) {
     }
     zentest::LilvHost host(ZEN_LV2_BUNDLE);
     std::size_t shown = 0;
-    for (const char* name : {"Limiter", "Meter", "Reverb", "Multiband Compressor"}) {
+    for (const char* name : {"Limiter", "Meter", "Multiband Compressor"}) {
         // The stereo layout of the plug-in of that name.
         const std::string prefix = std::string(zenlv2::kUriPrefix) + zenlv2::Catalog::PercentEncode(name) + ":";
         std::string uri;
@@ -187,9 +187,11 @@ TEST(Lv2Ui, JalvQt5ShowsTheUiOfRepresentativePlugins) {
         ++shown;
         SCOPED_TRACE(uri);
         Background jalv({"xvfb-run", "-a", "jalv.qt5", uri}, environment);
-        const bool lives = jalv.Lives(3.0);
-        jalv.Stop();
+        // Read before closing: ending the group takes the display away
+        // under jalv, which it reports.
+        const bool lives = jalv.Lives(2.5);
         const std::string output = jalv.Output();
+        jalv.Stop();
         EXPECT_TRUE(lives) << output;
         EXPECT_NE(output.find("UI:"), std::string::npos) << output;
         for (const char* bad : {"failed", "Failed", "error", "Error", "no UI", "No UI"})
