@@ -4,6 +4,7 @@
 #include <QBuffer>
 #include <QImage>
 #include <QPixmap>
+#include <QScrollArea>
 #include <QTimer>
 #include <QWidget>
 #include <cstdlib>
@@ -14,6 +15,9 @@
 namespace zenfx {
 
 namespace {
+
+// In device-independent pixels: a large screen.
+const QSize kLargestPicture(1920, 1600);
 
 // QApplication keeps a reference to argc and reads argv for its lifetime.
 int g_argc = 1;
@@ -75,6 +79,19 @@ void EditorHost::Settle(QWidget& editor) {
     QApplication::processEvents();
     editor.adjustSize();
     QApplication::processEvents();
+    // A picture shows every control: the window grows by what its scroll
+    // areas hide, up to a screen's worth.
+    for (int pass = 0; pass < 2; ++pass) {
+        QSize grow(0, 0);
+        for (QScrollArea* area : editor.findChildren<QScrollArea*>()) {
+            if (area->widget() == nullptr || !area->isVisible()) continue;
+            const QSize hidden = area->widget()->sizeHint() - area->viewport()->size();
+            grow = grow.expandedTo(hidden);
+        }
+        if (grow.width() <= 0 && grow.height() <= 0) break;
+        editor.resize((editor.size() + grow.expandedTo(QSize(0, 0))).boundedTo(kLargestPicture));
+        QApplication::processEvents();
+    }
 }
 
 QSize EditorHost::WritePng(QWidget& editor, const std::string& path) {
