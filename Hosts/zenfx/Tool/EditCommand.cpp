@@ -57,7 +57,7 @@ int RunEdit(PluginLibrary& library, const EditOptions& options) {
     if (device) {
         device->Start(*player);
         std::cout << "zenfx: playing " << "'" << options.input << "'" << " through '" << plugin.entry.name
-                  << "' in a loop; close the window to stop\n";
+                  << "' in a loop; close the window to stop" << std::endl;
     }
     const int status = host.Run();
     // The audio thread ends before the editor and the instance it reads.

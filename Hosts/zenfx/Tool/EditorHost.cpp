@@ -24,6 +24,18 @@ int g_argc = 1;
 char g_name[] = "zenfx";
 char* g_argv[] = {g_name, nullptr};
 
+// What the toolkit says about the machine rather than the editor (no
+// runtime folder, a platform without window-manager hints) stays out of the
+// command's output; everything else is passed on.
+QtMessageHandler g_nextHandler = nullptr;
+
+void FilterMessages(QtMsgType type, const QMessageLogContext& context, const QString& message) {
+    if (type == QtDebugMsg || type == QtInfoMsg) return;
+    if (message.contains(QLatin1String("XDG_RUNTIME_DIR")) || message.contains(QLatin1String("propagateSizeHints")))
+        return;
+    if (g_nextHandler != nullptr) g_nextHandler(type, context, message);
+}
+
 zen::PluginParameters* ParametersOf(zen::PluginInstance& instance) {
     if (auto* audio = zen::InterfaceCast<AudioPlugin>(&instance)) return audio;
     return zen::InterfaceCast<ControlPlugin>(&instance);
@@ -48,6 +60,7 @@ EditorHost::EditorHost(bool offscreen, int scale) {
             throw ZenfxError("no display to show the editor on (DISPLAY is not set); zenfx screenshot needs none");
         if (scale == 2) setenv("QT_SCALE_FACTOR", "2", 1);
     }
+    g_nextHandler = qInstallMessageHandler(FilterMessages);
     m_application = std::make_unique<QApplication>(g_argc, g_argv);
 }
 
