@@ -41,7 +41,7 @@ zen::ParameterInfo Knob(const char* name) {
 }
 
 void BuildTestLayout(ZenEditor& editor) {
-    editor.AddGroup("Detector", {"THRESHOLD", "NO_SUCH_PARAMETER", "RATIO"});
+    editor.AddGroup("Detector", {"THRESHOLD", "NO_SUCH_PARAMETER", "RATIO", "THRESHOLD"});
     editor.AddGroup("Gain", {"THRESHOLD", "MAKEUP"});  // a parameter placed twice keeps its first group
     editor.AddMeters("Input", {"INPUT_PEAK"});
 }

@@ -3,6 +3,7 @@
 // and a lifetime that leaves no timer or thread behind.
 #include <gtest/gtest.h>
 
+#include <QAbstractEventDispatcher>
 #include <QApplication>
 #include <QDir>
 #include <QPointer>
@@ -115,6 +116,7 @@ TEST_P(EveryEditor, RefreshesOnlyWhileShownAndLeavesNoTimerOrThread) {
     QApplication::processEvents();
     editor->hide();
     EXPECT_FALSE(editor->IsRefreshing());
+    EXPECT_TRUE(QAbstractEventDispatcher::instance()->registeredTimers(timer).isEmpty());
     editor->show();
     delete editor;
     QApplication::processEvents();

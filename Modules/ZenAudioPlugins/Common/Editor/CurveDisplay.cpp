@@ -31,8 +31,16 @@ void CurveDisplay::SetCurve(std::size_t index, std::vector<QPointF> points, cons
 void CurveDisplay::SetMarker(std::optional<QPointF> point) { m_marker = point; }
 
 void CurveDisplay::Refresh(const zen::EditorLink& link) {
-    if (m_update) m_update(link, *this);
-    update();
+    if (!m_update) return;
+    // Most refreshes find the settings unchanged: no repaint then.
+    const std::vector<Curve> before = m_curves;
+    const std::optional<QPointF> marker = m_marker;
+    m_update(link, *this);
+    const auto same = [](const Curve& a, const Curve& b) {
+        return a.points == b.points && a.name == b.name && a.filled == b.filled;
+    };
+    if (marker != m_marker || !std::equal(before.begin(), before.end(), m_curves.begin(), m_curves.end(), same))
+        update();
 }
 
 QSize CurveDisplay::sizeHint() const {

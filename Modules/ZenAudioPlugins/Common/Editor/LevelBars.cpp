@@ -26,12 +26,28 @@ bool IsDecibels(const zen::MeterInfo& info) {
     return info.kind == zen::MeterKind::Level || info.unit.rfind("dB", 0) == 0;
 }
 
-QString Reading(const zen::MeterInfo& info, float value) {
-    if (!std::isfinite(value) || (IsDecibels(info) && value <= info.minimum - 0.05f)) return QStringLiteral("\u2212\u221e");
+QString Reading(const LevelBars::Bar& bar) {
+    const zen::MeterInfo& info = bar.info;
+    const float value = bar.value;
+    // A level at the floor of its range reads as silence.
+    if (!std::isfinite(value) || (info.kind == zen::MeterKind::Level && !bar.hangs && value <= info.minimum))
+        return QStringLiteral("\u2212\u221e");
     const float magnitude = std::fabs(value);
     QString text = QString::number(value, 'f', magnitude >= 100.0f ? 0 : magnitude >= 10.0f || IsDecibels(info) ? 1 : 2);
     if (text.startsWith('-')) text.replace(0, 1, kMinus);
     return text;
+}
+
+void UpdateHold(LevelBars::Bar& bar, int holdRefreshes, float fall) {
+    if (!IsDecibels(bar.info)) return;
+    // A reduction holds its deepest reading and returns upwards.
+    const float sign = bar.hangs ? -1.0f : 1.0f;
+    if (sign * bar.value >= sign * bar.hold || !std::isfinite(bar.hold)) {
+        bar.hold = bar.value;
+        bar.holdAge = 0;
+    } else if (++bar.holdAge > holdRefreshes) {
+        bar.hold = sign * std::max(sign * bar.value, sign * bar.hold - fall);
+    }
 }
 
 }  // namespace
@@ -54,7 +70,8 @@ std::vector<std::uint32_t> LevelBars::Resolve(const zen::EditorLink& link, const
 
 void LevelBars::Refresh(const zen::EditorLink& link) {
     const std::uint32_t count = link.GetMeterCount();
-    if (!m_resolved || count != m_meterCount) {
+    bool changed = !m_resolved || count != m_meterCount;
+    if (changed) {
         m_resolved = true;
         m_meterCount = count;
         m_bars.clear();
@@ -66,7 +83,8 @@ void LevelBars::Refresh(const zen::EditorLink& link) {
                 bar.info.minimum = kDefaultFloor;
                 bar.info.maximum = kDefaultCeiling;
             }
-            bar.value = bar.hold = bar.info.minimum;
+            bar.hangs = bar.info.identifier.find("REDUCTION") != std::string::npos;
+            bar.value = bar.hold = bar.hangs ? bar.info.maximum : bar.info.minimum;
             m_bars.push_back(bar);
         }
         updateGeometry();
@@ -74,17 +92,15 @@ void LevelBars::Refresh(const zen::EditorLink& link) {
     const int holdRefreshes = static_cast<int>(kHoldSeconds * ZenEditor::kDisplayRate);
     const auto fall = static_cast<float>(kFallDecibelsPerSecond / ZenEditor::kDisplayRate);
     for (Bar& bar : m_bars) {
+        const float before = bar.value;
+        const float hold = bar.hold;
         bar.value = link.GetMeter(bar.meter);
-        if (!IsDecibels(bar.info)) continue;
-        if (bar.value >= bar.hold || !std::isfinite(bar.hold)) {
-            bar.hold = bar.value;
-            bar.holdAge = 0;
-        } else if (++bar.holdAge > holdRefreshes) {
-            bar.hold = std::max(bar.value, bar.hold - fall);
-        }
+        UpdateHold(bar, holdRefreshes, fall);
+        changed = changed || bar.value != before || bar.hold != hold;
     }
-    update();
+    if (changed) update();
 }
+
 
 double LevelBars::ColumnWidth() const {
     const QFontMetricsF metrics(font());
@@ -131,22 +147,21 @@ void LevelBars::paintEvent(QPaintEvent*) {
         };
         if (std::isfinite(bar.value)) {
             // Value meters grow from zero where their range holds it.
-            const float base = !IsDecibels(bar.info) && bar.info.minimum < 0.0f && bar.info.maximum > 0.0f
-                                   ? 0.0f
-                                   : bar.info.minimum;
+            float base = bar.hangs ? bar.info.maximum : bar.info.minimum;
+            if (!IsDecibels(bar.info) && bar.info.minimum < 0.0f && bar.info.maximum > 0.0f) base = 0.0f;
             const double y0 = toY(base);
             const double y1 = toY(bar.value);
-            const bool clipping = IsDecibels(bar.info) && bar.value > 0.0f && bar.info.unit.rfind("dB", 0) == 0 &&
-                                  bar.info.maximum > 0.0f;
+            const bool clipping = !bar.hangs && IsDecibels(bar.info) && bar.value > 0.0f && bar.info.maximum > 0.0f;
             painter.fillRect(QRectF(slot.left(), std::min(y0, y1), slot.width(), std::fabs(y1 - y0)),
                              clipping ? over : fill);
         }
-        if (IsDecibels(bar.info) && std::isfinite(bar.hold) && bar.hold > bar.info.minimum) {
+        if (IsDecibels(bar.info) && std::isfinite(bar.hold) &&
+            (bar.hangs ? bar.hold < bar.info.maximum : bar.hold > bar.info.minimum)) {
             painter.fillRect(QRectF(slot.left(), toY(bar.hold) - 1.0, slot.width(), 2.0),
                              palette().color(QPalette::BrightText));
         }
         painter.setPen(palette().color(QPalette::Text));
-        painter.drawText(QRectF(x, 0, column, line * 1.1), Qt::AlignCenter, Reading(bar.info, bar.value));
+        painter.drawText(QRectF(x, 0, column, line * 1.1), Qt::AlignCenter, Reading(bar));
         painter.setPen(palette().color(QPalette::WindowText));
         painter.drawText(QRectF(x, area.bottom() + line * 0.2, column, line * 2.3),
                          Qt::AlignHCenter | Qt::AlignTop | Qt::TextWordWrap, QString::fromStdString(bar.info.name));

@@ -1,7 +1,8 @@
 // Vertical bars for level and value meters, each over its meter's declared
 // range, with its name and reading underneath. Level meters (dB) keep a peak
 // hold; value meters (a correlation) fill from zero, or from the bottom of
-// a range that does not hold it. Meters are named as ZenEditor::FindMeter
+// a range that does not hold it. Gain reduction hangs from 0 dB down, its
+// hold marking the deepest reduction. Meters are named as ZenEditor::FindMeter
 // takes them, a name covering every channel's meter; the indices follow the
 // link's meter count, which changes with the channel layout.
 #pragma once
@@ -33,6 +34,7 @@ public:
         float value = 0.0f;
         float hold = 0.0f;
         int holdAge = 0;  // refreshes since the hold was set
+        bool hangs = false;  // a reduction, drawn from the top of its range
     };
     const std::vector<Bar>& Bars() const { return m_bars; }
 

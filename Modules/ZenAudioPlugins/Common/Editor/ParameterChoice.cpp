@@ -16,12 +16,7 @@ ParameterChoice::ParameterChoice(zen::EditorLink& link, std::uint32_t index, QWi
     layout->addWidget(label);
     layout->addWidget(m_box);
     layout->addStretch();
-    const float stride = m_info.step > 0.0f ? m_info.step : 1.0f;
-    const auto count = static_cast<int>(std::floor((m_info.maximum - m_info.minimum) / stride + 0.5f)) + 1;
-    for (int i = 0; i < count; ++i) {
-        const float value = m_info.minimum + static_cast<float>(i) * stride;
-        m_box->addItem(ValueText(value), value);
-    }
+    for (const float value : ListValues(m_info)) m_box->addItem(ValueText(value), value);
     connect(m_box, QOverload<int>::of(&QComboBox::activated), this,
             [this](int item) { SetValueFromUser(m_box->itemData(item).toFloat()); });
 }

@@ -182,6 +182,12 @@ QString ParameterControl::ValueText(float value) const {
     return shownUnit.isEmpty() ? number : number + ' ' + shownUnit;
 }
 
+std::vector<float> ParameterControl::ListValues(const zen::ParameterInfo& info) {
+    std::vector<float> values;
+    for (int i = 0; i < ListCount(info); ++i) values.push_back(info.minimum + static_cast<float>(i) * ListStride(info));
+    return values;
+}
+
 float ParameterControl::ValueToPosition(const zen::ParameterInfo& info, float value) {
     switch (info.taper) {
         case zen::ParameterTaper::Logarithmic: {

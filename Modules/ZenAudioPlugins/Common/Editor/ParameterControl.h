@@ -7,6 +7,7 @@
 
 #include <QWidget>
 #include <cstdint>
+#include <vector>
 
 #include "zen/EditorLink.h"
 
@@ -37,6 +38,8 @@ public:
     // The taper's mapping, shared with tests.
     static float ValueToPosition(const zen::ParameterInfo& info, float value);
     static float PositionToValue(const zen::ParameterInfo& info, float position);
+    // The values a list or switch parameter takes, in order.
+    static std::vector<float> ListValues(const zen::ParameterInfo& info);
 
 signals:
     void ValueShown(float value);

@@ -77,7 +77,7 @@ QString PlotArea::HorizontalLabel(double x) const {
 
 void PlotArea::Layout(const QFontMetricsF& metrics, const QRectF& bounds) {
     const double step = VerticalStep();
-    double labelWidth = metrics.horizontalAdvance(m_yUnit);
+    double labelWidth = 0.0;
     for (double y = std::ceil(m_yMin / step - 1e-9) * step; y <= m_yMax + 1e-9; y += step)
         labelWidth = std::max(labelWidth, metrics.horizontalAdvance(Label(y, step)));
     const double pad = metrics.height() * 0.4;
@@ -144,11 +144,12 @@ void PlotArea::Draw(QPainter& painter, const QRectF& bounds) {
         painter.drawText(QRectF(bounds.left(), py - line / 2.0, m_plot.left() - bounds.left() - line * 0.3, line),
                          Qt::AlignRight | Qt::AlignVCenter, Label(y, step));
     }
-    // The unit where a reader looks for it: under the lowest level label, and
-    // at the end of the frequency labels.
+    // Units inside the frame's corners, clear of the labels and the legend
+    // (top right); frequencies need none beside "1k".
     painter.setPen(palette.color(QPalette::PlaceholderText));
-    painter.drawText(QRectF(bounds.left(), m_plot.bottom() + line * 0.2, m_plot.left() - bounds.left() - line * 0.3, line),
-                     Qt::AlignRight | Qt::AlignTop, m_yUnit);
+    const QRectF inside = m_plot.adjusted(line * 0.3, line * 0.15, -line * 0.3, -line * 0.15);
+    painter.drawText(inside, Qt::AlignLeft | Qt::AlignTop, m_yUnit);
+    if (m_xUnit != QStringLiteral("Hz")) painter.drawText(inside, Qt::AlignRight | Qt::AlignBottom, m_xUnit);
     painter.setPen(QPen(grid.lighter(130), 0));
     painter.setBrush(Qt::NoBrush);
     painter.drawRect(m_plot);

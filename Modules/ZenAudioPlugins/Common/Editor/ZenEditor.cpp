@@ -8,6 +8,7 @@
 #include <QLabel>
 #include <QPushButton>
 #include <QScrollArea>
+#include <QScrollBar>
 #include <QSignalBlocker>
 #include <QStyle>
 #include <QStyleFactory>
@@ -30,6 +31,7 @@ constexpr int kRowCells = 12;
 // scrolls rather than growing the editor past a screen.
 constexpr int kScrollLines = 40;
 constexpr int kScrollCharacters = 200;
+constexpr double kTitleScale = 1.35;  // the plug-in's name over the body text
 
 std::string Tail(const std::string& identifier) {
     const std::size_t colon = identifier.rfind("::");
@@ -138,7 +140,10 @@ void ZenEditor::BuildHeader(const QString& title) {
     auto* header = new QHBoxLayout;
     auto* name = new QLabel(title);
     QFont big = name->font();
-    big.setPointSizeF(big.pointSizeF() * 1.35);
+    if (big.pointSizeF() > 0.0)
+        big.setPointSizeF(big.pointSizeF() * kTitleScale);
+    else
+        big.setPixelSize(static_cast<int>(big.pixelSize() * kTitleScale));
     big.setBold(true);
     name->setFont(big);
     header->addWidget(name);
@@ -202,9 +207,16 @@ void ZenEditor::AddGroup(const QString& title, std::initializer_list<const char*
     std::vector<std::uint32_t> indices;
     for (const char* name : parameters) {
         const int index = FindParameter(name);
-        if (index < 0 || m_controls[static_cast<std::size_t>(index)] != nullptr) continue;
+        // Each parameter has one control: the first group that names it.
+        if (index < 0 || m_controls[static_cast<std::size_t>(index)] != nullptr ||
+            std::find(indices.begin(), indices.end(), static_cast<std::uint32_t>(index)) != indices.end())
+            continue;
         indices.push_back(static_cast<std::uint32_t>(index));
     }
+    PlaceControls(title, indices, static_cast<int>(std::min<std::size_t>(indices.size(), kGroupColumns)));
+}
+
+void ZenEditor::PlaceControls(const QString& title, const std::vector<std::uint32_t>& indices, int cells) {
     if (indices.empty()) return;
     auto* box = new QGroupBox(title);
     auto* grid = new QGridLayout(box);
@@ -216,7 +228,7 @@ void ZenEditor::AddGroup(const QString& title, std::initializer_list<const char*
         grid->addWidget(control, static_cast<int>(i) / kGroupColumns, static_cast<int>(i) % kGroupColumns,
                         Qt::AlignHCenter | Qt::AlignTop);
     }
-    PlaceGroup(box, static_cast<int>(std::min<std::size_t>(indices.size(), kGroupColumns)));
+    PlaceGroup(box, cells);
 }
 
 void ZenEditor::AddDisplay(EditorDisplay* display, int stretch) {
@@ -244,19 +256,7 @@ void ZenEditor::OnRefresh(std::function<void()> callback) {
 void ZenEditor::BuildDefaultLayout() {
     std::vector<std::uint32_t> all(m_controls.size());
     for (std::uint32_t i = 0; i < all.size(); ++i) all[i] = i;
-    if (!all.empty()) {
-        auto* box = new QGroupBox(tr("Parameters"));
-        auto* grid = new QGridLayout(box);
-        for (std::size_t i = 0; i < all.size(); ++i) {
-            ParameterControl* control = ParameterControl::Create(*m_link, all[i], box);
-            if (control == nullptr) continue;
-            m_controls[i] = control;
-            m_layout->groupOf[i] = box->title();
-            grid->addWidget(control, static_cast<int>(i) / kGroupColumns, static_cast<int>(i) % kGroupColumns,
-                            Qt::AlignHCenter | Qt::AlignTop);
-        }
-        PlaceGroup(box, kRowCells);
-    }
+    PlaceControls(tr("Parameters"), all, kRowCells);
     // Every level and value meter by its name, once per plug-in.
     std::vector<std::string> names;
     zen::MeterInfo info;
@@ -272,6 +272,7 @@ void ZenEditor::BuildDefaultLayout() {
         auto* bars = new LevelBars(std::move(names), box);
         column->addWidget(bars);
         m_layout->meterDisplays.push_back(bars);
+        bars->Refresh(*m_link);
         PlaceGroup(box, 2);
     }
 }
@@ -281,19 +282,7 @@ void ZenEditor::Finish() {
     std::vector<std::uint32_t> left;
     for (std::uint32_t i = 0; i < m_controls.size(); ++i)
         if (m_controls[i] == nullptr) left.push_back(i);
-    if (!left.empty()) {
-        auto* box = new QGroupBox(tr("Other"));
-        auto* grid = new QGridLayout(box);
-        for (std::size_t i = 0; i < left.size(); ++i) {
-            ParameterControl* control = ParameterControl::Create(*m_link, left[i], box);
-            if (control == nullptr) continue;
-            m_controls[left[i]] = control;
-            m_layout->groupOf[left[i]] = box->title();
-            grid->addWidget(control, static_cast<int>(i) / kGroupColumns, static_cast<int>(i) % kGroupColumns,
-                            Qt::AlignHCenter | Qt::AlignTop);
-        }
-        PlaceGroup(box, static_cast<int>(std::min<std::size_t>(left.size(), kGroupColumns)));
-    }
+    PlaceControls(tr("Other"), left, static_cast<int>(std::min<std::size_t>(left.size(), kGroupColumns)));
     m_layout->groupRows->addStretch(1);
     if (m_displays.empty()) m_layout->root->setStretchFactor(m_layout->displayRow, 0);
 
@@ -301,10 +290,14 @@ void ZenEditor::Finish() {
     const QSize need = m_layout->groupArea->sizeHint();
     const QFontMetrics metrics(font());
     if (need.height() > metrics.height() * kScrollLines || need.width() > metrics.averageCharWidth() * kScrollCharacters) {
+        // Only the height scrolls: groups stay side by side as laid out.
         auto* scroll = new QScrollArea;
         scroll->setWidget(m_layout->groupArea);
         scroll->setWidgetResizable(true);
         scroll->setFrameShape(QFrame::NoFrame);
+        scroll->setHorizontalScrollBarPolicy(Qt::ScrollBarAlwaysOff);
+        scroll->setMinimumWidth(need.width() + scroll->verticalScrollBar()->sizeHint().width());
+        scroll->setMinimumHeight(std::min(need.height(), metrics.height() * kScrollLines));
         scroll->setPalette(palette());
         scroll->viewport()->setAutoFillBackground(false);
         m_layout->root->addWidget(scroll, 1);

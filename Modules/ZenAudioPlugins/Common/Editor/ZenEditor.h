@@ -81,6 +81,8 @@ private:
     void ApplyLook();
     // Next free grid cell of the group area for a group of `cells` controls.
     void PlaceGroup(QWidget* group, int cells);
+    // A titled group of controls for these parameters, placed as `cells`.
+    void PlaceControls(const QString& title, const std::vector<std::uint32_t>& indices, int cells);
 
     std::unique_ptr<zen::EditorLink> m_ownedLink;
     zen::EditorLink* m_link;
