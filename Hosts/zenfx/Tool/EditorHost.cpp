@@ -47,7 +47,9 @@ EditorHost::EditorHost(bool offscreen, int scale) {
     if (scale != 1 && scale != 2) throw ZenfxError("--scale must be 1 or 2", kExitUsage);
     if (offscreen) {
         const char* platform = std::getenv("QT_QPA_PLATFORM");
-        if (platform == nullptr || *platform == '\0') setenv("QT_QPA_PLATFORM", "offscreen", 1);
+        // Qt 5's offscreen platform leaves its screen behind when the
+        // application ends; the minimal one with fonts draws the same.
+        if (platform == nullptr || *platform == '\0') setenv("QT_QPA_PLATFORM", "minimal:enable_fonts", 1);
         // Scaling from the screen's density would make pictures differ by machine.
         setenv("QT_SCALE_FACTOR", scale == 2 ? "2" : "1", 1);
         unsetenv("QT_AUTO_SCREEN_SCALE_FACTOR");

@@ -16,8 +16,8 @@ namespace zenfx {
 
 class EditorHost {
 public:
-    // Creates the application. `offscreen`: no display needed (the offscreen
-    // platform, unless QT_QPA_PLATFORM names one). `scale` 1 or 2 sets
+    // Creates the application. `offscreen`: no display needed (Qt's minimal
+    // platform with fonts, unless QT_QPA_PLATFORM names one). `scale` 1 or 2 sets
     // QT_SCALE_FACTOR, so a picture at 2 has twice the pixels of one at 1.
     EditorHost(bool offscreen, int scale);
     ~EditorHost();
