@@ -189,6 +189,7 @@ std::string DescribeFormat(int format) {
 }
 
 std::vector<float> ReadFrames(AudioSource& source, std::int64_t frames) {
+    if (frames <= 0) return {};
     const auto channels = static_cast<std::size_t>(source.Channels());
     std::vector<float> samples(static_cast<std::size_t>(std::max<std::int64_t>(frames, 0)) * channels);
     const std::int64_t got = source.Read(samples.data(), frames);
