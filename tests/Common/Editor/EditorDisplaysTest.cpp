@@ -78,6 +78,7 @@ TEST(LevelBars, TakeEveryChannelOfANameHoldPeaksThenFallAndFollowNewChannels) {
 }
 
 TEST(PlotArea, LogAxisSamplesAndLabelsDecadesAndLevelGridFollowsTheRange) {
+    zentest::EnsureApplication();  // fonts
     PlotArea plot;
     plot.SetHorizontal(20.0, 20000.0, PlotArea::Scale::Logarithmic, "Hz");
     const std::vector<double> x = plot.SamplePositions(10);
