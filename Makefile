@@ -3,6 +3,7 @@
 #             the validator's thread checks under TSan
 # make bench  realtime factors of plug-ins and kernels
 # make compare  ours beside open peers from Debian (installs them as root)
+# make screenshots  every editor's picture in docs/editors and the README gallery
 # make install [PREFIX=/usr/local]
 
 BUILD_DIR ?= build
@@ -15,7 +16,7 @@ CMAKE     ?= cmake
 COMMON_FLAGS := -G Ninja -DZEN_WERROR=ON
 ZENFX := $(BUILD_DIR)/bin/zenfx
 
-.PHONY: all setup configure build run test test-release test-asan test-tsan bench compare install clean
+.PHONY: all setup configure build run test test-release test-asan test-tsan bench compare screenshots install clean
 
 all: build
 
@@ -65,6 +66,9 @@ bench: build
 # Not a test: prints one table, ours beside each peer on the same material.
 compare: build
 	@bench/peers.sh $(BUILD_DIR)
+
+screenshots: build
+	@scripts/screenshots.sh $(BUILD_DIR) $(JOBS)
 
 install: build
 	$(CMAKE) --install $(BUILD_DIR) --prefix $(PREFIX)

@@ -16,6 +16,7 @@ PACKAGES="
   lv2-dev liblilv-dev lilv-utils sordi
   googletest libgtest-dev libgmock-dev libbenchmark-dev
   libebur128-dev alsa-utils
+  jalv jackd2 xvfb xauth jq
 "
 
 missing=""

@@ -67,6 +67,8 @@ std::string Catalog::MakeUri(const std::string& key, const std::string& layout) 
     return kUriPrefix + encoded + ":" + layout;
 }
 
+std::string Catalog::UiUri(const Variant& variant) { return variant.uri + ":ui"; }
+
 std::string Catalog::LayoutName(std::uint32_t inputs, std::uint32_t outputs) {
     if (inputs == 0 || inputs == outputs) return ChannelsName(outputs);
     return ChannelsName(inputs) + "-to-" + ChannelsName(outputs);

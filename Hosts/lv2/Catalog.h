@@ -33,6 +33,9 @@ public:
     // their plug-in again whatever else the registry gains.
     static std::string MakeUri(const std::string& key, const std::string& layout);
 
+    // The plug-in's UI in that layout: its URI and ":ui".
+    static std::string UiUri(const Variant& variant);
+
     // Percent-encoding of everything outside RFC 3986's unreserved characters.
     static std::string PercentEncode(const std::string& text);
 

@@ -1,36 +1,16 @@
 // The bundle's binary: lv2_descriptor and the LV2 callbacks over Instance.
 // The plug-in library is found relative to the bundle (installed side by side
 // under the same lib folder, or beside the binary), else on the system path.
-#include <dlfcn.h>
-
 #include <cstdio>
 #include <cstring>
 #include <string>
 #include <vector>
 
+#include "BundledLibrary.h"
 #include "Catalog.h"
 #include "Instance.h"
-#include "Library.h"
 
 namespace {
-
-std::string BundleFolder() {
-    Dl_info info{};
-    if (dladdr(reinterpret_cast<const void*>(&BundleFolder), &info) == 0 || info.dli_fname == nullptr) return {};
-    const std::string path = info.dli_fname;
-    const std::size_t slash = path.find_last_of('/');
-    return slash == std::string::npos ? std::string(".") : path.substr(0, slash);
-}
-
-zenlv2::Library& TheLibrary() {
-    static zenlv2::Library library = [] {
-        const std::string folder = BundleFolder();
-        return zenlv2::Library(
-            std::vector<std::string>{folder + "/../../" ZEN_LV2_LIBRARY_FILE, folder + "/" ZEN_LV2_LIBRARY_FILE,
-                                     ZEN_LV2_LIBRARY_FILE});
-    }();
-    return library;
-}
 
 struct Offered {
     std::vector<zenlv2::Variant> variants;
@@ -64,9 +44,10 @@ const void* ExtensionData(const char* uri) {
 const Offered& TheOffered() {
     static const Offered offered = [] {
         Offered built;
-        zenlv2::Library& library = TheLibrary();
+        zenlv2::Library& library = zenlv2::BundledLibrary();
         if (!library.IsLoaded()) {
-            std::fprintf(stderr, "zen.lv2: cannot load %s: %s\n", ZEN_LV2_LIBRARY_FILE, library.Error().c_str());
+            std::fprintf(stderr, "zen.lv2: cannot load %s: %s\n", zenlv2::BundledLibraryFile(),
+                         library.Error().c_str());
             return built;
         }
         try {
@@ -88,7 +69,7 @@ LV2_Handle Instantiate(const LV2_Descriptor* descriptor, double sampleRate, cons
     const auto index = static_cast<std::size_t>(descriptor - offered.descriptors.data());
     if (index >= offered.variants.size()) return nullptr;
     try {
-        return zenlv2::Instance::Create(TheLibrary(), offered.variants[index], sampleRate, features).release();
+        return zenlv2::Instance::Create(zenlv2::BundledLibrary(), offered.variants[index], sampleRate, features).release();
     } catch (...) {  // failures reach the host as no instance
         return nullptr;
     }

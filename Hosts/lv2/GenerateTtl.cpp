@@ -1,7 +1,7 @@
 // zen-lv2-ttl: writes the bundle's .ttl files from the library's registry and
 // parameter tables. Run by the build after the library and the adapter.
 //
-//   zen-lv2-ttl LIBRARY BUNDLE_DIR BINARY_NAME
+//   zen-lv2-ttl LIBRARY BUNDLE_DIR BINARY_NAME [UI_BINARY_NAME]
 #include <dirent.h>
 #include <unistd.h>
 
@@ -69,12 +69,13 @@ std::vector<zenlv2::Preset> PresetsOf(zenlv2::Library& library, const std::vecto
 }  // namespace
 
 int main(int argc, char** argv) {
-    if (argc != 4) {
-        std::fprintf(stderr, "usage: zen-lv2-ttl LIBRARY BUNDLE_DIR BINARY_NAME\n");
+    if (argc != 4 && argc != 5) {
+        std::fprintf(stderr, "usage: zen-lv2-ttl LIBRARY BUNDLE_DIR BINARY_NAME [UI_BINARY_NAME]\n");
         return 2;
     }
     const std::string folder = argv[2];
     const std::string binary = argv[3];
+    const std::string uiBinary = argc == 5 ? argv[4] : "";
     // The bundle lists factory presets only: the building user's own presets
     // (read from XDG_DATA_HOME) must not end up in it.
     setenv("XDG_DATA_HOME", "/nonexistent", 1);
@@ -107,6 +108,7 @@ int main(int argc, char** argv) {
                    zenlv2::TurtleWriter::Prefixes() + zenlv2::TurtleWriter::Project();
         const zenlv2::PortMap ports(*audio, variant.inputs, variant.outputs);
         text += zenlv2::TurtleWriter::Plugin(variant, ports);
+        if (!uiBinary.empty()) text += zenlv2::TurtleWriter::Ui(variant, ports);
         if (variant.uri == layouts[variant.key].front().uri)
             for (zenlv2::Preset& preset : PresetsOf(library, layouts[variant.key], ports)) {
                 text += zenlv2::TurtleWriter::PresetData(preset);
@@ -124,7 +126,7 @@ int main(int argc, char** argv) {
     }
     RemoveStaleFiles(folder, written);
     // The manifest last: it is the build's mark that the bundle is complete.
-    if (!WriteFile(folder + "/manifest.ttl", zenlv2::TurtleWriter::Manifest(variants, binary, presets))) {
+    if (!WriteFile(folder + "/manifest.ttl", zenlv2::TurtleWriter::Manifest(variants, binary, presets, uiBinary))) {
         std::fprintf(stderr, "zen-lv2-ttl: cannot write %s/manifest.ttl\n", folder.c_str());
         return 1;
     }

@@ -201,19 +201,25 @@ std::string TurtleWriter::Prefixes() {
            "@prefix bufsz: <http://lv2plug.in/ns/ext/buf-size#> .\n"
            "@prefix state: <http://lv2plug.in/ns/ext/state#> .\n"
            "@prefix pset: <http://lv2plug.in/ns/ext/presets#> .\n"
+           "@prefix ui: <http://lv2plug.in/ns/extensions/ui#> .\n"
            "@prefix urid: <http://lv2plug.in/ns/ext/urid#> .\n\n";
 }
 
 std::string TurtleWriter::Manifest(const std::vector<Variant>& variants, const std::string& binary,
-                                   const std::vector<Preset>& presets) {
+                                   const std::vector<Preset>& presets, const std::string& uiBinary) {
     std::ostringstream out;
     out << "# Generated from the plug-in registry at build time; do not edit.\n"
         << "@prefix lv2: <http://lv2plug.in/ns/lv2core#> .\n"
         << "@prefix pset: <http://lv2plug.in/ns/ext/presets#> .\n"
-        << "@prefix rdfs: <http://www.w3.org/2000/01/rdf-schema#> .\n\n";
-    for (const Variant& variant : variants)
+        << "@prefix rdfs: <http://www.w3.org/2000/01/rdf-schema#> .\n"
+        << (uiBinary.empty() ? "" : "@prefix ui: <http://lv2plug.in/ns/extensions/ui#> .\n") << "\n";
+    for (const Variant& variant : variants) {
         out << "<" << variant.uri << ">\n\ta lv2:Plugin ;\n\tlv2:binary <" << binary << "> ;\n\trdfs:seeAlso <"
             << FileName(variant.key) << "> .\n\n";
+        if (!uiBinary.empty())
+            out << "<" << Catalog::UiUri(variant) << ">\n\ta ui:Qt5UI ;\n\tui:binary <" << uiBinary
+                << "> ;\n\trdfs:seeAlso <" << FileName(variant.key) << "> .\n\n";
+    }
     for (const Preset& preset : presets) {
         out << "<" << preset.uri << ">\n\ta pset:Preset";
         for (std::size_t i = 0; i < preset.appliesTo.size(); ++i)
@@ -248,6 +254,19 @@ std::string TurtleWriter::Plugin(const Variant& variant, const PortMap& ports) {
         << "\tlv2:extensionData state:interface ;\n";
     if (variant.inputs > 0) out << "\tpg:mainInput <" << variant.uri << ":in> ;\n";
     out << "\tpg:mainOutput <" << variant.uri << ":out> ;\n" << Ports(variant.uri, ports) << " .\n\n";
+    return out.str();
+}
+
+std::string TurtleWriter::Ui(const Variant& variant, const PortMap& ports) {
+    const std::string ui = Catalog::UiUri(variant);
+    std::ostringstream out;
+    out << "<" << variant.uri << ">\n\tui:ui <" << ui << "> .\n\n<" << ui << ">\n\ta ui:Qt5UI";
+    for (const Port& port : ports.Ports()) {
+        if (port.type != PortType::Meter && port.type != PortType::Latency && port.type != PortType::Enabled) continue;
+        out << " ;\n\tui:portNotification [\n\t\tui:plugin <" << variant.uri << "> ;\n\t\tlv2:symbol "
+            << Quoted(port.symbol) << " ;\n\t\tui:protocol ui:floatProtocol\n\t]";
+    }
+    out << " .\n\n";
     return out.str();
 }
 

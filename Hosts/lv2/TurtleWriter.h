@@ -26,10 +26,11 @@ public:
     // Description file of a registry key: "soft-clipper-1517179747.ttl".
     static std::string FileName(const std::string& key);
 
-    // Every variant with the shared binary and its description file, and
-    // every preset with the file that holds its values.
+    // Every variant with the shared binary and its description file, every
+    // preset with the file that holds its values, and with `uiBinary` each
+    // variant's Qt 5 UI in it.
     static std::string Manifest(const std::vector<Variant>& variants, const std::string& binary,
-                                const std::vector<Preset>& presets);
+                                const std::vector<Preset>& presets, const std::string& uiBinary = {});
 
     // "urn:zenaudioplugins:Soft%20Clipper:1517179747:preset:Gentle%20Rounding".
     static std::string PresetUri(const std::string& key, const std::string& name);
@@ -43,6 +44,10 @@ public:
 
     // One variant: plug-in, port groups and ports.
     static std::string Plugin(const Variant& variant, const PortMap& ports);
+
+    // The variant's Qt 5 UI: the plug-in names it, and asks the host to send
+    // it the latency, enabled and meter ports.
+    static std::string Ui(const Variant& variant, const PortMap& ports);
 
     // Shortest decimal that reads back as the same float, always with a
     // point or an exponent so Turtle types it as a number, not an integer.

@@ -188,4 +188,13 @@ std::string DescribeFormat(int format) {
     return text;
 }
 
+std::vector<float> ReadFrames(AudioSource& source, std::int64_t frames) {
+    if (frames <= 0) return {};
+    const auto channels = static_cast<std::size_t>(source.Channels());
+    std::vector<float> samples(static_cast<std::size_t>(std::max<std::int64_t>(frames, 0)) * channels);
+    const std::int64_t got = source.Read(samples.data(), frames);
+    samples.resize(static_cast<std::size_t>(std::max<std::int64_t>(got, 0)) * channels);
+    return samples;
+}
+
 }  // namespace zenfx

@@ -6,6 +6,7 @@
 
 #include <cstdint>
 #include <string>
+#include <vector>
 
 #include "HostCore/Settings/AtomicFile.h"
 
@@ -74,6 +75,9 @@ private:
 // else 24-bit. Format names take any case. Throws ZenfxError for a missing or
 // unknown extension or a sample format the container cannot store.
 int ChooseOutputFormat(const std::string& outputPath, int inputFormat, const std::string& formatOption);
+
+// Up to `frames` interleaved frames from the source's current position.
+std::vector<float> ReadFrames(AudioSource& source, std::int64_t frames);
 
 // "WAV float", "FLAC 24-bit", ...
 std::string DescribeFormat(int format);

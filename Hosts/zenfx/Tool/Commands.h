@@ -71,6 +71,25 @@ struct RenderOptions {
     std::string format;
 };
 
+// The pictures of editors start after this much of their input.
+constexpr double kDefaultScreenshotSeconds = 3.0;
+
+struct ScreenshotOptions {
+    std::string plugin;
+    std::string preset;
+    std::string input;         // empty: the demo material
+    std::optional<double> at;  // seconds of input processed first; none: 3 s or the whole input
+    int scale = 1;             // 1 or 2
+    std::string output;
+};
+
+struct EditOptions {
+    std::string plugin;
+    std::string preset;
+    std::string input;  // empty: the editor alone
+    int scale = 1;
+};
+
 int RunList(PluginLibrary& library, bool json);
 int RunInfo(PluginLibrary& library, const InfoOptions& options);
 int RunProcess(PluginLibrary& library, const ProcessOptions& options);
@@ -78,6 +97,8 @@ int RunValidate(PluginLibrary& library, const ValidateOptions& options);
 int RunControl(PluginLibrary& library, const ControlOptions& options);
 int RunAnalyze(PluginLibrary& library, const AnalyzeOptions& options);
 int RunRender(PluginLibrary& library, const RenderOptions& options);
+int RunScreenshot(PluginLibrary& library, const ScreenshotOptions& options);
+int RunEdit(PluginLibrary& library, const EditOptions& options);
 int RunDemo(const std::string& output, const std::string& format);
 
 }  // namespace zenfx

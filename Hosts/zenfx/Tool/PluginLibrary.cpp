@@ -82,6 +82,16 @@ PluginEntry PluginLibrary::FindAudioPlugin(const std::string& nameOrKey) const {
                      " (zenfx list shows them all)");
 }
 
+PluginEntry PluginLibrary::FindPlugin(const std::string& nameOrKey) const {
+    std::vector<std::string> names;
+    for (const PluginEntry& plugin : List()) {
+        if (EqualsIgnoreCase(nameOrKey, plugin.key) || EqualsIgnoreCase(nameOrKey, plugin.entry.name)) return plugin;
+        names.push_back(plugin.entry.name);
+    }
+    throw ZenfxError("unknown plug-in '" + nameOrKey + "'" + DidYouMean(nameOrKey, names) +
+                     " (zenfx list shows them all)");
+}
+
 std::unique_ptr<zen::PluginInstance> PluginLibrary::Create(const PluginEntry& plugin) {
     zen::PluginInstance* instance = m_interface->CreatePlugin(plugin.kind, plugin.key);
     if (instance == nullptr) throw ZenfxError("the library could not create '" + plugin.entry.name + "'");
@@ -92,6 +102,21 @@ AudioPlugin& AudioOf(zen::PluginInstance& instance) {
     AudioPlugin* audio = zen::InterfaceCast<AudioPlugin>(&instance);
     if (audio == nullptr) throw ZenfxError(std::string("'") + instance.GetName() + "' is not an audio plug-in");
     return *audio;
+}
+
+void LoadPresetByName(zen::PluginInstance& instance, const std::string& preset) {
+    zen::PluginParameters* parameters = zen::InterfaceCast<AudioPlugin>(&instance);
+    if (parameters == nullptr) parameters = zen::InterfaceCast<ControlPlugin>(&instance);
+    const std::vector<std::string> names = parameters->GetPresetNames();
+    for (const std::string& name : names)
+        if (EqualsIgnoreCase(name, preset)) {
+            if (!parameters->LoadPreset(name))
+                throw ZenfxError(std::string("'") + instance.GetName() + "' refused its preset '" + name + "'");
+            return;
+        }
+    throw ZenfxError(std::string("'") + instance.GetName() + "' has no preset '" + preset + "'" +
+                         DidYouMean(preset, names),
+                     kExitUsage);
 }
 
 }  // namespace zenfx

@@ -35,6 +35,8 @@ public:
     // An audio plug-in by display name or key, case-insensitive. Throws
     // ZenfxError naming the closest plug-ins when none matches.
     PluginEntry FindAudioPlugin(const std::string& nameOrKey) const;
+    // An audio or control plug-in the same way (audio first).
+    PluginEntry FindPlugin(const std::string& nameOrKey) const;
 
     // A new instance; never null (throws ZenfxError).
     std::unique_ptr<zen::PluginInstance> Create(const PluginEntry& plugin);
@@ -47,5 +49,9 @@ private:
 
 // The instance's audio interface; throws if it has none.
 AudioPlugin& AudioOf(zen::PluginInstance& instance);
+
+// A factory preset of an audio or control plug-in by name, any case; throws
+// ZenfxError naming the closest presets.
+void LoadPresetByName(zen::PluginInstance& instance, const std::string& preset);
 
 }  // namespace zenfx

@@ -177,6 +177,26 @@ int main(int argc, char** argv) {
         ->check(CLI::Range(0.0, 3600.0));
     renderCommand->add_option("--format", render.format, "Sample format: pcm16, pcm24, pcm32, float, double");
 
+    zenfx::ScreenshotOptions screenshot;
+    double screenshotAt = 0.0;
+    CLI::App* screenshotCommand = app.add_subcommand(
+        "screenshot", "Render a plug-in's editor to a PNG after it processed audio (no display needed)");
+    screenshotCommand->add_option("PLUGIN", screenshot.plugin, "Display name or key, case-insensitive")->required();
+    screenshotCommand->add_option("--preset", screenshot.preset, "Factory preset loaded first");
+    screenshotCommand->add_option("--input", screenshot.input, "Audio file processed first (default: the demo material)");
+    CLI::Option* atOption = screenshotCommand->add_option(
+        "--at", screenshotAt, "Seconds of the input processed before the picture (default 3, or the whole input)");
+    screenshotCommand->add_option("--scale", screenshot.scale, "1 or 2 (twice the pixels)")->check(CLI::IsMember({1, 2}));
+    screenshotCommand->add_option("-o,--output", screenshot.output, "The PNG to write")->required();
+
+    zenfx::EditOptions edit;
+    CLI::App* editCommand =
+        app.add_subcommand("edit", "Open a plug-in's editor in a window; with a file, play it through in a loop");
+    editCommand->add_option("PLUGIN", edit.plugin, "Display name or key, case-insensitive")->required();
+    editCommand->add_option("FILE", edit.input, "Audio file played through the plug-in at the audio rate");
+    editCommand->add_option("--preset", edit.preset, "Factory preset loaded first");
+    editCommand->add_option("--scale", edit.scale, "1 or 2")->check(CLI::IsMember({1, 2}));
+
     std::string demoOutput, demoFormat;
     CLI::App* demo = app.add_subcommand("demo", "Write the built-in demo material to a file");
     demo->add_option("-o,--output", demoOutput, "Output file")->required();
@@ -206,6 +226,11 @@ int main(int argc, char** argv) {
             for (CLI::App* sub : controlCommand->get_subcommands()) control.action = sub->get_name();
             return zenfx::RunControl(library, control);
         }
+        if (*screenshotCommand) {
+            if (*atOption) screenshot.at = screenshotAt;
+            return zenfx::RunScreenshot(library, screenshot);
+        }
+        if (*editCommand) return zenfx::RunEdit(library, edit);
         if (*renderCommand) {
             render.actions = CollectActions(*renderCommand, renderSetOption, renderPresetOption);
             return zenfx::RunRender(library, render);

@@ -60,6 +60,7 @@ public:
     const LV2_Feature* const* Features() const { return m_features.data(); }
 
     LV2_URID Map(const char* uri);
+    LilvWorld* World() const { return m_world; }
 
 private:
     static LV2_URID MapCallback(LV2_URID_Map_Handle handle, const char* uri);
