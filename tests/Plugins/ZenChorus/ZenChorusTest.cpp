@@ -107,3 +107,17 @@ TEST(ZenChorus, AnyBlockSplitBadInputAndNeutral) {
     EXPECT_EQ(neutral.Audio().GetLatency(), 0u);
     EXPECT_EQ(neutral.Audio().GetTailLength(), 14u * 48u + 4u);
 }
+
+TEST(ZenChorus, VoicesSpreadAndShapeSwitchWithoutAClick) {
+    const std::size_t frames = 19200, at = 4900, window = 4800;
+    const std::vector<float> sine = zentest::Sine(1000.0, kRate, frames, 0.5);
+    const std::vector<std::pair<std::string, float>> changes[] = {
+        {{"Voices", 3.0f}}, {{"Spread", 100.0f}}, {{"Shape", 1.0f}}, {{"Voices", 0.0f}, {"Shape", 2.0f}}};
+    for (const auto& change : changes) {
+        PluginHarness plugin = zentest::Prepared(kName, {{"Depth", 3.0f}, {"Mix", 100.0f}, {"Rate", 5.0f}}, 2);
+        zentest::Channels out = {sine, sine};
+        plugin.ProcessSwitched(out, at, change);
+        for (int c = 0; c < 2; ++c)
+            EXPECT_LT(zentest::SwitchCurvature(out[c], at, window), 1.1) << change[0].first << " " << c;
+    }
+}

@@ -7,6 +7,7 @@
 #include <cmath>
 
 #include "Plugins/ZenStereoFixer/ZenStereoFixer.h"
+#include "Support/Modulation.h"
 #include "Support/PluginHarness.h"
 #include "Support/Signals.h"
 
@@ -147,4 +148,17 @@ TEST(ZenStereoFixer, SameOutputInAnyBlockSplitAndBadInputRecovers) {
     }
     PluginHarness plugin(kName);
     EXPECT_FALSE(plugin.Audio().ConfigureChannels(1, 1));
+}
+
+TEST(ZenStereoFixer, SwapAndPolaritySwitchWithoutAClick) {
+    const std::size_t frames = 19200, at = 4900, window = 4800;
+    const Channels in = {zentest::Sine(1000.0, 48000.0, frames, 0.5), zentest::Sine(1000.0, 48000.0, frames, 0.4, 1.1)};
+    for (const char* name : {"Swap Channels", "Left Polarity", "Right Polarity"}) {
+        PluginHarness plugin = zentest::Prepared(kName, {{"Auto Align", 0.0f}}, 2);
+        const std::size_t latency = plugin.Audio().GetLatency();
+        Channels out = in;
+        plugin.ProcessSwitched(out, at, {{name, 1.0f}});
+        for (int c = 0; c < 2; ++c)
+            EXPECT_LT(zentest::SwitchCurvature(out[c], at + latency, window), 1.1) << name << " " << c;
+    }
 }

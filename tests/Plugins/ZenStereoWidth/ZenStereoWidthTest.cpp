@@ -5,6 +5,7 @@
 
 #include <cmath>
 
+#include "Support/Modulation.h"
 #include "Support/PluginHarness.h"
 #include "Support/Signals.h"
 
@@ -124,4 +125,21 @@ TEST(ZenStereoWidth, AutomationIsTheSameInAnyBlockSplitAndBadInputRecovers) {
     PluginHarness plugin(kName);
     EXPECT_FALSE(plugin.Audio().ConfigureChannels(1, 1));
     EXPECT_TRUE(plugin.Audio().ConfigureChannels(2, 2));
+}
+
+TEST(ZenStereoWidth, MonoBassSwitchesWithoutAClick) {
+    // Side at 60 Hz that mono bass removes, under a 1 kHz tone that sets the curvature.
+    const std::size_t frames = 24000, at = 9700, window = 4800;
+    Channels io = {zentest::Sine(1000.0, 48000.0, frames, 0.5), zentest::Sine(1000.0, 48000.0, frames, 0.5, 0.7)};
+    const std::vector<float> low = zentest::Sine(60.0, 48000.0, frames, 0.3);
+    for (std::size_t i = 0; i < frames; ++i) {
+        io[0][i] += low[i];
+        io[1][i] -= low[i];
+    }
+    for (float to : {1.0f, 0.0f}) {
+        PluginHarness plugin = zentest::Prepared(kName, {{"Width", 150.0f}, {"Mono Bass", 1.0f - to}}, 2);
+        Channels out = io;
+        plugin.ProcessSwitched(out, at, {{"Mono Bass", to}});
+        for (int c = 0; c < 2; ++c) EXPECT_LT(zentest::SwitchCurvature(out[c], at, window), 1.1) << to << " " << c;
+    }
 }
