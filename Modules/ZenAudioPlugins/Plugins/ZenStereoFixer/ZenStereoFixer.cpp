@@ -5,6 +5,7 @@
 #include <cfloat>
 #include <cmath>
 
+#include "Common/Algorithms/PowerOfTwo.h"
 #include "Common/ZenAudioPlugin.h"
 
 const zen::PluginDescriptor ZenStereoFixer::kDescriptor = {
@@ -15,12 +16,6 @@ namespace {
 
 // Half the balance on each side: right up, left down by as much.
 float HalfBalanceGain(float db) { return std::pow(10.0f, db / 40.0f); }
-
-std::uint32_t NextPowerOfTwo(std::uint32_t n) {
-    std::uint32_t p = 1;
-    while (p < n) p *= 2;
-    return p;
-}
 
 }  // namespace
 
@@ -108,7 +103,7 @@ void ZenStereoFixer::PrepareProcessing(float sampleRate, std::uint32_t maxBlockS
     m_output.SetChannelCount(2);
     m_output.Prepare(sampleRate, maxBlockSize);
     m_latency = m_offset.GetMaxLag();
-    m_mask = NextPowerOfTwo(m_latency + 1) - 1;
+    m_mask = zen::NextPowerOfTwo(m_latency + 1) - 1;
     m_lines.assign(2 * (static_cast<std::size_t>(m_mask) + 1), 0.0f);
     m_alignFade = std::max(1u, static_cast<std::uint32_t>(std::lround(kAlignFadeMs * 0.001 * sampleRate)));
     m_foldFade = std::max(1u, static_cast<std::uint32_t>(std::lround(kFoldFadeMs * 0.001 * sampleRate)));
