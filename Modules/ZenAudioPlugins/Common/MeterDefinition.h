@@ -48,7 +48,8 @@ struct MeterDefinition {
     MeterDefinition SilenceReads(float db) const;
     MeterDefinition AtRest(float value) const;
 
-    // The host's reading of a published value.
+    // The host's reading of a published value; a level meter's is held
+    // within its declared range (so silence reads the floor or the minimum).
     float Reading(float published) const;
 };
 
