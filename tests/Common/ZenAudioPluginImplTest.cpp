@@ -276,8 +276,8 @@ TEST(ZenAudioPluginImpl, MetersReadWhatTheAudioThreadPublishedAndRestAfterReset)
     PluginHarness plugin = zentest::Prepared("Test Delay", {{"Delay", 0.0f}, {"Gain", -6.0f}}, 2);
     AudioPlugin& audio = plugin.Audio();
     std::vector<float> array(ZenTestDelay::kLastSampleCount, -1.0f);
-    // At rest: silence (the bottom of the -60 dB scale), zeros.
-    EXPECT_EQ(audio.GetMeter(0), -60.0f);
+    // At rest: silence, zeros.
+    EXPECT_EQ(audio.GetMeter(0), zen::kMeterFloorDb);
     ASSERT_TRUE(audio.ReadMeterArray(2, array.data(), ZenTestDelay::kLastSampleCount));
     EXPECT_EQ(array, std::vector<float>(ZenTestDelay::kLastSampleCount, 0.0f));
 
@@ -295,7 +295,7 @@ TEST(ZenAudioPluginImpl, MetersReadWhatTheAudioThreadPublishedAndRestAfterReset)
     EXPECT_EQ(audio.ReadMeterRing(2, cursor, array.data(), 1).records, 0u);
 
     audio.Reset();
-    EXPECT_EQ(audio.GetMeter(1), -60.0f);
+    EXPECT_EQ(audio.GetMeter(1), zen::kMeterFloorDb);
     ASSERT_TRUE(audio.ReadMeterArray(2, array.data(), ZenTestDelay::kLastSampleCount));
     EXPECT_EQ(array, std::vector<float>(ZenTestDelay::kLastSampleCount, 0.0f));
 }

@@ -34,13 +34,9 @@ MeterDefinition MeterDefinition::AtRest(float value) const {
 
 float MeterDefinition::Reading(float published) const {
     if (kind != MeterKind::Level) return published;
-    float db = floorDb;
-    if (published > 0.0f) {
-        db = 20.0f * std::log10(published);
-        if (readsAboveFloorOnly) db = std::max(db, floorDb);
-    }
-    // Hosts draw and bind the declared range: a reading never leaves it.
-    return minimum < maximum ? std::clamp(db, minimum, maximum) : db;
+    if (!(published > 0.0f)) return floorDb;
+    const float db = 20.0f * std::log10(published);
+    return readsAboveFloorOnly ? std::max(db, floorDb) : db;
 }
 
 namespace {

@@ -48,8 +48,7 @@ struct MeterDefinition {
     MeterDefinition SilenceReads(float db) const;
     MeterDefinition AtRest(float value) const;
 
-    // The host's reading of a published value; a level meter's is held
-    // within its declared range (so silence reads the floor or the minimum).
+    // The host's reading of a published value.
     float Reading(float published) const;
 };
 

@@ -156,7 +156,7 @@ TEST(ZenFoleySampler, OutputIsOnlyTheVoicesAndEndsWithinTheTail) {
     plugin.Process(io);  // whatever the host left in the buffers is not played
     EXPECT_EQ(zentest::Peak(io[0]), 0.0f);
     EXPECT_EQ(zentest::Peak(io[1]), 0.0f);
-    EXPECT_EQ(plugin.Meter("Output Peak 1"), -60.0f);
+    EXPECT_EQ(plugin.Meter("Output Peak 1"), -120.0f);
 
     const std::uint32_t tail = plugin.Audio().GetTailLength();
     const std::vector<float> out = Play(plugin, tail + 1024, 512);
@@ -184,7 +184,6 @@ TEST(ZenFoleySampler, ListedWithTwoChannelsAndNoAudioInput) {
     const auto row = list.find("Foley Sampler:1517184627");
     ASSERT_NE(row, list.end());
     EXPECT_EQ(row->second.channelCount, 2u);
-    EXPECT_EQ(ZenFoleySampler::kDescriptor.code, zen::MakePluginCode('Z', 'n', 'f', 's'));
     PluginHarness plugin("Foley Sampler");
     EXPECT_FALSE(plugin.Audio().ConfigureChannels(2, 2));
     EXPECT_FALSE(plugin.Audio().ConfigureChannels(0, 3));

@@ -41,11 +41,11 @@ TEST(ZenPhaseMeter, ReadsTheImageOfKnownPairs) {
     EXPECT_NEAR(mono.overall, 1.0, 1e-4);
     EXPECT_NEAR(mono.balance, 0.0, 1e-4);
     EXPECT_NEAR(mono.mid, zentest::ToDb(0.5 / std::sqrt(2.0)), 0.05);  // the RMS of (L + R) / 2
-    EXPECT_EQ(mono.side, -60.0f);  // the bottom of the scale
+    EXPECT_EQ(mono.side, -120.0f);
 
     const Image inverted = Measure(tone, Scaled(tone, -1.0f));
     EXPECT_NEAR(inverted.correlation, -1.0, 1e-4);
-    EXPECT_EQ(inverted.mid, -60.0f);
+    EXPECT_EQ(inverted.mid, -120.0f);
 
     const Image unrelated = Measure(zentest::Noise(144000, 0.5, 1), zentest::Noise(144000, 0.5, 2));
     EXPECT_NEAR(unrelated.overall, 0.0, 0.03);

@@ -75,7 +75,7 @@ TEST(ZenSoftClipper, MetersReadPeaksAndClippingInDecibels) {
 
     zentest::Channels quiet = {zentest::Sine(1000.0, 48000.0, 480, 0.2), zentest::Sine(1000.0, 48000.0, 480, 0.2)};
     plugin.Process(quiet);  // meters hold the last block only
-    EXPECT_EQ(plugin.Meter("Clipping"), -60.0f);  // the bottom of its scale
+    EXPECT_EQ(plugin.Meter("Clipping"), -120.0f);
     EXPECT_NEAR(plugin.Meter("Input Peak 1"), 20.0f * std::log10(0.2f), 0.01f);
 }
 
