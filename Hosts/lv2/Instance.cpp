@@ -36,7 +36,7 @@ std::unique_ptr<Instance> Instance::Create(Library& library, const Variant& vari
     PortMap ports(studio->PluginAt(kChannel, kSlot), variant.inputs, variant.outputs);
     std::unique_ptr<Instance> self(new Instance(std::move(studio), std::move(ports), static_cast<float>(sampleRate)));
     self->ReadFeatures(features);
-    self->m_studio->Prepare(static_cast<int>(sampleRate), self->m_maxBlock);
+    self->m_studio->Prepare(sampleRate, self->m_maxBlock);
     return self;
 }
 
@@ -90,7 +90,7 @@ void Instance::ConnectPort(std::uint32_t index, void* data) noexcept {
 void Instance::Activate() {
     SendControls();
     try {
-        m_studio->Prepare(static_cast<int>(m_sampleRate), m_maxBlock);
+        m_studio->Prepare(m_sampleRate, m_maxBlock);
     } catch (const std::exception&) {  // it was prepared at this rate once; Run then does nothing
     }
 }

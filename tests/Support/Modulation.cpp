@@ -38,6 +38,12 @@ float LargestSecondDifference(const std::vector<float>& x, std::size_t from, std
     return largest;
 }
 
+double SwitchCurvature(const std::vector<float>& x, std::size_t at, std::size_t window) {
+    const float steady = std::max(LargestSecondDifference(x, at - window, at - 1),
+                                  LargestSecondDifference(x, at + window, at + 2 * window));
+    return LargestSecondDifference(x, at, at + window) / static_cast<double>(steady);
+}
+
 double PhaseDelay(const std::vector<float>& impulseResponse, double frequency, double sampleRate) {
     const auto peak = static_cast<double>(ArgPeak(impulseResponse));
     const double w = 2.0 * kPi * frequency / sampleRate;

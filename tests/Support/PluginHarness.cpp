@@ -56,6 +56,22 @@ Channels PluginHarness::Run(const std::vector<float>& input, std::uint32_t chann
     return buffers;
 }
 
+void PluginHarness::ProcessSwitched(Channels& channels, std::size_t at,
+                                    const std::vector<std::pair<std::string, float>>& changes, std::size_t block) {
+    Channels head(channels.size()), tail(channels.size());
+    for (std::size_t c = 0; c < channels.size(); ++c) {
+        head[c].assign(channels[c].begin(), channels[c].begin() + static_cast<std::ptrdiff_t>(at));
+        tail[c].assign(channels[c].begin() + static_cast<std::ptrdiff_t>(at), channels[c].end());
+    }
+    Process(head, block);
+    for (const auto& [name, value] : changes) Set(name, value);
+    Process(tail, block);
+    for (std::size_t c = 0; c < channels.size(); ++c) {
+        std::copy(head[c].begin(), head[c].end(), channels[c].begin());
+        std::copy(tail[c].begin(), tail[c].end(), channels[c].begin() + static_cast<std::ptrdiff_t>(at));
+    }
+}
+
 float PluginHarness::Meter(const std::string& name) {
     for (std::uint32_t i = 0; i < m_audio->GetMeterCount(); ++i) {
         zen::MeterInfo info;

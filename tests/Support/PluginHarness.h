@@ -34,6 +34,11 @@ public:
     // A copy of `input` on every channel, processed; returns the channels.
     Channels Run(const std::vector<float>& input, std::uint32_t channels = 1, std::size_t block = 0);
 
+    // Processes `channels` in place in blocks of `block`, making `changes`
+    // (label or identifier, value) before frame `at`.
+    void ProcessSwitched(Channels& channels, std::size_t at,
+                         const std::vector<std::pair<std::string, float>>& changes, std::size_t block = 512);
+
     float Meter(const std::string& name);
     // The values of an array meter.
     std::vector<float> MeterArray(const std::string& name);

@@ -9,7 +9,6 @@
 
 #include "AudioFile.h"
 #include "Commands.h"
-#include "NameSuggestions.h"
 #include "ParameterValue.h"
 #include "StageSettings.h"
 #include "TriggerList.h"

@@ -107,3 +107,14 @@ TEST(ZenFlanger, AnyBlockSplitBadInputNeutralAndTail) {
     PluginHarness dry = zentest::Prepared(kName, {{"Feedback", 0.0f}, {"Manual", 2.0f}, {"Depth", 4.0f}}, 1);
     EXPECT_EQ(dry.Audio().GetTailLength(), 6u * 48u + 4u);
 }
+
+TEST(ZenFlanger, AShapeChangeGlidesWithoutAClick) {
+    const std::size_t frames = 19200, at = 4900, window = 4800;
+    const std::vector<float> sine = zentest::Sine(1000.0, 48000.0, frames, 0.5);
+    for (float shape : {0.0f, 2.0f}) {
+        PluginHarness plugin = zentest::Prepared(kName, {}, 2);
+        zentest::Channels out = {sine, sine};
+        plugin.ProcessSwitched(out, at, {{"Shape", shape}});
+        for (int c = 0; c < 2; ++c) EXPECT_LT(zentest::SwitchCurvature(out[c], at, window), 1.1) << shape << " " << c;
+    }
+}

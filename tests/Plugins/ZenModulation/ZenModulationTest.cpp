@@ -91,7 +91,7 @@ TEST(ZenModulation, VibratoMakesTheSidebandsOfItsDepthAndSpreadSpacesTheChannels
     }
 }
 
-TEST(ZenModulation, LayoutsSplitsBadInputAndNeutral) {
+TEST(ZenModulation, LayoutsSplitsAndNeutral) {
     PluginHarness layouts(kName);
     EXPECT_TRUE(layouts.Audio().ConfigureChannels(8, 8));
     EXPECT_FALSE(layouts.Audio().ConfigureChannels(9, 9));
@@ -109,15 +109,6 @@ TEST(ZenModulation, LayoutsSplitsBadInputAndNeutral) {
         const zentest::Channels whole = run(512);
         EXPECT_EQ(run(1), whole) << mode;
         EXPECT_EQ(run(123), whole) << mode;
-
-        for (float bad : {NAN, INFINITY}) {
-            std::vector<float> in = noise;
-            in[700] = bad;
-            PluginHarness plugin = zentest::Prepared(kName, {{"Mode", mode}, {"Feedback", 90.0f}}, 2);
-            const std::vector<float> out = plugin.Run(in, 2, 512)[0];
-            for (std::size_t n = 701; n < out.size(); ++n)
-                ASSERT_TRUE(std::isfinite(out[n])) << mode << ": " << bad << " at " << n;
-        }
     }
 
     PluginHarness neutral(kName);

@@ -311,4 +311,48 @@ constexpr kernels::FuncKernels FuncTable() {
     return {Map<V, Log10<V>>, Map<V, Pow10<V>>, Map<V, Exp<V>>, Map<V, Tanh<V>>, Map<V, V::Sqrt>};
 }
 
+// One frame of ModulatedTap, as its reference computes it (a template, so
+// each form keeps its own copy).
+template <class V>
+float ModulatedTapFrame(const float* x, float delay, float depth, float s, float weight, std::ptrdiff_t f) {
+    const float swing = depth * s;
+    const float p = delay + swing > 1.0f ? delay + swing : 1.0f;
+    const auto whole = static_cast<std::ptrdiff_t>(p);
+    const float fraction = p - static_cast<float>(whole);
+    const float a = x[f - whole];
+    const float b = x[f - whole - 1];
+    return weight * (a + fraction * (b - a));
+}
+
+// ModulatedTap, V::kWidth frames at a time: a run whose whole delay stays
+// put (nearly always) is two plain loads; any other goes frame by frame.
+template <class V>
+void ModulatedTap(const float* x, const float* s, float delay, float depth, float weight, float* out,
+                  std::size_t count, bool accumulate) {
+    constexpr std::size_t W = V::kWidth;
+    const typename V::T one = V::Set1(1.0f), centre = V::Set1(delay), swing = V::Set1(depth), w = V::Set1(weight);
+    std::size_t f = 0;
+    for (; f + W <= count; f += W) {
+        const typename V::T p = V::Max(V::Add(centre, V::Mul(swing, V::Load(s + f))), one);
+        const typename V::T whole = V::Truncate(p);
+        const float first = V::First(whole);
+        if (V::All(V::Eq(whole, V::Set1(first)))) {
+            const float* at = x + static_cast<std::ptrdiff_t>(f) - static_cast<std::ptrdiff_t>(first);
+            const typename V::T a = V::Load(at), b = V::Load(at - 1);
+            typename V::T v = V::Mul(w, V::Add(a, V::Mul(V::Sub(p, whole), V::Sub(b, a))));
+            if (accumulate) v = V::Add(V::Load(out + f), v);
+            V::Store(out + f, v);
+        } else {
+            for (std::size_t j = f; j < f + W; ++j) {
+                const float v = ModulatedTapFrame<V>(x, delay, depth, s[j], weight, static_cast<std::ptrdiff_t>(j));
+                out[j] = accumulate ? out[j] + v : v;
+            }
+        }
+    }
+    for (; f < count; ++f) {
+        const float v = ModulatedTapFrame<V>(x, delay, depth, s[f], weight, static_cast<std::ptrdiff_t>(f));
+        out[f] = accumulate ? out[f] + v : v;
+    }
+}
+
 }  // namespace ora::numeric::simd

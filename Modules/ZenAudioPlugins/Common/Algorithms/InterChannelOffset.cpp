@@ -5,16 +5,12 @@
 #include <cfloat>
 #include <cmath>
 
+#include "PowerOfTwo.h"
+
 namespace {
 
 // Below this mean square (-100 dBFS) a channel has nothing to correlate.
 constexpr double kSilentPower = 1e-10;
-
-std::uint32_t NextPowerOfTwo(std::uint32_t n) {
-    std::uint32_t p = 1;
-    while (p < n) p *= 2;
-    return p;
-}
 
 }  // namespace
 
@@ -34,7 +30,7 @@ const zen::ParameterTableDefinition& InterChannelOffset::Definitions() {
 bool InterChannelOffset::Prepare(float sampleRate, std::uint32_t maxBlock) {
     ZenAudioAlgorithm::Prepare(sampleRate, maxBlock);
     m_maxLag = static_cast<std::uint32_t>(std::lround(m_rangeMs * 0.001 * sampleRate));
-    m_frame = NextPowerOfTwo(std::max(1u, m_maxLag) * kFramePerLag);
+    m_frame = zen::NextPowerOfTwo(std::max(1u, m_maxLag) * kFramePerLag);
     const std::uint32_t length = 2 * m_frame;  // no wrap within +-m_maxLag
     m_fft = std::make_unique<ora::fft::FFT>(length);
     m_left.assign(m_frame, 0.0f);

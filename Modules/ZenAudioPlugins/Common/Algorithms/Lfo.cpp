@@ -14,7 +14,16 @@ void Lfo::SetRate(double hertz) noexcept {
     m_increment = std::min(std::max(hertz, 0.0) / m_sampleRate, 0.5);
 }
 
+void Lfo::SetShape(Shape shape) noexcept {
+    if (shape == m_shape) return;
+    m_previousShape = m_shape;
+    m_shape = shape;
+    m_glideLeft = std::max(1u, static_cast<std::uint32_t>(std::lround(kShapeGlideSeconds * m_sampleRate)));
+    m_glideStep = 1.0f / static_cast<float>(m_glideLeft);
+}
+
 void Lfo::Reset() noexcept {
+    m_glideLeft = 0;
     m_phase = m_startPhase;
     m_seed = 1u + static_cast<std::uint32_t>(m_startPhase * 65536.0);
     m_from = Draw();

@@ -17,7 +17,11 @@ public:
     static float Sine(double phase) noexcept;
 
     void SetSampleRate(double sampleRate) noexcept;
-    void SetShape(Shape shape) noexcept { m_shape = shape; }
+    // A new shape takes over from the old one within kShapeGlideSeconds, so
+    // the value never jumps; SettleShape (or Reset) ends the glide at once.
+    static constexpr double kShapeGlideSeconds = 0.010;
+    void SetShape(Shape shape) noexcept;
+    void SettleShape() noexcept { m_glideLeft = 0; }
     void SetRate(double hertz) noexcept;
     // Where the cycle starts after Reset, in cycles (0.25 is a quarter ahead).
     // The random walk's seed follows it, so voices with different phases
@@ -28,7 +32,11 @@ public:
     void Reset() noexcept;
 
     float Next() noexcept {
-        const float value = Value();
+        float value = Value(m_shape);
+        if (m_glideLeft > 0) {
+            value += static_cast<float>(m_glideLeft) * m_glideStep * (Value(m_previousShape) - value);
+            --m_glideLeft;
+        }
         m_phase += m_increment;
         if (m_phase >= 1.0) {
             m_phase -= 1.0;
@@ -39,10 +47,13 @@ public:
     }
 
 private:
-    float Value() const noexcept;
+    float Value(Shape shape) const noexcept;
     float Draw() noexcept;
 
     Shape m_shape = kSine;
+    Shape m_previousShape = kSine;
+    std::uint32_t m_glideLeft = 0;  // samples until the new shape alone
+    float m_glideStep = 0.0f;
     double m_sampleRate = 48000.0;
     double m_rate = 1.0;
     double m_increment = 1.0 / 48000.0;
@@ -68,8 +79,8 @@ inline float Lfo::Sine(double phase) noexcept {
     return static_cast<float>(x * p);
 }
 
-inline float Lfo::Value() const noexcept {
-    switch (m_shape) {
+inline float Lfo::Value(Shape shape) const noexcept {
+    switch (shape) {
         case kTriangle: {
             double p = m_phase + 0.25;
             if (p >= 1.0) p -= 1.0;

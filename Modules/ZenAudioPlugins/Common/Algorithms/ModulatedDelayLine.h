@@ -38,13 +38,12 @@ public:
         const float x1 = m_line[(i - 1u) & m_mask];
         const float x2 = m_line[(i - 2u) & m_mask];
         const float x3 = m_line[(i - 3u) & m_mask];
-        // Lagrange weights for the taps at offsets -1, 0, 1, 2 from `whole`.
-        const float fm1 = f - 1.0f, fm2 = f - 2.0f, fp1 = f + 1.0f;
-        const float w0 = -f * fm1 * fm2 * (1.0f / 6.0f);
-        const float w1 = fp1 * fm1 * fm2 * 0.5f;
-        const float w2 = -fp1 * f * fm2 * 0.5f;
-        const float w3 = fp1 * f * fm1 * (1.0f / 6.0f);
-        return w0 * x0 + w1 * x1 + w2 * x2 + w3 * x3;
+        // The Lagrange polynomial through the taps at offsets -1, 0, 1, 2 from
+        // `whole`, in powers of f (fewer operations than the four weights).
+        const float c1 = x2 - (1.0f / 3.0f) * x0 - 0.5f * x1 - (1.0f / 6.0f) * x3;
+        const float c2 = 0.5f * (x0 + x2) - x1;
+        const float c3 = (1.0f / 6.0f) * (x3 - x0) + 0.5f * (x1 - x2);
+        return ((c3 * f + c2) * f + c1) * f + x1;
     }
 
     // Stores the newest sample; non-finite samples are stored as silence.

@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <sstream>
 
 #include "HostCore/HostError.h"
 #include "HostCore/Settings/SettingsDocument.h"
@@ -11,6 +12,14 @@
 namespace zen::host {
 
 namespace {
+
+// A rate as people write it: 48000, 44100.5.
+std::string Hertz(double rate) {
+    std::ostringstream text;
+    text.precision(12);
+    text << rate;
+    return text.str();
+}
 
 constexpr const char* kReferencePrefix = "zen:";  // how plug-ins name other plug-ins
 
@@ -117,7 +126,7 @@ void StudioModel::Configure(const Channel& channel, Slot& slot, bool first) cons
                         " out");
     }
     if (m_prepared && !slot.audio->Prepare(static_cast<float>(m_sampleRate), m_maxBlock))
-        throw HostError("'" + slot.name + "' cannot run at " + std::to_string(m_sampleRate) + " Hz in blocks of " +
+        throw HostError("'" + slot.name + "' cannot run at " + Hertz(m_sampleRate) + " Hz in blocks of " +
                         std::to_string(m_maxBlock));
 }
 
@@ -169,14 +178,14 @@ void StudioModel::SetBypass(std::size_t channel, std::size_t slot, bool bypassed
     SlotAt(channel, slot).audio->SetBypass(bypassed);
 }
 
-void StudioModel::Prepare(int sampleRate, std::uint32_t maxBlock) {
+void StudioModel::Prepare(double sampleRate, std::uint32_t maxBlock) {
     m_prepared = false;
     m_sampleRate = sampleRate;
     m_maxBlock = maxBlock;
     for (auto& channel : m_channels)
         for (Slot& slot : channel->chain)
             if (!slot.audio->Prepare(static_cast<float>(sampleRate), maxBlock))
-                throw HostError("'" + slot.name + "' cannot run at " + std::to_string(sampleRate) +
+                throw HostError("'" + slot.name + "' cannot run at " + Hertz(sampleRate) +
                                 " Hz in blocks of " + std::to_string(maxBlock));
     m_prepared = true;
 }

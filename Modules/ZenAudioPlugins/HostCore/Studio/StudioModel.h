@@ -66,7 +66,7 @@ public:
     AudioPlugin& PluginAt(std::size_t channel, std::size_t slot);
 
     // Prepares every slot; throws HostError naming a plug-in that refuses.
-    void Prepare(int sampleRate, std::uint32_t maxBlock);
+    void Prepare(double sampleRate, std::uint32_t maxBlock);
     bool IsPrepared() const { return m_prepared; }
     // Runs the channel's chain in place, bypassed slots included (they pass
     // the signal delayed by their latency). False when not prepared.
@@ -88,7 +88,7 @@ private:
     ActionRegistry m_actions;
     std::vector<std::unique_ptr<Channel>> m_channels;
     bool m_prepared = false;
-    int m_sampleRate = 48000;
+    double m_sampleRate = 48000.0;
     std::uint32_t m_maxBlock = 1024;
 };
 

@@ -48,10 +48,6 @@ const zen::MeterTableDefinition& ZenChorus::Meters() {
     return table;
 }
 
-double ZenChorus::VoicePhase(std::uint32_t channel, std::uint32_t voice, std::uint32_t voices, float spread) {
-    return static_cast<double>(voice) / voices + 0.5 * channel * spread / 100.0;
-}
-
 std::uint32_t ZenChorus::GetTailLength() const {
     const zen::ParameterTable& p = Parameters();
     const double ms = p[kDelay].GetValue() + p[kDepth].GetValue();
@@ -64,40 +60,27 @@ bool ZenChorus::ApplyNeutralSetting() {
 }
 
 void ZenChorus::UpdateRate() noexcept {
-    const double rate = m_rate.Hertz();
-    for (auto& voices : m_lfos)
-        for (Lfo& lfo : voices) lfo.SetRate(rate);
+    for (ChorusVoiceSet& set : m_sets) set.SetRate(m_rate.Hertz());
 }
 
-void ZenChorus::UpdatePhases() noexcept {
-    for (std::uint32_t c = 0; c < kMaxChannels; ++c)
-        for (std::uint32_t v = 0; v < kMaxVoices; ++v) {
-            m_lfos[c][v].SetPhase(VoicePhase(c, v, m_voices, m_spread));
-            m_lfos[c][v].Reset();
-        }
+void ZenChorus::Rearrange() noexcept {
+    ChorusVoiceSet& current = m_sets[m_current];
+    if (current.Voices() == m_voices && current.Spread() == m_spread && current.Shape() == m_shape) return;
+    if (m_fresh) {
+        current.Configure(m_voices, m_spread, m_shape);
+        return;
+    }
+    if (m_fade.IsActive()) return;
+    m_current ^= 1u;
+    m_sets[m_current].Configure(m_voices, m_spread, m_shape);
+    m_fade.Start();
 }
 
 void ZenChorus::UpdateProcessingParameter(std::uint32_t index, float value) {
     switch (index) {
-        // The voices restart their cycles only when their spacing really changes.
-        case kVoices: {
-            const auto voices = static_cast<std::uint32_t>(std::lround(value)) + 1;
-            if (voices != m_voices) {
-                m_voices = voices;
-                UpdatePhases();
-            }
-            break;
-        }
-        case kSpread:
-            if (value != m_spread) {
-                m_spread = value;
-                UpdatePhases();
-            }
-            break;
-        case kShape:
-            for (auto& voices : m_lfos)
-                for (Lfo& lfo : voices) lfo.SetShape(static_cast<Lfo::Shape>(std::lround(value)));
-            break;
+        case kVoices: m_voices = static_cast<std::uint32_t>(std::lround(value)) + 1; Rearrange(); break;
+        case kSpread: m_spread = value; Rearrange(); break;
+        case kShape: m_shape = static_cast<Lfo::Shape>(std::lround(value)); Rearrange(); break;
         case kRate: m_rate.SetHertz(value); UpdateRate(); break;
         case kSync: m_rate.SetSync(value); UpdateRate(); break;
         case kTempo: m_rate.SetTempo(value); UpdateRate(); break;
@@ -113,20 +96,24 @@ void ZenChorus::PrepareProcessing(float sampleRate, std::uint32_t maxBlockSize) 
     m_swing.assign(maxBlockSize, 0.0);
     m_mix.assign(maxBlockSize, 0.0f);
     m_wet.assign(maxBlockSize, 0.0f);
-    for (auto& voices : m_lfos)
-        for (Lfo& lfo : voices) lfo.SetSampleRate(sampleRate);
+    m_fadingWet.assign(maxBlockSize, 0.0f);
+    for (ChorusVoiceSet& set : m_sets) set.SetSampleRate(sampleRate);
+    m_fade.Prepare(sampleRate);
     SetLatency(0);
     ResetProcessing();
 }
 
 void ZenChorus::ResetProcessing() {
     for (ModulatedDelayLine& line : m_lines) line.Clear();
-    UpdatePhases();
+    m_fade.Finish();
+    m_fresh = true;
+    m_sets[m_current].Configure(m_voices, m_spread, m_shape);
 }
 
 void ZenChorus::ProcessBlock(float* const* channels, std::uint32_t channelCount, std::uint32_t frames) noexcept {
+    m_fresh = false;
     const double samplesPerMs = GetSampleRate() / 1000.0;
-    const float voiceGain = 1.0f / static_cast<float>(m_voices);
+    const bool fading = m_fade.IsActive();
     for (std::uint32_t c = 0; c < channelCount && c < kMaxChannels; ++c) {
         auto delay = Smoothed(kDelay).Track(c);
         auto depth = Smoothed(kDepth).Track(c);
@@ -135,7 +122,6 @@ void ZenChorus::ProcessBlock(float* const* channels, std::uint32_t channelCount,
             m_centre[i] = delay.Next() * samplesPerMs;
             m_swing[i] = depth.Next() * samplesPerMs;
             m_mix[i] = static_cast<float>(mix.Next());
-            m_wet[i] = 0.0f;
         }
         // The shortest delay (6 - 5 ms) is longer than two samples, so every
         // read of frame i, frames - i samples behind the head, is of input
@@ -143,17 +129,22 @@ void ZenChorus::ProcessBlock(float* const* channels, std::uint32_t channelCount,
         ModulatedDelayLine& line = m_lines[c];
         float* samples = channels[c];
         for (std::uint32_t i = 0; i < frames; ++i) line.Push(samples[i]);
-        for (std::uint32_t v = 0; v < m_voices; ++v) {
-            Lfo& lfo = m_lfos[c][v];
-            for (std::uint32_t i = 0; i < frames; ++i)
-                m_wet[i] += line.Read(m_centre[i] + m_swing[i] * lfo.Next() + static_cast<double>(frames - i));
+        float* wet = m_wet.data();
+        m_sets[m_current].Render(line, c, m_centre.data(), m_swing.data(), wet, frames);
+        if (fading) {
+            m_sets[m_current ^ 1u].Render(line, c, m_centre.data(), m_swing.data(), m_fadingWet.data(), frames);
+            m_fade.Blend(m_fadingWet.data(), wet, frames);
         }
         float peak = 0.0f;
         for (std::uint32_t i = 0; i < frames; ++i) {
-            samples[i] = (1.0f - m_mix[i]) * samples[i] + m_mix[i] * voiceGain * m_wet[i];
+            samples[i] = (1.0f - m_mix[i]) * samples[i] + m_mix[i] * wet[i];
             peak = std::max(peak, std::fabs(samples[i]));
         }
         PublishMeter(kOutputPeak, c, peak);
+    }
+    if (fading) {
+        m_fade.Advance(frames);
+        if (!m_fade.IsActive()) Rearrange();
     }
 }
 

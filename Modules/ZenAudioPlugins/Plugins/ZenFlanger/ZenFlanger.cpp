@@ -88,7 +88,11 @@ void ZenFlanger::UpdateProcessingParameter(std::uint32_t index, float value) {
             }
             break;
         case kShape:
-            for (Lfo& lfo : m_lfos) lfo.SetShape(static_cast<Lfo::Shape>(std::lround(value)));
+            // Glides to the new shape, but not before the first block.
+            for (Lfo& lfo : m_lfos) {
+                lfo.SetShape(static_cast<Lfo::Shape>(std::lround(value)));
+                if (m_fresh) lfo.SettleShape();
+            }
             break;
         case kRate: m_rate.SetHertz(value); UpdateRate(); break;
         case kSync: m_rate.SetSync(value); UpdateRate(); break;
@@ -108,12 +112,14 @@ void ZenFlanger::PrepareProcessing(float sampleRate, std::uint32_t maxBlockSize)
 }
 
 void ZenFlanger::ResetProcessing() {
+    m_fresh = true;
     for (ModulatedDelayLine& line : m_lines) line.Clear();
     m_feedbackPath.Reset();
     UpdatePhases();
 }
 
 void ZenFlanger::ProcessBlock(float* const* channels, std::uint32_t channelCount, std::uint32_t frames) noexcept {
+    m_fresh = false;
     const double samplesPerMs = GetSampleRate() / 1000.0;
     for (std::uint32_t c = 0; c < channelCount && c < kMaxChannels; ++c) {
         auto manual = Smoothed(kManual).Track(c);

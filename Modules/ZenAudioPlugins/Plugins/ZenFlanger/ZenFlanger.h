@@ -54,6 +54,7 @@ private:
     FeedbackPath m_feedbackPath;
 
     // Audio thread.
+    bool m_fresh = true;  // no audio since the last reset
     LfoRate m_rate;
     float m_spread = 0.0f;
 };

@@ -1,6 +1,7 @@
 // One sounding take: reads its sound at any speed with four-point Hermite
-// interpolation and adds it to the output. A voice that is stolen fades out
-// over a few milliseconds instead of stopping with a click.
+// interpolation (a plain copy when it plays at its own speed) and adds it
+// to the sampler's buses. A voice that is stolen fades out over a few
+// milliseconds instead of stopping with a click.
 #pragma once
 
 #include <cstdint>
@@ -20,14 +21,20 @@ public:
     // Trigger order: lower is older.
     std::uint64_t Order() const noexcept { return m_order; }
 
-    // Adds the next `frames` samples into one or two output channels: a mono
-    // take goes to both, a stereo take to one channel is summed at half level.
-    void Render(float* const* out, std::uint32_t channels, std::uint32_t frames) noexcept;
+    // Adds the next `frames` samples: a mono take into `mono`, a stereo take
+    // into `left` and `right`.
+    void Render(float* mono, float* left, float* right, std::uint32_t frames) noexcept;
 
 private:
+    // Source position in 32.32 fixed point: exact steps, and the whole part
+    // and fraction without a float-to-integer conversion.
+    static constexpr double kOne = 4294967296.0;
+
+    std::uint32_t FramesLeft(std::uint32_t frames) const noexcept;
+
     const FoleySound* m_sound = nullptr;
-    double m_position = 0.0;
-    double m_increment = 1.0;
+    std::uint64_t m_position = 0;
+    std::uint64_t m_increment = 1;
     float m_gain = 1.0f;
     float m_fade = 1.0f;
     float m_fadeStep = 0.0f;

@@ -143,8 +143,11 @@ void ZenFoleySampler::UpdateProcessingParameter(std::uint32_t index, float value
     }
 }
 
-void ZenFoleySampler::PrepareProcessing(float sampleRate, std::uint32_t) {
+void ZenFoleySampler::PrepareProcessing(float sampleRate, std::uint32_t maxBlockSize) {
     m_sampleRate = sampleRate;
+    m_mono.assign(maxBlockSize, 0.0f);
+    m_left.assign(maxBlockSize, 0.0f);
+    m_right.assign(maxBlockSize, 0.0f);
     delete m_retired.exchange(nullptr);
     AdoptPendingBank();
     delete m_retired.exchange(nullptr);
@@ -203,17 +206,32 @@ void ZenFoleySampler::StartVoice(std::uint32_t padNumber) noexcept {
 }
 
 void ZenFoleySampler::ProcessBlock(float* const* channels, std::uint32_t channelCount, std::uint32_t frames) noexcept {
-    for (std::uint32_t c = 0; c < channelCount; ++c) std::fill(channels[c], channels[c] + frames, 0.0f);
     AdoptPendingBank();
     if (m_triggerPending) {
         m_triggerPending = false;
         StartVoice(m_pad);
     }
+    float* mono = m_mono.data();
+    float* left = m_left.data();
+    float* right = m_right.data();
+    std::fill(mono, mono + frames, 0.0f);
+    std::fill(left, left + frames, 0.0f);
+    std::fill(right, right + frames, 0.0f);
     float sounding = 0.0f;
     for (FoleyVoice& voice : m_voices) {
         if (!voice.IsActive()) continue;
-        voice.Render(channels, channelCount, frames);
+        voice.Render(mono, left, right, frames);
         sounding += voice.IsActive() ? 1.0f : 0.0f;
+    }
+    // A mono take goes to both outputs; stereo takes into one output are summed at half level.
+    if (channelCount == 1) {
+        for (std::uint32_t i = 0; i < frames; ++i) channels[0][i] = mono[i] + 0.5f * (left[i] + right[i]);
+    } else if (channelCount >= 2) {
+        for (std::uint32_t i = 0; i < frames; ++i) {
+            channels[0][i] = left[i] + mono[i];
+            channels[1][i] = right[i] + mono[i];
+        }
+        for (std::uint32_t c = 2; c < channelCount; ++c) std::fill(channels[c], channels[c] + frames, 0.0f);
     }
     for (std::uint32_t c = 0; c < channelCount; ++c) {
         float peak = 0.0f;

@@ -84,6 +84,8 @@ private:
     std::vector<std::string> m_skipped;
 
     std::array<FoleyVoice, kMaxVoices + kFadeSlots> m_voices;
+    // The voices mix here: mono takes once, stereo takes per side.
+    std::vector<float> m_mono, m_left, m_right;
     std::uint64_t m_triggerCount = 0;
     std::uint32_t m_random = 1;
     bool m_triggerHigh = false;

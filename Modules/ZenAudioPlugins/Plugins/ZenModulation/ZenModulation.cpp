@@ -119,7 +119,11 @@ void ZenModulation::UpdateProcessingParameter(std::uint32_t index, float value) 
             }
             break;
         case kShape:
-            for (Lfo& lfo : m_lfos) lfo.SetShape(static_cast<Lfo::Shape>(std::lround(value)));
+            // Glides to the new shape, but not before the first block.
+            for (Lfo& lfo : m_lfos) {
+                lfo.SetShape(static_cast<Lfo::Shape>(std::lround(value)));
+                if (m_fresh) lfo.SettleShape();
+            }
             break;
         case kRate:
             m_rate.SetHertz(value);
@@ -147,6 +151,7 @@ void ZenModulation::PrepareProcessing(float sampleRate, std::uint32_t maxBlockSi
 }
 
 void ZenModulation::ResetProcessing() {
+    m_fresh = true;
     for (ModulatedDelayLine& line : m_lines) line.Clear();
     std::fill(m_phasers.begin(), m_phasers.end(), Phaser{});
     m_position = 0;
@@ -226,6 +231,7 @@ void ZenModulation::RunAutoPan(std::uint32_t c, float* left, float* right, std::
 }
 
 void ZenModulation::ProcessBlock(float* const* channels, std::uint32_t channelCount, std::uint32_t frames) noexcept {
+    m_fresh = false;
     const std::uint32_t count = std::min(channelCount, kMaxChannels);
     for (std::uint32_t c = 0; c < count; ++c) {
         switch (m_mode) {

@@ -89,6 +89,7 @@ private:
     std::array<ModulatedDelayLine, kMaxChannels> m_lines;
 
     // Audio thread.
+    bool m_fresh = true;  // no audio since the last reset
     Mode m_mode = kPhaser;
     std::uint32_t m_stages = 4;
     LfoRate m_rate;

@@ -5,6 +5,7 @@
 #include <cfloat>
 #include <cmath>
 
+#include "Common/Algorithms/PowerOfTwo.h"
 #include "Common/ZenAudioPlugin.h"
 
 const zen::PluginDescriptor ZenStereoFixer::kDescriptor = {
@@ -15,12 +16,6 @@ namespace {
 
 // Half the balance on each side: right up, left down by as much.
 float HalfBalanceGain(float db) { return std::pow(10.0f, db / 40.0f); }
-
-std::uint32_t NextPowerOfTwo(std::uint32_t n) {
-    std::uint32_t p = 1;
-    while (p < n) p *= 2;
-    return p;
-}
 
 }  // namespace
 
@@ -83,9 +78,9 @@ bool ZenStereoFixer::ApplyNeutralSetting() {
 
 void ZenStereoFixer::UpdateProcessingParameter(std::uint32_t index, float value) {
     switch (index) {
-        case kSwap: m_swap = value >= 0.5f; break;
-        case kLeftPolarity: m_leftSign = std::lround(value) == kInverted ? -1.0f : 1.0f; break;
-        case kRightPolarity: m_rightSign = std::lround(value) == kInverted ? -1.0f : 1.0f; break;
+        case kSwap: m_swap = value >= 0.5f; Remap(); break;
+        case kLeftPolarity: m_leftSign = std::lround(value) == kInverted ? -1.0f : 1.0f; Remap(); break;
+        case kRightPolarity: m_rightSign = std::lround(value) == kInverted ? -1.0f : 1.0f; Remap(); break;
         case kAutoAlign: {
             m_autoAlign = value >= 0.5f;
             // Off returns to no correction; on waits for the next estimate.
@@ -108,10 +103,11 @@ void ZenStereoFixer::PrepareProcessing(float sampleRate, std::uint32_t maxBlockS
     m_output.SetChannelCount(2);
     m_output.Prepare(sampleRate, maxBlockSize);
     m_latency = m_offset.GetMaxLag();
-    m_mask = NextPowerOfTwo(m_latency + 1) - 1;
+    m_mask = zen::NextPowerOfTwo(m_latency + 1) - 1;
     m_lines.assign(2 * (static_cast<std::size_t>(m_mask) + 1), 0.0f);
     m_alignFade = std::max(1u, static_cast<std::uint32_t>(std::lround(kAlignFadeMs * 0.001 * sampleRate)));
     m_foldFade = std::max(1u, static_cast<std::uint32_t>(std::lround(kFoldFadeMs * 0.001 * sampleRate)));
+    m_mapFade.Prepare(sampleRate);
     ResetProcessing();
     SetLatency(m_latency);
 }
@@ -127,6 +123,55 @@ void ZenStereoFixer::ResetProcessing() {
     m_source = kSum;
     m_faultFold = false;
     m_fold = m_foldDown == kFoldOn ? 1.0f : 0.0f;
+    m_fresh = true;
+    m_mapFade.Finish();
+    m_mapFrom = m_mapTo = TargetMapping();
+}
+
+ZenStereoFixer::Mapping ZenStereoFixer::TargetMapping() const noexcept {
+    if (m_swap) return {0.0f, m_leftSign, m_rightSign, 0.0f};
+    return {m_leftSign, 0.0f, 0.0f, m_rightSign};
+}
+
+ZenStereoFixer::Mapping ZenStereoFixer::PresentMapping() const noexcept {
+    const float w = m_mapFade.Weight();
+    Mapping m;
+    for (std::size_t k = 0; k < m.size(); ++k) m[k] = m_mapFrom[k] + w * (m_mapTo[k] - m_mapFrom[k]);
+    return m;
+}
+
+void ZenStereoFixer::Remap() noexcept {
+    const Mapping target = TargetMapping();
+    if (target == m_mapTo) return;
+    if (m_fresh) {
+        m_mapFrom = m_mapTo = target;
+        m_mapFade.Finish();
+        return;
+    }
+    m_mapFrom = PresentMapping();
+    m_mapTo = target;
+    m_mapFade.Start();
+}
+
+void ZenStereoFixer::MapInput(float* left, float* right, std::uint32_t frames) noexcept {
+    if (!m_mapFade.IsActive()) {
+        for (std::uint32_t i = 0; i < frames; ++i) {
+            float l = left[i];
+            float r = right[i];
+            if (m_swap) std::swap(l, r);
+            left[i] = l * m_leftSign;
+            right[i] = r * m_rightSign;
+        }
+        return;
+    }
+    for (std::uint32_t i = 0; i < frames; ++i) {
+        const float w = m_mapFade.Next();
+        Mapping m;
+        for (std::size_t k = 0; k < m.size(); ++k) m[k] = m_mapFrom[k] + w * (m_mapTo[k] - m_mapFrom[k]);
+        const float l = left[i], r = right[i];
+        left[i] = m[0] * l + m[1] * r;
+        right[i] = m[2] * l + m[3] * r;
+    }
 }
 
 std::uint32_t ZenStereoFixer::DelayOf(int channel, int lag) const noexcept {
@@ -200,17 +245,14 @@ void ZenStereoFixer::Repair(float* left, float* right, std::uint32_t frames) noe
 }
 
 void ZenStereoFixer::ProcessBlock(float* const* channels, std::uint32_t, std::uint32_t frames) noexcept {
+    m_fresh = false;
     float* left = channels[0];
     float* right = channels[1];
+    MapInput(left, right, frames);
+    // Non-finite samples would stay in the delay lines for their length.
     for (std::uint32_t i = 0; i < frames; ++i) {
-        float l = left[i];
-        float r = right[i];
-        if (m_swap) std::swap(l, r);
-        l *= m_leftSign;
-        r *= m_rightSign;
-        // Non-finite samples would stay in the delay lines for their length.
-        left[i] = std::isfinite(l) ? l : 0.0f;
-        right[i] = std::isfinite(r) ? r : 0.0f;
+        if (!std::isfinite(left[i])) left[i] = 0.0f;
+        if (!std::isfinite(right[i])) right[i] = 0.0f;
     }
     // Cut at the estimator's frame ends, so decisions land on the same sample in any split.
     std::uint32_t done = 0;

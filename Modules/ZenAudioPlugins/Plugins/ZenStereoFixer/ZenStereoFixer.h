@@ -8,13 +8,16 @@
 // is always the largest correction, so a host's compensation holds while
 // the correction changes. A change is cross-faded between the old and the
 // new delay. Decisions fall on the offset estimator's frame boundaries, so
-// any block split gives the same output.
+// any block split gives the same output. Swap and polarity switches
+// cross-fade from the old channel mapping to the new one.
 #pragma once
 
+#include <array>
 #include <vector>
 
 #include "Common/Algorithms/CorrelationMeter.h"
 #include "Common/Algorithms/InterChannelOffset.h"
+#include "Common/Algorithms/SwitchFade.h"
 #include "Common/ZenAudioPluginImpl.h"
 
 class ZenStereoFixer : public ZenAudioPluginImpl {
@@ -56,6 +59,13 @@ protected:
     void ResetProcessing() override;
 
 private:
+    // Left and right out of swap and polarity: {ll, lr, rl, rr}.
+    using Mapping = std::array<float, 4>;
+    Mapping TargetMapping() const noexcept;
+    // The mapping being applied now (part way through a fade).
+    Mapping PresentMapping() const noexcept;
+    void Remap() noexcept;
+    void MapInput(float* left, float* right, std::uint32_t frames) noexcept;
     void Decide() noexcept;
     void Repair(float* left, float* right, std::uint32_t frames) noexcept;
     std::uint32_t DelayOf(int channel, int lag) const noexcept;
@@ -69,7 +79,12 @@ private:
     std::uint32_t m_alignFade = 1, m_foldFade = 1;
     std::uint64_t m_seenEstimates = 0;
 
+    SwitchFade m_mapFade;
+    Mapping m_mapFrom{1.0f, 0.0f, 0.0f, 1.0f};
+    Mapping m_mapTo{1.0f, 0.0f, 0.0f, 1.0f};
+
     // Audio thread.
+    bool m_fresh = true;  // no audio since the last reset
     bool m_swap = false;
     float m_leftSign = 1.0f, m_rightSign = 1.0f;
     bool m_autoAlign = true;

@@ -1,6 +1,7 @@
 #include "ZenStereoWidth.h"
 
 #include <QCoreApplication>
+#include <algorithm>
 #include <cmath>
 
 #include "Common/ZenAudioPlugin.h"
@@ -67,8 +68,12 @@ bool ZenStereoWidth::ApplyNeutralSetting() {
 void ZenStereoWidth::UpdateProcessingParameter(std::uint32_t index, float value) {
     if (index == kMonoBass) {
         const bool on = value >= 0.5f;
-        if (on && !m_monoBass) m_crossover.Reset();
+        if (on == m_monoBass) return;
+        if (on && !m_fade.IsActive()) m_crossover.Reset();
         m_monoBass = on;
+        // A switch back during a fade turns it around from where it is.
+        if (m_fresh) m_fade.Finish();
+        else m_fade.Restart();
     } else if (index == kMonoBassFrequency) {
         m_crossover.SetParameter(LinkwitzRileyCrossover::kFrequency1, value);
     }
@@ -82,29 +87,56 @@ void ZenStereoWidth::PrepareProcessing(float sampleRate, std::uint32_t maxBlockS
     m_correlation.Prepare(sampleRate, maxBlockSize);
     m_mid.assign(maxBlockSize, 0.0f);
     m_side.assign(maxBlockSize, 0.0f);
+    m_width.assign(maxBlockSize, 0.0f);
+    m_fadingLeft.assign(maxBlockSize, 0.0f);
+    m_fadingRight.assign(maxBlockSize, 0.0f);
+    m_fade.Prepare(sampleRate);
+    m_fresh = true;
     SetLatency(0);
 }
 
 void ZenStereoWidth::ProcessBlock(float* const* channels, std::uint32_t, std::uint32_t frames) noexcept {
+    m_fresh = false;
     float* left = channels[0];
     float* right = channels[1];
-    if (m_monoBass) {
-        ProcessMonoBass(left, right, frames);
-    } else {
-        auto width = Smoothed(kWidth).Track(0);
-        if (width.IsSettled()) {
-            const auto w = static_cast<float>(width.Value());
-            if (w != 1.0f)
-                for (std::uint32_t i = 0; i < frames; ++i) Widen(left[i], right[i], w);
-        } else {
-            for (std::uint32_t i = 0; i < frames; ++i) Widen(left[i], right[i], static_cast<float>(width.Next()));
-        }
+    auto smoothed = Smoothed(kWidth).Track(0);
+    const bool settled = smoothed.IsSettled();
+    float* width = m_width.data();
+    if (settled) width[0] = static_cast<float>(smoothed.Value());
+    else
+        for (std::uint32_t i = 0; i < frames; ++i) width[i] = static_cast<float>(smoothed.Next());
+    if (m_fade.IsActive()) {
+        float* oldLeft = m_fadingLeft.data();
+        float* oldRight = m_fadingRight.data();
+        std::copy(left, left + frames, oldLeft);
+        std::copy(right, right + frames, oldRight);
+        if (m_monoBass) ProcessPlain(oldLeft, oldRight, width, settled, frames);
+        else ProcessMonoBass(oldLeft, oldRight, width, settled, frames);
+    }
+    if (m_monoBass) ProcessMonoBass(left, right, width, settled, frames);
+    else ProcessPlain(left, right, width, settled, frames);
+    if (m_fade.IsActive()) {
+        m_fade.Blend(m_fadingLeft.data(), left, frames);
+        m_fade.Blend(m_fadingRight.data(), right, frames);
+        m_fade.Advance(frames);
     }
     m_correlation.Process(channels, frames);
     PublishMeter(kCorrelation, static_cast<float>(m_correlation.Current().correlation));
 }
 
-void ZenStereoWidth::ProcessMonoBass(float* left, float* right, std::uint32_t frames) noexcept {
+void ZenStereoWidth::ProcessPlain(float* left, float* right, const float* width, bool settled,
+                                  std::uint32_t frames) noexcept {
+    if (settled) {
+        const float w = width[0];
+        if (w != 1.0f)
+            for (std::uint32_t i = 0; i < frames; ++i) Widen(left[i], right[i], w);
+    } else {
+        for (std::uint32_t i = 0; i < frames; ++i) Widen(left[i], right[i], width[i]);
+    }
+}
+
+void ZenStereoWidth::ProcessMonoBass(float* left, float* right, const float* width, bool settled,
+                                     std::uint32_t frames) noexcept {
     float* mid = m_mid.data();
     float* side = m_side.data();
     m_toMidSide.Process(left, right, mid, side, frames);
@@ -113,16 +145,17 @@ void ZenStereoWidth::ProcessMonoBass(float* left, float* right, std::uint32_t fr
     const float* midLow = m_crossover.Band(0)[0];
     const float* midHigh = m_crossover.Band(1)[0];
     const float* sideHigh = m_crossover.Band(1)[1];
-    auto width = Smoothed(kWidth).Track(0);
     for (std::uint32_t i = 0; i < frames; ++i) {
         mid[i] = midLow[i] + midHigh[i];
-        side[i] = sideHigh[i] * static_cast<float>(width.Next());
+        side[i] = sideHigh[i] * width[settled ? 0 : i];
     }
     m_toLeftRight.Process(mid, side, left, right, frames);
 }
 
 void ZenStereoWidth::ResetProcessing() {
     m_crossover.Reset();
+    m_fade.Finish();
+    m_fresh = true;
     m_correlation.Reset();
 }
 

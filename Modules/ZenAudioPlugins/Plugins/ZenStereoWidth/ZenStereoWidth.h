@@ -6,6 +6,7 @@
 // Mono bass runs mid and side through a two-band Linkwitz-Riley crossover:
 // mid keeps both bands (an all-pass of itself), side keeps only its upper
 // band, so the lows of left and right become one and the rest sums flat.
+// Switching it cross-fades between the two.
 #pragma once
 
 #include <vector>
@@ -14,6 +15,7 @@
 #include "Algorithms/MS2LR.h"
 #include "Common/Algorithms/CorrelationMeter.h"
 #include "Common/Algorithms/LinkwitzRileyCrossover.h"
+#include "Common/Algorithms/SwitchFade.h"
 #include "Common/ZenAudioPluginImpl.h"
 
 class ZenStereoWidth : public ZenAudioPluginImpl {
@@ -61,14 +63,21 @@ protected:
     void ResetProcessing() override;
 
 private:
-    void ProcessMonoBass(float* left, float* right, std::uint32_t frames) noexcept;
+    // `width` holds the block's widths, or only its first when `settled`.
+    void ProcessPlain(float* left, float* right, const float* width, bool settled, std::uint32_t frames) noexcept;
+    void ProcessMonoBass(float* left, float* right, const float* width, bool settled, std::uint32_t frames) noexcept;
 
     ora::numeric::LR2MS m_toMidSide;
     ora::numeric::MS2LR m_toLeftRight;
     LinkwitzRileyCrossover m_crossover;
     CorrelationMeter m_correlation;
     std::vector<float> m_mid, m_side;
+    std::vector<float> m_width;
+    // The other mode's output while a switch fades.
+    std::vector<float> m_fadingLeft, m_fadingRight;
+    SwitchFade m_fade;
 
     // Audio thread.
     bool m_monoBass = false;
+    bool m_fresh = true;  // no audio since the last reset
 };

@@ -67,6 +67,10 @@ struct VecM128 {
     // Rounded to nearest, ties to even.
     static I RoundToInt(T a) { return _mm_cvtps_epi32(a); }
     static T ToFloat(I a) { return _mm_cvtepi32_ps(a); }
+    // Toward zero, as a float (within the int32 range).
+    static T Truncate(T a) { return _mm_cvtepi32_ps(_mm_cvttps_epi32(a)); }
+    // Every lane of a comparison is true.
+    static bool All(T mask) { return _mm_movemask_ps(mask) == 0xF; }
     static I AsInt(T a) { return _mm_castps_si128(a); }
     static T AsFloat(I a) { return _mm_castsi128_ps(a); }
 

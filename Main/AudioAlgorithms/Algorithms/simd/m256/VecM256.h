@@ -62,6 +62,10 @@ struct VecM256 {
     static void StoreInt(std::int32_t* p, I v) { _mm256_storeu_si256(reinterpret_cast<__m256i*>(p), v); }
     static I RoundToInt(T a) { return _mm256_cvtps_epi32(a); }
     static T ToFloat(I a) { return _mm256_cvtepi32_ps(a); }
+    // Toward zero, as a float (within the int32 range).
+    static T Truncate(T a) { return _mm256_cvtepi32_ps(_mm256_cvttps_epi32(a)); }
+    // Every lane of a comparison is true.
+    static bool All(T mask) { return _mm256_movemask_ps(mask) == 0xFF; }
     static I AsInt(T a) { return _mm256_castps_si256(a); }
     static T AsFloat(I a) { return _mm256_castsi256_ps(a); }
 
