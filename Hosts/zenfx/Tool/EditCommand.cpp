@@ -53,6 +53,8 @@ int RunEdit(PluginLibrary& library, const EditOptions& options) {
     }
 
     std::unique_ptr<QWidget> editor = EditorHost::CreateEditor(*instance);
+    // Opened whole: show() alone keeps a window within two thirds of a screen.
+    editor->resize(editor->sizeHint());
     editor->show();
     if (device) {
         device->Start(*player);

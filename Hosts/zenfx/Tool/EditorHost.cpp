@@ -92,7 +92,9 @@ void EditorHost::Refresh(QWidget& editor) {
 
 void EditorHost::Settle(QWidget& editor) {
     QApplication::processEvents();
-    editor.adjustSize();
+    // The editor's own size hint, not adjustSize's two thirds of a screen:
+    // the virtual screens of offscreen rendering are small.
+    editor.resize(editor.sizeHint().boundedTo(kLargestPicture));
     QApplication::processEvents();
     // A picture shows every control: the window grows by what its scroll
     // areas hide, up to a screen's worth.

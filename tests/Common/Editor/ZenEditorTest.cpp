@@ -5,14 +5,19 @@
 
 #include <QAbstractEventDispatcher>
 #include <QApplication>
+#include <QComboBox>
 #include <QDir>
+#include <QLayout>
 #include <QPointer>
+#include <QScrollArea>
+#include <QScrollBar>
 #include <QTimer>
 #include <cmath>
 #include <memory>
 #include <string>
 #include <vector>
 
+#include "Common/Editor/LevelBars.h"
 #include "Common/Editor/ParameterControl.h"
 #include "Common/Editor/ZenEditor.h"
 #include "Support/TestApplication.h"
@@ -122,6 +127,76 @@ TEST_P(EveryEditor, RefreshesOnlyWhileShownAndLeavesNoTimerOrThread) {
     QApplication::processEvents();
     EXPECT_TRUE(timer.isNull());
     EXPECT_EQ(ThreadCount(), threadsBefore);
+}
+
+TEST_P(EveryEditor, KeepsItsLookInALightHostAndOpensShowingEverything) {
+    // A host window with its own light palette, as jalv.qt5 has.
+    QWidget host;
+    QPalette light;
+    for (const auto role : {QPalette::Window, QPalette::Base, QPalette::Highlight, QPalette::Button})
+        light.setColor(role, Qt::white);
+    light.setColor(QPalette::WindowText, Qt::white);
+    host.setPalette(light);
+    auto* editor = static_cast<ZenEditor*>(static_cast<QWidget*>(m_parameters->CreateEditor(nullptr)));
+    ASSERT_NE(editor, nullptr);
+    editor->setParent(&host);
+    for (const QWidget* widget : editor->findChildren<QWidget*>()) {
+        SCOPED_TRACE(widget->metaObject()->className());
+        for (const auto role : {QPalette::Window, QPalette::Base, QPalette::Highlight})
+            EXPECT_EQ(widget->palette().color(role), editor->palette().color(role));
+        EXPECT_NE(widget->palette().color(QPalette::WindowText), QColor(Qt::white));
+    }
+
+    // Opened at its size hint, nothing scrolls unless the hint met its cap.
+    const QSize hint = editor->sizeHint();
+    EXPECT_LE(hint.width(), 1600);
+    EXPECT_LE(hint.height(), 1000);
+    editor->resize(hint);
+    editor->show();
+    editor->layout()->activate();
+    QApplication::processEvents();
+    if (hint.height() < 1000) {
+        for (const QScrollArea* scroll : editor->findChildren<QScrollArea*>())
+            EXPECT_FALSE(scroll->verticalScrollBar()->isVisible());
+    }
+
+    // Captions drop their group's title; the tooltip keeps the label.
+    for (std::uint32_t i = 0; i < m_parameters->GetParameterCount(); ++i) {
+        const ParameterControl* control = editor->Control(i);
+        ASSERT_NE(control, nullptr);
+        SCOPED_TRACE(control->Info().identifier);
+        EXPECT_FALSE(control->Caption().isEmpty());
+        EXPECT_FALSE(control->Caption().startsWith(editor->GroupOf(i) + ' '));
+        EXPECT_EQ(control->toolTip().toStdString(), control->Info().label);
+    }
+
+    // Every bar's name fits its column in two lines.
+    for (const LevelBars* bars : editor->findChildren<LevelBars*>()) {
+        if (bars->Bars().empty()) continue;
+        const QFontMetrics metrics(bars->font());
+        const int column = bars->sizeHint().width() / static_cast<int>(bars->Bars().size());
+        for (const LevelBars::Bar& bar : bars->Bars()) {
+            SCOPED_TRACE(bar.info.name);
+            const QRect text = metrics.boundingRect(QRect(0, 0, column, 10 * metrics.height()),
+                                                    Qt::AlignHCenter | Qt::TextWordWrap, QString::fromStdString(bar.info.name));
+            EXPECT_LE(text.height(), metrics.height() + metrics.lineSpacing());
+            EXPECT_LE(text.width(), column);
+        }
+    }
+
+    // The preset box names the loaded preset until a parameter moves.
+    for (QComboBox* box : editor->findChildren<QComboBox*>()) {
+        if (box->count() < 2 || box->itemText(0) != QStringLiteral("Presets")) continue;
+        box->setCurrentIndex(1);
+        emit box->activated(1);
+        editor->RefreshNow();
+        EXPECT_EQ(editor->PresetCaption(), box->itemText(1));
+        ParameterControl* control = editor->Control(0);
+        control->SetPositionFromUser(OtherPosition(m_host->GetParameterPosition(0)));
+        editor->RefreshNow();
+        EXPECT_EQ(editor->PresetCaption(), QStringLiteral("Presets"));
+    }
+    delete editor;
 }
 
 INSTANTIATE_TEST_SUITE_P(Plugins, EveryEditor, testing::ValuesIn(EveryPlugin()), CaseName);

@@ -50,6 +50,18 @@ void UpdateHold(LevelBars::Bar& bar, int holdRefreshes, float fall) {
     }
 }
 
+// The narrowest width that wraps `name` into at most two lines.
+double TwoLineWidth(const QFontMetricsF& metrics, const QString& name) {
+    const QStringList words = name.split(' ', Qt::SkipEmptyParts);
+    double best = metrics.horizontalAdvance(name);
+    for (int split = 1; split < words.size(); ++split) {
+        const double first = metrics.horizontalAdvance(words.mid(0, split).join(' '));
+        const double second = metrics.horizontalAdvance(words.mid(split).join(' '));
+        best = std::min(best, std::max(first, second));
+    }
+    return std::ceil(best) + 1.0;  // wrapping rounds widths
+}
+
 }  // namespace
 
 LevelBars::LevelBars(std::vector<std::string> names, QWidget* parent) : EditorDisplay(parent), m_names(std::move(names)) {
@@ -104,11 +116,10 @@ void LevelBars::Refresh(const zen::EditorLink& link) {
 
 double LevelBars::ColumnWidth() const {
     const QFontMetricsF metrics(font());
-    // Room for a reading and for the longest word of a name.
+    // Room for a reading and for each name in its two lines ("Input True
+    // Peak 1" as "Input True" over "Peak 1").
     double width = metrics.horizontalAdvance(QStringLiteral("\u221288.8"));
-    for (const Bar& bar : m_bars)
-        for (const QString& word : QString::fromStdString(bar.info.name).split(' '))
-            width = std::max(width, metrics.horizontalAdvance(word));
+    for (const Bar& bar : m_bars) width = std::max(width, TwoLineWidth(metrics, QString::fromStdString(bar.info.name)));
     return width + metrics.averageCharWidth() * 1.5;
 }
 

@@ -10,15 +10,20 @@ ParameterChoice::ParameterChoice(zen::EditorLink& link, std::uint32_t index, QWi
     : ParameterControl(link, index, parent), m_box(new QComboBox(this)) {
     auto* layout = new QVBoxLayout(this);
     layout->setContentsMargins(0, 0, 0, 0);
-    auto* label = new QLabel(QString::fromStdString(m_info.label), this);
-    label->setAlignment(Qt::AlignHCenter);
+    m_label = new QLabel(m_caption, this);
+    m_label->setAlignment(Qt::AlignHCenter);
     layout->addStretch();
-    layout->addWidget(label);
+    layout->addWidget(m_label);
     layout->addWidget(m_box);
     layout->addStretch();
     for (const float value : ListValues(m_info)) m_box->addItem(ValueText(value), value);
     connect(m_box, QOverload<int>::of(&QComboBox::activated), this,
             [this](int item) { SetValueFromUser(m_box->itemData(item).toFloat()); });
+}
+
+void ParameterChoice::SetCaption(const QString& caption) {
+    ParameterControl::SetCaption(caption);
+    m_label->setText(caption);
 }
 
 void ParameterChoice::ShowValue(float value) {

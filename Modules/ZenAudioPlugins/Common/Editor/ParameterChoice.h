@@ -4,6 +4,7 @@
 #include "ParameterControl.h"
 
 class QComboBox;
+class QLabel;
 
 class ParameterChoice : public ParameterControl {
     Q_OBJECT
@@ -11,9 +12,12 @@ class ParameterChoice : public ParameterControl {
 public:
     ParameterChoice(zen::EditorLink& link, std::uint32_t index, QWidget* parent = nullptr);
 
+    void SetCaption(const QString& caption) override;
+
 protected:
     void ShowValue(float value) override;
 
 private:
     QComboBox* m_box;
+    QLabel* m_label = nullptr;
 };

@@ -60,7 +60,14 @@ ParameterControl::ParameterControl(zen::EditorLink& link, std::uint32_t index, Q
     : QWidget(parent), m_link(link), m_index(index) {
     m_link.GetParameterInfo(index, m_info);
     m_shown = m_info.defaultValue;
-    setToolTip(QString::fromStdString(m_info.label));
+    m_caption = QString::fromStdString(m_info.label);
+    setToolTip(m_caption);
+}
+
+void ParameterControl::SetCaption(const QString& caption) {
+    m_caption = caption;
+    updateGeometry();
+    update();
 }
 
 void ParameterControl::ApplyValue(float value) {

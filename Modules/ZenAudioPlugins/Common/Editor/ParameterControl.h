@@ -20,6 +20,10 @@ public:
 
     std::uint32_t Index() const { return m_index; }
     const zen::ParameterInfo& Info() const { return m_info; }
+    // The name the control shows; the parameter's label unless its group
+    // makes part of it redundant. The tooltip keeps the whole label.
+    const QString& Caption() const { return m_caption; }
+    virtual void SetCaption(const QString& caption);
 
     // What a user's gesture does: sets the parameter through the link (one
     // edit gesture) and shows the new value.
@@ -56,6 +60,7 @@ protected:
     std::uint32_t m_index;
     zen::ParameterInfo m_info;
     float m_shown = 0.0f;
+    QString m_caption;
 
 private:
     bool m_synced = false;

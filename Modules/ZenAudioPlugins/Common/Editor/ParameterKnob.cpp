@@ -33,7 +33,7 @@ ParameterKnob::ParameterKnob(zen::EditorLink& link, std::uint32_t index, QWidget
 QSize ParameterKnob::sizeHint() const {
     const QFontMetrics metrics(font());
     // Wide enough for the label and the widest values of the range.
-    int width = metrics.horizontalAdvance(QString::fromStdString(m_info.label));
+    int width = metrics.horizontalAdvance(m_caption);
     for (const float v : {m_info.minimum, m_info.maximum, m_info.defaultValue, -88.8f})
         if (v >= m_info.minimum && v <= m_info.maximum)
             width = std::max(width, metrics.horizontalAdvance(ValueText(v)));
@@ -63,7 +63,7 @@ void ParameterKnob::paintEvent(QPaintEvent*) {
 
     painter.setPen(colours.color(QPalette::WindowText));
     painter.drawText(QRectF(0, 0, width(), line * 1.1), Qt::AlignHCenter | Qt::AlignVCenter,
-                     QString::fromStdString(m_info.label));
+                     m_caption);
 
     const QRectF knob = KnobRect();
     const double thickness = std::max(2.0, line * 0.22);

@@ -11,6 +11,8 @@ class ParameterToggle : public ParameterControl {
 public:
     ParameterToggle(zen::EditorLink& link, std::uint32_t index, QWidget* parent = nullptr);
 
+    void SetCaption(const QString& caption) override;
+
 protected:
     void ShowValue(float value) override;
 

@@ -32,6 +32,26 @@ constexpr int kRowCells = 12;
 constexpr int kScrollLines = 40;
 constexpr int kScrollCharacters = 200;
 constexpr double kTitleScale = 1.35;  // the plug-in's name over the body text
+// Hosts open an editor at its size hint: everything shown, within a screen.
+constexpr int kMaxHintWidth = 1600;
+constexpr int kMaxHintHeight = 1000;
+const QColor kDimText(0x8a, 0x90, 0x99);
+
+// Columns of a group's grid: rows as even as they can be, none wider than
+// kGroupColumns (8 controls make two rows of 4, not 6 and 2).
+int GroupColumns(std::size_t controls) {
+    const std::size_t rows = (controls + kGroupColumns - 1) / kGroupColumns;
+    return rows == 0 ? 1 : static_cast<int>((controls + rows - 1) / rows);
+}
+
+// A control's caption inside its group: "Gain" in "Channel 1", not
+// "Channel 1 Gain".
+QString CaptionIn(const QString& group, const std::string& label) {
+    const QString text = QString::fromStdString(label);
+    const QString prefix = group + QLatin1Char(' ');
+    if (group.isEmpty() || !text.startsWith(prefix) || text.size() == prefix.size()) return text;
+    return text.mid(prefix.size());
+}
 
 std::string Tail(const std::string& identifier) {
     const std::size_t colon = identifier.rfind("::");
@@ -43,7 +63,7 @@ QPalette DarkPalette() {
     const QColor window(0x23, 0x26, 0x2b);
     const QColor base(0x17, 0x19, 0x1c);
     const QColor text(0xdc, 0xdf, 0xe4);
-    const QColor dim(0x8a, 0x90, 0x99);
+    const QColor dim = kDimText;
     const QColor button(0x31, 0x35, 0x3b);
     const QColor accent(0x4f, 0xa3, 0xd9);
     p.setColor(QPalette::Window, window);
@@ -78,6 +98,8 @@ struct ZenEditor::Layout {
     QLabel* latency = nullptr;
     QPushButton* bypass = nullptr;
     QComboBox* presets = nullptr;
+    std::vector<float> presetValues;  // parameters as the loaded preset left them
+    QScrollArea* scroll = nullptr;
     QHBoxLayout* displayRow = nullptr;
     QWidget* groupArea = nullptr;
     QVBoxLayout* groupRows = nullptr;
@@ -158,13 +180,21 @@ void ZenEditor::BuildHeader(const QString& title) {
         connect(m_layout->presets, QOverload<int>::of(&QComboBox::activated), this, [this](int item) {
             if (item <= 0) return;
             m_link->LoadPreset(m_layout->presets->itemText(item).toStdString());
+            // After the refresh: a layout may derive parameters from the loaded ones.
+            m_layout->presetValues.clear();
             RefreshNow();
+            m_layout->presetValues.resize(m_layout->parameters.size());
+            for (std::uint32_t i = 0; i < m_layout->presetValues.size(); ++i)
+                m_layout->presetValues[i] = m_link->GetParameter(i);
         });
         header->addWidget(m_layout->presets);
     }
     if (m_link->HasAudio()) {
         m_layout->latency = new QLabel;
-        m_layout->latency->setForegroundRole(QPalette::PlaceholderText);
+        // A fixed colour: some hosts' palettes drop roles a child inherits.
+        QPalette dim = DarkPalette();
+        dim.setColor(QPalette::WindowText, kDimText);
+        m_layout->latency->setPalette(dim);
         header->addWidget(m_layout->latency);
         m_layout->bypass = new QPushButton(tr("Bypass"));
         m_layout->bypass->setCheckable(true);
@@ -217,19 +247,21 @@ void ZenEditor::AddGroup(const QString& title, const std::vector<std::string>& p
             continue;
         indices.push_back(static_cast<std::uint32_t>(index));
     }
-    PlaceControls(title, indices, static_cast<int>(std::min<std::size_t>(indices.size(), kGroupColumns)));
+    PlaceControls(title, indices, GroupColumns(indices.size()));
 }
 
 void ZenEditor::PlaceControls(const QString& title, const std::vector<std::uint32_t>& indices, int cells) {
     if (indices.empty()) return;
     auto* box = new QGroupBox(title);
     auto* grid = new QGridLayout(box);
+    const int columns = std::min(cells, GroupColumns(indices.size()));
     for (std::size_t i = 0; i < indices.size(); ++i) {
         ParameterControl* control = ParameterControl::Create(*m_link, indices[i], box);
         if (control == nullptr) continue;
         m_controls[indices[i]] = control;
         m_layout->groupOf[indices[i]] = title;
-        grid->addWidget(control, static_cast<int>(i) / kGroupColumns, static_cast<int>(i) % kGroupColumns,
+        control->SetCaption(CaptionIn(title, m_layout->parameters[indices[i]].label));
+        grid->addWidget(control, static_cast<int>(i) / columns, static_cast<int>(i) % columns,
                         Qt::AlignHCenter | Qt::AlignTop);
     }
     PlaceGroup(box, cells);
@@ -286,7 +318,7 @@ void ZenEditor::Finish() {
     std::vector<std::uint32_t> left;
     for (std::uint32_t i = 0; i < m_controls.size(); ++i)
         if (m_controls[i] == nullptr) left.push_back(i);
-    PlaceControls(tr("Other"), left, static_cast<int>(std::min<std::size_t>(left.size(), kGroupColumns)));
+    PlaceControls(tr("Other"), left, GroupColumns(left.size()));
     m_layout->groupRows->addStretch(1);
     if (m_displays.empty()) m_layout->root->setStretchFactor(m_layout->displayRow, 0);
 
@@ -305,6 +337,7 @@ void ZenEditor::Finish() {
         scroll->setPalette(palette());
         scroll->viewport()->setAutoFillBackground(false);
         m_layout->root->addWidget(scroll, 1);
+        m_layout->scroll = scroll;
     } else {
         m_layout->root->addWidget(m_layout->groupArea, m_displays.empty() ? 1 : 0);
     }
@@ -312,14 +345,30 @@ void ZenEditor::Finish() {
 }
 
 void ZenEditor::ApplyLook() {
-    // The editor keeps one look in every host, whatever the host's style.
+    // The editor keeps one look in every host, whatever the host's style and
+    // application palette: each widget carries both itself rather than
+    // inheriting them through a host's window.
     QStyle* style = QStyleFactory::create(QStringLiteral("Fusion"));
-    if (style == nullptr) return;
-    style->setParent(this);
-    setStyle(style);
-    for (QWidget* child : findChildren<QWidget*>()) child->setStyle(style);
-    m_layout->groupArea->setStyle(style);
-    for (QWidget* child : m_layout->groupArea->findChildren<QWidget*>()) child->setStyle(style);
+    if (style != nullptr) style->setParent(this);
+    std::vector<QWidget*> widgets = {this, m_layout->groupArea};
+    for (QWidget* root : {static_cast<QWidget*>(this), m_layout->groupArea})
+        for (QWidget* child : root->findChildren<QWidget*>()) widgets.push_back(child);
+    const QPalette look = DarkPalette();
+    for (QWidget* widget : widgets) {
+        if (style != nullptr) widget->setStyle(style);
+        if (widget != m_layout->latency) widget->setPalette(look);
+    }
+}
+
+QSize ZenEditor::sizeHint() const {
+    QSize hint = QWidget::sizeHint();
+    if (m_layout->scroll != nullptr) {
+        // The whole group area rather than the scroll area's share of it.
+        const QSize all = m_layout->groupArea->sizeHint();
+        hint.rheight() += std::max(0, all.height() - m_layout->scroll->sizeHint().expandedTo(m_layout->scroll->minimumSize()).height());
+        hint.rwidth() = std::max(hint.width(), all.width());
+    }
+    return {std::min(hint.width(), kMaxHintWidth), std::min(hint.height(), kMaxHintHeight)};
 }
 
 ParameterControl* ZenEditor::Control(std::uint32_t parameterIndex) const {
@@ -337,6 +386,8 @@ void ZenEditor::RefreshNow() {
     for (ParameterControl* control : m_controls)
         if (control != nullptr) control->SyncFromLink();
 
+    if (m_layout->presets != nullptr) UpdatePresetCaption();
+
     if (m_layout->bypass != nullptr) {
         const QSignalBlocker blocker(m_layout->bypass);
         m_layout->bypass->setChecked(m_link->IsBypassed());
@@ -352,6 +403,23 @@ void ZenEditor::RefreshNow() {
                                                     : tr("Latency %1 samples (%2 ms)").arg(latency).arg(ms, 0, 'f', 1));
         }
     }
+}
+
+void ZenEditor::UpdatePresetCaption() {
+    std::vector<float>& loaded = m_layout->presetValues;
+    if (loaded.empty()) return;
+    bool same = loaded.size() == m_layout->parameters.size();
+    for (std::uint32_t i = 0; same && i < loaded.size(); ++i) same = m_link->GetParameter(i) == loaded[i];
+    // Moved since the preset was loaded: back to the neutral caption.
+    if (!same) {
+        loaded.clear();
+        const QSignalBlocker blocker(m_layout->presets);
+        m_layout->presets->setCurrentIndex(0);
+    }
+}
+
+QString ZenEditor::PresetCaption() const {
+    return m_layout->presets != nullptr ? m_layout->presets->currentText() : QString();
 }
 
 bool ZenEditor::IsRefreshing() const { return m_timer->isActive(); }

@@ -70,6 +70,12 @@ public:
 
     // The group a layout placed a parameter in; empty when it has no control.
     QString GroupOf(std::uint32_t parameterIndex) const;
+    // What the header's preset box reads: the loaded preset until a
+    // parameter moves, else "Presets".
+    QString PresetCaption() const;
+
+    // Everything shown (no scrolling), within a screen's size.
+    QSize sizeHint() const override;
 
 protected:
     void showEvent(QShowEvent* event) override;
@@ -82,6 +88,7 @@ private:
     void Finish();
     void BuildHeader(const QString& title);
     void ApplyLook();
+    void UpdatePresetCaption();
     // Next free grid cell of the group area for a group of `cells` controls.
     void PlaceGroup(QWidget* group, int cells);
     // A titled group of controls for these parameters, placed as `cells`.
