@@ -9,12 +9,12 @@
 
 #include <cstdlib>
 #include <filesystem>
+#include <map>
 #include <set>
 
 #include <gtest/gtest.h>
 
 #include "../zenfx/ZenfxRunner.h"
-#include "Catalog.h"
 #include "LilvHost.h"
 
 namespace {
@@ -109,8 +109,9 @@ TEST(Lv2Ui, EveryPluginNamesItsQt5UiWhichTheUiBinaryOffersAndRefusesWithoutAnApp
 }
 
 // jalv.qt5 on a virtual display and a dummy JACK server of this test's own,
-// with only our bundle on LV2_PATH: each UI comes up, stands and closes.
-TEST(Lv2Ui, JalvQt5ShowsAndClosesTheUiOfRepresentativePlugins) {
+// with only our bundle on LV2_PATH: the UI of every plug-in (its stereo
+// layout, else its first) comes up, stands and closes.
+TEST(Lv2Ui, JalvQt5ShowsAndClosesTheUiOfEveryPlugin) {
     for (const char* program : {"xvfb-run", "jalv.qt5", "jackd", "jack_wait"})
         if (!Installed(program)) GTEST_SKIP() << program << " is not installed (scripts/install-deps.sh)";
     std::vector<std::string> environment = {"LV2_PATH=" + Parent(ZEN_LV2_BUNDLE), "JACK_NO_START_SERVER=1",
@@ -120,17 +121,16 @@ TEST(Lv2Ui, JalvQt5ShowsAndClosesTheUiOfRepresentativePlugins) {
         environment.push_back(std::string("LD_PRELOAD=") + ZEN_SANITIZER_PRELOAD);
         environment.push_back("ASAN_OPTIONS=detect_leaks=0");
     }
-    // The stereo layout of each.
     zentest::LilvHost host(ZEN_LV2_BUNDLE);
-    std::vector<std::string> arguments = {"-a", "sh", "-c", kJalvScript, "sh"};
-    for (const char* name : {"Limiter", "Meter", "Multiband Compressor"}) {
-        const std::string prefix = std::string(zenlv2::kUriPrefix) + zenlv2::Catalog::PercentEncode(name) + ":";
-        for (const std::string& uri : host.PluginUris())
-            if (uri.rfind(prefix, 0) == 0 && uri.size() > prefix.size() + 7 &&
-                uri.compare(uri.size() - 7, 7, ":stereo") == 0)
-                arguments.push_back(uri);
+    std::map<std::string, std::string> chosen;  // plug-in URI without its layout -> the layout's URI
+    for (const std::string& uri : host.PluginUris()) {
+        const std::string plugin = uri.substr(0, uri.rfind(':'));
+        const bool stereo = uri.size() > 7 && uri.compare(uri.size() - 7, 7, ":stereo") == 0;
+        if (chosen.count(plugin) == 0 || stereo) chosen[plugin] = uri;
     }
-    ASSERT_EQ(arguments.size(), 8u);
+    std::vector<std::string> arguments = {"-a", "sh", "-c", kJalvScript, "sh"};
+    for (const auto& [plugin, uri] : chosen) arguments.push_back(uri);
+    ASSERT_GE(chosen.size(), 26u);
 
     const zentest::ZenfxResult run = zentest::RunProgram("xvfb-run", arguments, environment);
     ASSERT_EQ(run.exitCode, 0) << run.out << run.err;

@@ -19,8 +19,9 @@ class GoniometerDisplay : public TitledDisplay {
 public:
     // Points kept on screen: about 85 ms at 48 kHz.
     static constexpr std::size_t kShownPoints = 4096;
-    // Refreshes without new points that empty a full cloud.
-    static constexpr std::size_t kEmptyingRefreshes = 4;
+    // Refreshes without new points that empty a full cloud (a divisor of
+    // kShownPoints).
+    static constexpr std::size_t kEmptyingRefreshes = 16;  // about half a second
 
     // `ring`: the meter of {side, mid} points; `correlation`: a value meter
     // from -1 to +1, or -1 for none.
