@@ -11,7 +11,6 @@ namespace {
 const std::array<QColor, 5> kCurveColours = {QColor(0x4f, 0xa3, 0xd9), QColor(0xe3, 0xa4, 0x4b),
                                              QColor(0x7c, 0xc4, 0x7a), QColor(0xd0, 0x6f, 0x8f),
                                              QColor(0xa8, 0x93, 0xe0)};
-constexpr double kTitleLines = 1.3;
 
 }  // namespace
 
@@ -51,12 +50,7 @@ QSize CurveDisplay::sizeHint() const {
 void CurveDisplay::paintEvent(QPaintEvent*) {
     QPainter painter(this);
     const QFontMetricsF metrics(font());
-    const double line = metrics.height();
-    painter.fillRect(rect(), palette().color(QPalette::Window));
-    painter.setPen(palette().color(QPalette::WindowText));
-    painter.drawText(QRectF(line * 0.3, 0, width() - line * 0.6, line * kTitleLines), Qt::AlignLeft | Qt::AlignVCenter,
-                     m_title);
-    m_plot.Draw(painter, QRectF(0, line * kTitleLines, width(), height() - line * kTitleLines));
+    const double line = m_plot.DrawTitled(painter, *this, m_title);
 
     painter.setRenderHint(QPainter::Antialiasing);
     const double lineWidth = std::max(1.5, line * 0.12);

@@ -110,6 +110,18 @@ double PlotArea::ToDataX(double pixelX) const {
     return m_xMin + t * (m_xMax - m_xMin);
 }
 
+double PlotArea::DrawTitled(QPainter& painter, const QWidget& widget, const QString& title) {
+    constexpr double kTitleLines = 1.3;
+    const double line = QFontMetricsF(widget.font()).height();
+    const double width = widget.width();
+    painter.fillRect(widget.rect(), widget.palette().color(QPalette::Window));
+    painter.setPen(widget.palette().color(QPalette::WindowText));
+    painter.drawText(QRectF(line * 0.3, 0, width - line * 0.6, line * kTitleLines), Qt::AlignLeft | Qt::AlignVCenter,
+                     title);
+    Draw(painter, QRectF(0, line * kTitleLines, width, widget.height() - line * kTitleLines));
+    return line;
+}
+
 void PlotArea::Draw(QPainter& painter, const QRectF& bounds) {
     const QFontMetricsF metrics(painter.font());
     Layout(metrics, bounds);

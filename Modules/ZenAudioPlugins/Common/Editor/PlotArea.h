@@ -11,6 +11,8 @@
 #include <QString>
 #include <vector>
 
+class QWidget;
+
 class PlotArea {
 public:
     enum class Scale { Linear, Logarithmic };
@@ -21,6 +23,9 @@ public:
     // Lays out the plot inside `bounds` (room for the labels) and draws the
     // frame, grid and labels.
     void Draw(QPainter& painter, const QRectF& bounds);
+    // The plotting displays' frame: the widget's background, `title` on its
+    // first line, the plot below. Returns the height of a line of text.
+    double DrawTitled(QPainter& painter, const QWidget& widget, const QString& title);
 
     // Data <-> pixel, valid after Draw (or Layout) for the same bounds.
     void Layout(const QFontMetricsF& metrics, const QRectF& bounds);
