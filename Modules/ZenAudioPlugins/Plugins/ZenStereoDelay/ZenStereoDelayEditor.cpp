@@ -9,6 +9,7 @@
 #include "Common/Editor/EditorLayoutRegistry.h"
 #include "Common/Editor/FilterResponse.h"
 #include "Common/Editor/ZenEditor.h"
+#include "Common/WorkingValues.h"
 #include "ZenStereoDelay.h"
 
 namespace {
@@ -37,7 +38,7 @@ struct Path {
                                  ? left
                                  : ZenStereoDelay::SideTimeMs(link.GetParameter(ZenStereoDelay::kTimeR),
                                                               link.GetParameter(ZenStereoDelay::kSyncR), tempo);
-        const float feedback = link.GetParameter(ZenStereoDelay::kFeedback) / 100.0f;
+        const float feedback = zen::working::PercentToFraction(link.GetParameter(ZenStereoDelay::kFeedback));
         if (feedback > 0.0f) cuts.AddGainDb(20.0 * std::log10(feedback));
         display.SetCurve(1, feedback > 0.0f ? cuts.Curve(frequencies) : std::vector<QPointF>{},
                          QString("Per repeat (L %1 ms, R %2 ms)").arg(left, 0, 'f', 1).arg(right, 0, 'f', 1));

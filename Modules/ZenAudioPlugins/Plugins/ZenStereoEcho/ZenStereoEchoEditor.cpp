@@ -9,6 +9,7 @@
 #include "Common/Editor/EditorLayoutRegistry.h"
 #include "Common/Editor/FilterResponse.h"
 #include "Common/Editor/ZenEditor.h"
+#include "Common/WorkingValues.h"
 #include "ZenStereoEcho.h"
 
 namespace {
@@ -34,7 +35,7 @@ struct Path {
             ZenStereoEcho::TimeMs(link.GetParameter(ZenStereoEcho::kTime),
                                   static_cast<int>(std::lround(link.GetParameter(ZenStereoEcho::kSync))),
                                   link.GetParameter(ZenStereoEcho::kTempo));
-        const float feedback = link.GetParameter(ZenStereoEcho::kFeedback) / 100.0f;
+        const float feedback = zen::working::PercentToFraction(link.GetParameter(ZenStereoEcho::kFeedback));
         if (feedback > 0.0f) cuts.AddGainDb(20.0 * std::log10(feedback));
         display.SetCurve(1, feedback > 0.0f ? cuts.Curve(frequencies) : std::vector<QPointF>{},
                          QString("Per repeat (%1 ms)").arg(time, 0, 'f', 1));
