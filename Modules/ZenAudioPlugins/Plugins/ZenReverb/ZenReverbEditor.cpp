@@ -55,9 +55,9 @@ void BuildReverbEditor(ZenEditor& editor) {
 
     editor.AddGroup(QObject::tr("Room"), {"ROOM_LENGTH", "ROOM_WIDTH", "ROOM_HEIGHT", "ROOM_SIZE", "ROOM_RATIO"});
     editor.AddGroup(QObject::tr("Decay"), {"T60", "BRIGHTNESS", "MODULATION", "PRE_DELAY", "DISTANCE"});
-    editor.AddGroup(QObject::tr("Early Reflections EQ"),
+    editor.AddGroup(QObject::tr("Early Refl."),
                     {"EARLY_LOW_FREQ", "EARLY_LOW_GAIN", "EARLY_HIGH_FREQ", "EARLY_HIGH_GAIN"});
-    editor.AddGroup(QObject::tr("Late Reverb EQ"), {"LATE_LOW_FREQ", "LATE_LOW_GAIN", "LATE_HIGH_FREQ", "LATE_HIGH_GAIN"});
+    editor.AddGroup(QObject::tr("Late Rev."), {"LATE_LOW_FREQ", "LATE_LOW_GAIN", "LATE_HIGH_FREQ", "LATE_HIGH_GAIN"});
     editor.AddGroup(QObject::tr("Mix"), {"DRY_WET", "DIRECT_GAIN", "EARLY_GAIN", "LATE_GAIN"});
 }
 
