@@ -31,19 +31,20 @@ struct ShaperShape {
     double k = 1.0, bias = 0.0, biasLevel = 0.0, scale = 1.0;  // the tube's
 };
 
-using ShaperIntegralKernel = void (*)(const ShaperShape& shape, const float* pre, const float* in, double* u,
-                                      double* f2, std::size_t n);
-using ShaperMeanKernel = void (*)(const double* u, const double* f2, double smallStep, double* mean,
-                                  unsigned char* small, std::size_t n);
+using ShaperIntegralKernel = double (*)(const ShaperShape& shape, const float* pre, const float* in, double* u,
+                                        double* f2, std::size_t n);
+using ShaperMeanKernel = std::size_t (*)(const double* u, const double* f2, double smallStep, double* mean,
+                                         unsigned char* small, std::size_t n);
+using ShaperScaleKernel = void (*)(const double* mean, const float* post, float* out, std::size_t n);
 
 class ShaperIntegrals {
 public:
     ShaperIntegrals();
 
-    // u[i] = pre[i] x in[i] and f2[i] = F2(u[i]) for i < n.
-    void Evaluate(const ShaperShape& shape, const float* pre, const float* in, double* u, double* f2,
-                  std::size_t n) const noexcept {
-        m_kernel(shape, pre, in, u, f2, n);
+    // u[i] = pre[i] x in[i] and f2[i] = F2(u[i]) for i < n; returns the largest |u[i]|.
+    double Evaluate(const ShaperShape& shape, const float* pre, const float* in, double* u, double* f2,
+                    std::size_t n) const noexcept {
+        return m_kernel(shape, pre, in, u, f2, n);
     }
     // One value, the reference form's arithmetic.
     static double Evaluate(const ShaperShape& shape, double u) noexcept;
@@ -53,10 +54,15 @@ public:
     // D(a, b) = (F2(a) - F2(b)) / (a - b), for i < n (u and f2 hold n + 2
     // values). Where a step or the span is at most smallStep x (1 + |its
     // later end|) the divisions lose too many digits: small[i] is 1 and
-    // mean[i] is left for the caller, else small[i] is 0.
-    void Mean(const double* u, const double* f2, double smallStep, double* mean, unsigned char* small,
-              std::size_t n) const noexcept {
-        m_mean(u, f2, smallStep, mean, small, n);
+    // mean[i] is left for the caller, else small[i] is 0. Returns how many are 1.
+    std::size_t Mean(const double* u, const double* f2, double smallStep, double* mean, unsigned char* small,
+                     std::size_t n) const noexcept {
+        return m_mean(u, f2, smallStep, mean, small, n);
+    }
+
+    // out[i] = post[i] x mean[i] held within +-1, for i < n.
+    void Scale(const double* mean, const float* post, float* out, std::size_t n) const noexcept {
+        m_scale(mean, post, out, n);
     }
 
     system::KernelForm GetForm() const { return m_form; }
@@ -65,6 +71,7 @@ private:
     system::KernelForm m_form;
     ShaperIntegralKernel m_kernel;
     ShaperMeanKernel m_mean;
+    ShaperScaleKernel m_scale;
 };
 
 }  // namespace ora::numeric

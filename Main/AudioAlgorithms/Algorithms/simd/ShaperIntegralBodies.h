@@ -5,9 +5,10 @@
 // or zero bits).
 #pragma once
 
+#include <algorithm>
+#include <cmath>
 #include <cstdint>
 #include <cstring>
-#include <cmath>
 
 #include "Algorithms/ShaperIntegrals.h"
 
@@ -35,8 +36,13 @@ struct PlainLanes {
     static D Dup(double v) { return v; }
     static D Load(const float* p) { return static_cast<double>(*p); }
     static D LoadDouble(const double* p) { return *p; }
-    static void StoreFlags(unsigned char* p, U mask) { *p = mask != 0 ? 1 : 0; }
+    static std::size_t StoreFlags(unsigned char* p, U mask) {
+        *p = mask != 0 ? 1 : 0;
+        return *p;
+    }
     static void Store(double* p, D v) { *p = v; }
+    static void StoreFloat(float* p, D v) { *p = static_cast<float>(v); }
+    static double Lane(D v, std::size_t) { return v; }
     static U Bits(D v) {
         U b;
         std::memcpy(&b, &v, sizeof b);
@@ -138,32 +144,57 @@ inline typename L::D ShaperSecondIntegral(const ShaperShape& shape, typename L::
     return u;
 }
 
-// The kernel on lanes L, the rest one by one.
-template <class L>
-inline void ShaperIntegralBlock(const ShaperShape& shape, const float* pre, const float* in, double* u, double* f2,
-                                std::size_t n) {
-    std::size_t i = 0;
-    for (; i + L::kWidth <= n; i += L::kWidth) {
-        const typename L::D driven = L::Load(pre + i) * L::Load(in + i);
-        L::Store(u + i, driven);
-        L::Store(f2 + i, ShaperSecondIntegral<L>(shape, driven));
-    }
-    for (; i < n; ++i) {
-        u[i] = static_cast<double>(pre[i]) * static_cast<double>(in[i]);
-        f2[i] = ShaperSecondIntegral<PlainLanes>(shape, u[i]);
-    }
-}
-
 template <class L>
 inline typename L::D ShaperAbs(typename L::D v) {
     return L::FromBits(L::Bits(v) & ~kShaperSignBit);
 }
 
+// The larger of a and b, either when they are equal.
+template <class L>
+inline typename L::D ShaperMax(typename L::D a, typename L::D b) {
+    return ShaperBlend<L>(L::Mask(a < b), b, a);
+}
+
+// The kernel on lanes L, the rest one by one; returns the largest |u|.
+template <class L>
+inline double ShaperIntegralBlock(const ShaperShape& shape, const float* pre, const float* in, double* u, double* f2,
+                                  std::size_t n) {
+    std::size_t i = 0;
+    typename L::D lanePeak = L::Dup(0.0);
+    for (; i + L::kWidth <= n; i += L::kWidth) {
+        const typename L::D driven = L::Load(pre + i) * L::Load(in + i);
+        L::Store(u + i, driven);
+        L::Store(f2 + i, ShaperSecondIntegral<L>(shape, driven));
+        lanePeak = ShaperMax<L>(lanePeak, ShaperAbs<L>(driven));
+    }
+    double peak = 0.0;
+    for (std::size_t k = 0; k < L::kWidth; ++k) peak = std::max(peak, L::Lane(lanePeak, k));
+    for (; i < n; ++i) {
+        u[i] = static_cast<double>(pre[i]) * static_cast<double>(in[i]);
+        f2[i] = ShaperSecondIntegral<PlainLanes>(shape, u[i]);
+        peak = std::max(peak, std::fabs(u[i]));
+    }
+    return peak;
+}
+
+// out[i] = post[i] x mean[i] held within +-1, on lanes L, the rest one by one.
+template <class L>
+inline void ShaperScaleBlock(const double* mean, const float* post, float* out, std::size_t n) {
+    std::size_t i = 0;
+    for (; i + L::kWidth <= n; i += L::kWidth) {
+        const typename L::D m = L::LoadDouble(mean + i);
+        const typename L::D held = ShaperBlend<L>(L::Mask(m < L::Dup(-1.0)), L::Dup(-1.0),
+                                                  ShaperBlend<L>(L::Mask(L::Dup(1.0) < m), L::Dup(1.0), m));
+        L::StoreFloat(out + i, L::Load(post + i) * held);
+    }
+    for (; i < n; ++i) out[i] = static_cast<float>(static_cast<double>(post[i]) * std::clamp(mean[i], -1.0, 1.0));
+}
+
 // Lanes L of the mean, the rest one by one; each output in the same order of operations.
 template <class L>
-inline void ShaperMeanBlock(const double* u, const double* f2, double smallStep, double* mean, unsigned char* small,
-                            std::size_t n) {
-    std::size_t i = 0;
+inline std::size_t ShaperMeanBlock(const double* u, const double* f2, double smallStep, double* mean,
+                                   unsigned char* small, std::size_t n) {
+    std::size_t i = 0, flagged = 0;
     for (; i + L::kWidth <= n; i += L::kWidth) {
         using D = typename L::D;
         const D u0 = L::LoadDouble(u + i + 2), u1 = L::LoadDouble(u + i + 1), u2 = L::LoadDouble(u + i);
@@ -176,7 +207,7 @@ inline void ShaperMeanBlock(const double* u, const double* f2, double smallStep,
         // Tiny lanes divide by 1 instead; their result is not used.
         const D safe = ShaperBlend<L>(tiny, one, step01 * step12 * span);
         L::Store(mean + i, L::Dup(2.0) * ((f0 - f1) * step12 - (f1 - f2b) * step01) / safe);
-        L::StoreFlags(small + i, tiny);
+        flagged += L::StoreFlags(small + i, tiny);
     }
     for (; i < n; ++i) {
         const double u0 = u[i + 2], u1 = u[i + 1], u2 = u[i];
@@ -187,7 +218,9 @@ inline void ShaperMeanBlock(const double* u, const double* f2, double smallStep,
         const double safe = tiny ? 1.0 : step01 * step12 * span;
         mean[i] = 2.0 * ((f2[i + 2] - f2[i + 1]) * step12 - (f2[i + 1] - f2[i]) * step01) / safe;
         small[i] = tiny ? 1 : 0;
+        flagged += tiny ? 1 : 0;
     }
+    return flagged;
 }
 
 }  // namespace ora::numeric::simd

@@ -146,11 +146,11 @@ float Waveshaper::ShapeWith(History& h, float* samples, const float* pre, const 
     for (std::uint64_t done = 0; done < count; done += kChunk) {
         const std::size_t n = static_cast<std::size_t>(std::min<std::uint64_t>(kChunk, count - done));
         float* x = samples + done;
-        m_integrals.Evaluate(m_shape, pre + done, x, u.data() + 2, f2.data() + 2, n);
-        m_integrals.Mean(u.data(), f2.data(), kSmallStep, mean.data(), small.data(), n);
-        for (std::size_t i = 0; i < n; ++i) {
-            double m = mean[i];
+        peak = std::max(peak, m_integrals.Evaluate(m_shape, pre + done, x, u.data() + 2, f2.data() + 2, n));
+        const std::size_t flagged = m_integrals.Mean(u.data(), f2.data(), kSmallStep, mean.data(), small.data(), n);
+        for (std::size_t i = 0; i < n && flagged > 0; ++i) {
             if (small[i] != 0) {
+                double& m = mean[i];
                 const double u0 = u[i + 2], u1 = u[i + 1], u2 = u[i];
                 const StepMean d01 = MeanOverStep<C>(u0, u1, f2[i + 2], f2[i + 1]);
                 const StepMean d12 = MeanOverStep<C>(u1, u2, f2[i + 1], f2[i]);
@@ -168,10 +168,9 @@ float Waveshaper::ShapeWith(History& h, float* samples, const float* pre, const 
                             : Apply(C, 0.5 * (middle + u1));
                 }
             }
-            // The mean of the curve lies within its range; rounding of huge inputs may not.
-            x[i] = static_cast<float>(post[done + i] * std::clamp(m, -1.0, 1.0));
-            peak = std::max(peak, std::fabs(u[i + 2]));
         }
+        // The mean of the curve lies within its range; rounding of huge inputs may not.
+        m_integrals.Scale(mean.data(), post + done, x, n);
         u[0] = u[n];
         u[1] = u[n + 1];
         f2[0] = f2[n];

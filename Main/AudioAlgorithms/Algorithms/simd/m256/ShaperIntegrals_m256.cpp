@@ -24,9 +24,19 @@ struct WideLanes {
         std::memcpy(&v, p, sizeof v);
         return v;
     }
-    static void StoreFlags(unsigned char* p, U mask) {
-        for (int k = 0; k < 4; ++k) p[k] = mask[k] != 0 ? 1 : 0;
+    static std::size_t StoreFlags(unsigned char* p, U mask) {
+        std::size_t flagged = 0;
+        for (int k = 0; k < 4; ++k) {
+            p[k] = mask[k] != 0 ? 1 : 0;
+            flagged += p[k];
+        }
+        return flagged;
     }
+    static void StoreFloat(float* p, D v) {
+        const v4sf f = __builtin_convertvector(v, v4sf);
+        std::memcpy(p, &f, sizeof f);
+    }
+    static double Lane(D v, std::size_t k) { return v[k]; }
     static U Bits(D v) { return (U)v; }
     static D FromBits(U b) { return (D)b; }
     static D Sqrt(D v) { return __builtin_ia32_sqrtpd256(v); }
@@ -38,14 +48,18 @@ struct WideLanes {
 
 }  // namespace
 
-void ShaperIntegrals_m256(const ShaperShape& shape, const float* pre, const float* in, double* u, double* f2,
-                          std::size_t n) {
-    ShaperIntegralBlock<WideLanes>(shape, pre, in, u, f2, n);
+double ShaperIntegrals_m256(const ShaperShape& shape, const float* pre, const float* in, double* u, double* f2,
+                            std::size_t n) {
+    return ShaperIntegralBlock<WideLanes>(shape, pre, in, u, f2, n);
 }
 
-void ShaperMean_m256(const double* u, const double* f2, double smallStep, double* mean, unsigned char* small,
-                     std::size_t n) {
-    ShaperMeanBlock<WideLanes>(u, f2, smallStep, mean, small, n);
+std::size_t ShaperMean_m256(const double* u, const double* f2, double smallStep, double* mean, unsigned char* small,
+                            std::size_t n) {
+    return ShaperMeanBlock<WideLanes>(u, f2, smallStep, mean, small, n);
+}
+
+void ShaperScale_m256(const double* mean, const float* post, float* out, std::size_t n) {
+    ShaperScaleBlock<WideLanes>(mean, post, out, n);
 }
 
 }  // namespace ora::numeric::simd
