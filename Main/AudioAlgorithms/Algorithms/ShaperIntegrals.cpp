@@ -39,7 +39,7 @@ ShaperIntegrals::ShaperIntegrals() : m_form(system::ChooseKernelFormWithoutFma()
 }
 
 double ShaperIntegrals::Evaluate(const ShaperShape& shape, double u) noexcept {
-    return simd::ShaperSecondIntegral<simd::PlainLanes>(shape, u);
+    return simd::ShaperSecondIntegral<simd::PlainLanes>(shape, u, simd::ShaperLogTable::Get());
 }
 
 }  // namespace ora::numeric

@@ -3,9 +3,10 @@
 // straight lines between samples (see Waveshaper), once per sample at the
 // oversampled rate.
 //
-// No library calls: the sine is a Taylor series after reduction by the
-// nearest multiple of pi, the logarithm 2 atanh((m - 1) / (m + 1)) after
-// taking out the power of two; both accurate to a few units in the last place,
+// No library calls on the way: the sine is a Taylor series after reduction
+// by the nearest multiple of pi, the logarithm a table of 128 cells of the
+// mantissa (built once) and a short series within the cell, without a
+// division; both accurate to a few units in the last place,
 // because the shaper divides differences of these values by squared steps
 // (within ten units of the value in the last place, of 1 below it).
 // The 256-bit form (four doubles, chosen when the processor has AVX) takes

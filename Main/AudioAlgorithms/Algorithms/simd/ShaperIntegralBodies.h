@@ -16,10 +16,16 @@ namespace ora::numeric::simd {
 
 constexpr std::uint64_t kShaperSignBit = 0x8000000000000000ull;
 constexpr std::uint64_t kShaperMantissa = 0x000FFFFFFFFFFFFFull;
-constexpr std::uint64_t kShaperSqrtHalfBits = 0x3FE6A09E667F3BCDull;  // sqrt(1/2)
 constexpr std::uint64_t kShaperOneBits = 0x3FF0000000000000ull;
 constexpr std::uint64_t kShaperTwoTo52Bits = 0x4330000000000000ull;
 constexpr double kShaperTwoTo52 = 4503599627370496.0;
+// The logarithm's table: kShaperLogCells cells of [1, 2), chosen by the
+// mantissa's top bits.
+constexpr std::size_t kShaperLogCells = 128;
+constexpr int kShaperLogCellShift = 45;  // 52 mantissa bits less 7
+constexpr std::uint64_t kShaperLogCellMask = kShaperLogCells - 1;
+constexpr std::uint64_t kShaperLogCellBits = std::uint64_t{kShaperLogCells - 1} << kShaperLogCellShift;
+constexpr std::uint64_t kShaperLogHalfCellBit = std::uint64_t{1} << (kShaperLogCellShift - 1);
 constexpr double kShaperLn2Hi = 6.93147180369123816490e-01;
 constexpr double kShaperLn2Lo = 1.90821492927058770002e-10;
 // pi in three parts, the first two short enough that n times them is exact.
@@ -28,6 +34,26 @@ constexpr double kShaperPiB = 1.50995788317231926667e-7;
 constexpr double kShaperPiC = 1.07806057163162381058e-14;
 constexpr double kShaperInversePi = 0.31830988618379067154;
 constexpr double kShaperRoundingShift = 6755399441055744.0;  // 1.5 x 2^52: adding it rounds to a whole number
+
+// Per cell of the logarithm's table, its middle z: 1/z and ln z, each
+// rounded once from long double. Built on first use, read only after.
+struct ShaperLogTable {
+    double inverse[kShaperLogCells];
+    double log[kShaperLogCells];
+
+    static const ShaperLogTable& Get() {
+        static const ShaperLogTable table = [] {
+            ShaperLogTable t{};
+            for (std::size_t j = 0; j < kShaperLogCells; ++j) {
+                const long double z = 1.0L + (static_cast<long double>(j) + 0.5L) / kShaperLogCells;
+                t.inverse[j] = static_cast<double>(1.0L / z);
+                t.log[j] = static_cast<double>(std::log(z));
+            }
+            return t;
+        }();
+        return table;
+    }
+};
 
 struct PlainLanes {
     using D = double;
@@ -43,6 +69,7 @@ struct PlainLanes {
     static void Store(double* p, D v) { *p = v; }
     static void StoreFloat(float* p, D v) { *p = static_cast<float>(v); }
     static double Lane(D v, std::size_t) { return v; }
+    static D Gather(const double* table, U index) { return table[index]; }
     static U Bits(D v) {
         U b;
         std::memcpy(&b, &v, sizeof b);
@@ -85,50 +112,49 @@ inline typename L::D ShaperSine(typename L::D u) {
     return L::FromBits(L::Bits(s) ^ (L::Bits(shifted) << 63));
 }
 
-// ln a for finite a >= 1: a = 2^k m with sqrt(1/2) <= m < sqrt(2), and
-// ln m = 2 atanh(s), s = (m - 1) / (m + 1), |s| <= 0.172, to s^21.
+// ln a for finite a >= 1: a = 2^k m with 1 <= m < 2; z, the middle of the
+// 1/kShaperLogCells of [1, 2) that holds m, comes from the table with 1/z and
+// ln z, so that ln m = ln z + ln(1 + r), r = (m - z) / z within +-2^-8 and
+// ln(1 + r) a short series to r^7 (the next term is below 1e-20): no
+// division, and m - z is exact.
 template <class L>
-inline typename L::D ShaperLog(typename L::D a) {
+inline typename L::D ShaperLog(typename L::D a, const ShaperLogTable& table) {
     using D = typename L::D;
     using U = typename L::U;
-    const U shifted = L::Bits(a) + (kShaperOneBits - kShaperSqrtHalfBits);
-    const U biased = shifted >> 52;  // k + 1023
-    const D m = L::FromBits((shifted & kShaperMantissa) + kShaperSqrtHalfBits);
-    const D k = (L::FromBits(biased | kShaperTwoTo52Bits) - L::Dup(kShaperTwoTo52)) - L::Dup(1023.0);
-    const D s = (m - L::Dup(1.0)) / (m + L::Dup(1.0));
-    const D z = s * s;
-    D p = L::Dup(1.0 / 21.0);
-    p = p * z + L::Dup(1.0 / 19.0);
-    p = p * z + L::Dup(1.0 / 17.0);
-    p = p * z + L::Dup(1.0 / 15.0);
-    p = p * z + L::Dup(1.0 / 13.0);
-    p = p * z + L::Dup(1.0 / 11.0);
-    p = p * z + L::Dup(1.0 / 9.0);
-    p = p * z + L::Dup(1.0 / 7.0);
-    p = p * z + L::Dup(1.0 / 5.0);
-    p = p * z + L::Dup(1.0 / 3.0);
-    const D logM = L::Dup(2.0) * s + L::Dup(2.0) * s * z * p;
+    const U bits = L::Bits(a);
+    const U cell = (bits >> kShaperLogCellShift) & kShaperLogCellMask;
+    const D k = (L::FromBits((bits >> 52) | kShaperTwoTo52Bits) - L::Dup(kShaperTwoTo52)) - L::Dup(1023.0);
+    const D m = L::FromBits((bits & kShaperMantissa) | kShaperOneBits);
+    const D z = L::FromBits((bits & kShaperLogCellBits) | kShaperOneBits | kShaperLogHalfCellBit);
+    const D r = (m - z) * L::Gather(table.inverse, cell);
+    D p = L::Dup(1.0 / 7.0);
+    p = p * r + L::Dup(-1.0 / 6.0);
+    p = p * r + L::Dup(1.0 / 5.0);
+    p = p * r + L::Dup(-1.0 / 4.0);
+    p = p * r + L::Dup(1.0 / 3.0);
+    p = p * r + L::Dup(-1.0 / 2.0);
+    const D logM = L::Gather(table.log, cell) + (r + r * r * p);
     return k * L::Dup(kShaperLn2Hi) + (k * L::Dup(kShaperLn2Lo) + logM);
 }
 
 // R(v) = (v sqrt(1 + v^2) + asinh v) / 2, asinh from the root at hand.
 template <class L>
-inline typename L::D ShaperRootIntegral(typename L::D v) {
+inline typename L::D ShaperRootIntegral(typename L::D v, const ShaperLogTable& table) {
     using D = typename L::D;
     const D r = L::Sqrt(L::Dup(1.0) + v * v);
     const D magnitude = L::FromBits(L::Bits(v) & ~kShaperSignBit);
-    const D asinh = L::FromBits(L::Bits(ShaperLog<L>(magnitude + r)) | (L::Bits(v) & kShaperSignBit));
+    const D asinh = L::FromBits(L::Bits(ShaperLog<L>(magnitude + r, table)) | (L::Bits(v) & kShaperSignBit));
     return L::Dup(0.5) * (v * r + asinh);
 }
 
 template <class L>
-inline typename L::D ShaperSecondIntegral(const ShaperShape& shape, typename L::D u) {
+inline typename L::D ShaperSecondIntegral(const ShaperShape& shape, typename L::D u, const ShaperLogTable& table) {
     using D = typename L::D;
     switch (shape.curve) {
-        case ShaperCurve::Tape: return ShaperRootIntegral<L>(u);
+        case ShaperCurve::Tape: return ShaperRootIntegral<L>(u, table);
         case ShaperCurve::Tube: {
             const D v = L::Dup(shape.k) * u + L::Dup(shape.bias);
-            return (ShaperRootIntegral<L>(v) * L::Dup(1.0 / (shape.k * shape.k)) -
+            return (ShaperRootIntegral<L>(v, table) * L::Dup(1.0 / (shape.k * shape.k)) -
                     L::Dup(0.5 * shape.biasLevel) * u * u) *
                    L::Dup(shape.scale);
         }
@@ -159,19 +185,20 @@ inline typename L::D ShaperMax(typename L::D a, typename L::D b) {
 template <class L>
 inline double ShaperIntegralBlock(const ShaperShape& shape, const float* pre, const float* in, double* u, double* f2,
                                   std::size_t n) {
+    const ShaperLogTable& table = ShaperLogTable::Get();
     std::size_t i = 0;
     typename L::D lanePeak = L::Dup(0.0);
     for (; i + L::kWidth <= n; i += L::kWidth) {
         const typename L::D driven = L::Load(pre + i) * L::Load(in + i);
         L::Store(u + i, driven);
-        L::Store(f2 + i, ShaperSecondIntegral<L>(shape, driven));
+        L::Store(f2 + i, ShaperSecondIntegral<L>(shape, driven, table));
         lanePeak = ShaperMax<L>(lanePeak, ShaperAbs<L>(driven));
     }
     double peak = 0.0;
     for (std::size_t k = 0; k < L::kWidth; ++k) peak = std::max(peak, L::Lane(lanePeak, k));
     for (; i < n; ++i) {
         u[i] = static_cast<double>(pre[i]) * static_cast<double>(in[i]);
-        f2[i] = ShaperSecondIntegral<PlainLanes>(shape, u[i]);
+        f2[i] = ShaperSecondIntegral<PlainLanes>(shape, u[i], table);
         peak = std::max(peak, std::fabs(u[i]));
     }
     return peak;

@@ -37,6 +37,9 @@ struct WideLanes {
         std::memcpy(p, &f, sizeof f);
     }
     static double Lane(D v, std::size_t k) { return v[k]; }
+    static D Gather(const double* table, U index) {
+        return D{table[index[0]], table[index[1]], table[index[2]], table[index[3]]};
+    }
     static U Bits(D v) { return (U)v; }
     static D FromBits(U b) { return (D)b; }
     static D Sqrt(D v) { return __builtin_ia32_sqrtpd256(v); }
