@@ -147,25 +147,45 @@ inline typename L::D ShaperRootIntegral(typename L::D v, const ShaperLogTable& t
     return L::Dup(0.5) * (v * r + asinh);
 }
 
+// A shape's numbers as lanes, taken once per block.
+template <class L>
+struct ShaperTerms {
+    typename L::D k, bias, inverseKSquared, halfBiasLevel, scale;
+    explicit ShaperTerms(const ShaperShape& shape)
+        : k(L::Dup(shape.k)),
+          bias(L::Dup(shape.bias)),
+          inverseKSquared(L::Dup(1.0 / (shape.k * shape.k))),
+          halfBiasLevel(L::Dup(0.5 * shape.biasLevel)),
+          scale(L::Dup(shape.scale)) {}
+};
+
+template <class L, ShaperCurve C>
+inline typename L::D ShaperCurveIntegral(const ShaperTerms<L>& t, typename L::D u, const ShaperLogTable& table) {
+    using D = typename L::D;
+    if constexpr (C == ShaperCurve::Tape) {
+        return ShaperRootIntegral<L>(u, table);
+    } else if constexpr (C == ShaperCurve::Tube) {
+        const D v = t.k * u + t.bias;
+        return (ShaperRootIntegral<L>(v, table) * t.inverseKSquared - t.halfBiasLevel * u * u) * t.scale;
+    } else if constexpr (C == ShaperCurve::Hard) {
+        const D m = L::FromBits(L::Bits(u) & ~kShaperSignBit);
+        const D inside = u * u * u * L::Dup(1.0 / 6.0);
+        const D outsideMagnitude = L::Dup(0.5) * m * m - L::Dup(0.5) * m + L::Dup(1.0 / 6.0);
+        const D outside = L::FromBits(L::Bits(outsideMagnitude) | (L::Bits(u) & kShaperSignBit));
+        return ShaperBlend<L>(L::Mask(m <= L::Dup(1.0)), inside, outside);
+    } else {
+        return u - ShaperSine<L>(u);
+    }
+}
+
 template <class L>
 inline typename L::D ShaperSecondIntegral(const ShaperShape& shape, typename L::D u, const ShaperLogTable& table) {
-    using D = typename L::D;
+    const ShaperTerms<L> terms(shape);
     switch (shape.curve) {
-        case ShaperCurve::Tape: return ShaperRootIntegral<L>(u, table);
-        case ShaperCurve::Tube: {
-            const D v = L::Dup(shape.k) * u + L::Dup(shape.bias);
-            return (ShaperRootIntegral<L>(v, table) * L::Dup(1.0 / (shape.k * shape.k)) -
-                    L::Dup(0.5 * shape.biasLevel) * u * u) *
-                   L::Dup(shape.scale);
-        }
-        case ShaperCurve::Hard: {
-            const D m = L::FromBits(L::Bits(u) & ~kShaperSignBit);
-            const D inside = u * u * u * L::Dup(1.0 / 6.0);
-            const D outsideMagnitude = L::Dup(0.5) * m * m - L::Dup(0.5) * m + L::Dup(1.0 / 6.0);
-            const D outside = L::FromBits(L::Bits(outsideMagnitude) | (L::Bits(u) & kShaperSignBit));
-            return ShaperBlend<L>(L::Mask(m <= L::Dup(1.0)), inside, outside);
-        }
-        case ShaperCurve::FoldBack: return u - ShaperSine<L>(u);
+        case ShaperCurve::Tape: return ShaperCurveIntegral<L, ShaperCurve::Tape>(terms, u, table);
+        case ShaperCurve::Tube: return ShaperCurveIntegral<L, ShaperCurve::Tube>(terms, u, table);
+        case ShaperCurve::Hard: return ShaperCurveIntegral<L, ShaperCurve::Hard>(terms, u, table);
+        case ShaperCurve::FoldBack: return ShaperCurveIntegral<L, ShaperCurve::FoldBack>(terms, u, table);
     }
     return u;
 }
@@ -181,27 +201,53 @@ inline typename L::D ShaperMax(typename L::D a, typename L::D b) {
     return ShaperBlend<L>(L::Mask(a < b), b, a);
 }
 
-// The kernel on lanes L, the rest one by one; returns the largest |u|.
-template <class L>
-inline double ShaperIntegralBlock(const ShaperShape& shape, const float* pre, const float* in, double* u, double* f2,
-                                  std::size_t n) {
+// The kernel on lanes L, two vectors at a time so that their long chains
+// overlap, the rest one by one; returns the largest |u|.
+template <class L, ShaperCurve C>
+inline double ShaperCurveBlock(const ShaperShape& shape, const float* pre, const float* in, double* u, double* f2,
+                               std::size_t n) {
+    using D = typename L::D;
+    constexpr std::size_t W = L::kWidth;
     const ShaperLogTable& table = ShaperLogTable::Get();
+    const ShaperTerms<L> terms(shape);
     std::size_t i = 0;
-    typename L::D lanePeak = L::Dup(0.0);
-    for (; i + L::kWidth <= n; i += L::kWidth) {
-        const typename L::D driven = L::Load(pre + i) * L::Load(in + i);
+    D lanePeak = L::Dup(0.0);
+    for (; i + 2 * W <= n; i += 2 * W) {
+        const D a = L::Load(pre + i) * L::Load(in + i);
+        const D b = L::Load(pre + i + W) * L::Load(in + i + W);
+        L::Store(u + i, a);
+        L::Store(u + i + W, b);
+        L::Store(f2 + i, ShaperCurveIntegral<L, C>(terms, a, table));
+        L::Store(f2 + i + W, ShaperCurveIntegral<L, C>(terms, b, table));
+        lanePeak = ShaperMax<L>(lanePeak, ShaperMax<L>(ShaperAbs<L>(a), ShaperAbs<L>(b)));
+    }
+    for (; i + W <= n; i += W) {
+        const D driven = L::Load(pre + i) * L::Load(in + i);
         L::Store(u + i, driven);
-        L::Store(f2 + i, ShaperSecondIntegral<L>(shape, driven, table));
+        L::Store(f2 + i, ShaperCurveIntegral<L, C>(terms, driven, table));
         lanePeak = ShaperMax<L>(lanePeak, ShaperAbs<L>(driven));
     }
     double peak = 0.0;
-    for (std::size_t k = 0; k < L::kWidth; ++k) peak = std::max(peak, L::Lane(lanePeak, k));
+    for (std::size_t k = 0; k < W; ++k) peak = std::max(peak, L::Lane(lanePeak, k));
+    const ShaperTerms<PlainLanes> one(shape);
     for (; i < n; ++i) {
         u[i] = static_cast<double>(pre[i]) * static_cast<double>(in[i]);
-        f2[i] = ShaperSecondIntegral<PlainLanes>(shape, u[i], table);
+        f2[i] = ShaperCurveIntegral<PlainLanes, C>(one, u[i], table);
         peak = std::max(peak, std::fabs(u[i]));
     }
     return peak;
+}
+
+template <class L>
+inline double ShaperIntegralBlock(const ShaperShape& shape, const float* pre, const float* in, double* u, double* f2,
+                                  std::size_t n) {
+    switch (shape.curve) {
+        case ShaperCurve::Tape: return ShaperCurveBlock<L, ShaperCurve::Tape>(shape, pre, in, u, f2, n);
+        case ShaperCurve::Tube: return ShaperCurveBlock<L, ShaperCurve::Tube>(shape, pre, in, u, f2, n);
+        case ShaperCurve::Hard: return ShaperCurveBlock<L, ShaperCurve::Hard>(shape, pre, in, u, f2, n);
+        case ShaperCurve::FoldBack: return ShaperCurveBlock<L, ShaperCurve::FoldBack>(shape, pre, in, u, f2, n);
+    }
+    return 0.0;
 }
 
 // out[i] = post[i] x mean[i] held within +-1, on lanes L, the rest one by one.
