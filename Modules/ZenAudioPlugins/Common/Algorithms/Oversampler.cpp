@@ -1,6 +1,7 @@
 #include "Oversampler.h"
 
 #include <cmath>
+#include <complex>
 #include <limits>
 #include <stdexcept>
 
@@ -12,29 +13,59 @@ namespace {
 constexpr std::size_t kSharpFactor = 2;
 
 // Kaiser's estimates: the window's shape for a stop band of A dB, and the
-// length for a transition band of df cycles per sample. They fall short by
-// a dB or two at the band edge, so the filters aim this much lower.
+// length for a transition band of df cycles per sample. The window aims this
+// much lower, so that a length that reaches the stop band exists; the length
+// starts from the estimate and grows until the stop band, measured, is met
+// (short filters, and some lengths of each parity, fall short of the estimate).
 constexpr double kDesignMarginDb = 2.0;
 double KaiserBeta(double attenuationDb) { return 0.1102 * (attenuationDb + kDesignMarginDb - 8.7); }
-double KaiserLength(double attenuationDb, double df) {
-    return (attenuationDb + kDesignMarginDb - 7.95) / (14.36 * df);
-}
+double KaiserLength(double attenuationDb, double df) { return (attenuationDb - 7.95) / (14.36 * df); }
+// Points per 1/length cycles per sample (about one lobe of the stop band)
+// where the stop band is measured.
+constexpr double kPointsPerLobe = 16.0;
 
 // One filter: its band edges in the base rate's units and the multiple of
 // the base rate it runs at.
 struct Band {
     double pass, stop;
     std::size_t rate;
+    double stopDb;
 };
 
-std::size_t MinimumLength(const Band& band) {
+std::size_t EstimatedLength(const Band& band) {
     const double df = (band.stop - band.pass) / static_cast<double>(band.rate);
-    return static_cast<std::size_t>(std::ceil(KaiserLength(Oversampler::kStopbandDb, df)));
+    return static_cast<std::size_t>(std::ceil(KaiserLength(band.stopDb, df)));
 }
 
 std::vector<float> Prototype(const Band& band, std::size_t length) {
     const double cutoff = 0.5 * (band.pass + band.stop) / static_cast<double>(band.rate);
-    return ora::numeric::KaiserLowPass(length, cutoff, KaiserBeta(Oversampler::kStopbandDb));
+    return ora::numeric::KaiserLowPass(length, cutoff, KaiserBeta(band.stopDb));
+}
+
+// Whether the prototype of `length` (its float coefficients) keeps its whole
+// stop band, from the band's edge to its own Nyquist frequency, as far down as it should.
+bool MeetsStopband(const Band& band, std::size_t length) {
+    constexpr double kTwoPi = 6.283185307179586;
+    const std::vector<float> h = Prototype(band, length);
+    const double limit = std::pow(10.0, -band.stopDb / 20.0);
+    const double step = 1.0 / (kPointsPerLobe * static_cast<double>(length));
+    for (double f = band.stop / static_cast<double>(band.rate); f <= 0.5; f += step) {
+        const std::complex<double> turn = std::polar(1.0, -kTwoPi * f);
+        std::complex<double> z = 1.0, sum = 0.0;
+        for (float c : h) {
+            sum += static_cast<double>(c) * z;
+            z *= turn;
+        }
+        if (std::abs(sum) > limit) return false;
+    }
+    return true;
+}
+
+// Which lengths from `first` on, `count` of them, meet the stop band.
+std::vector<bool> LengthsMeeting(const Band& band, std::size_t first, std::size_t count) {
+    std::vector<bool> meets(count);
+    for (std::size_t i = 0; i < count; ++i) meets[i] = MeetsStopband(band, first + i);
+    return meets;
 }
 
 std::size_t CeilDiv(std::size_t a, std::size_t b) { return (a + b - 1) / b; }
@@ -42,14 +73,20 @@ std::size_t CeilDiv(std::size_t a, std::size_t b) { return (a + b - 1) / b; }
 // The interpolators stop where the images of the pass band begin, at the
 // sharp stage's rate and at the full rate; the decimators where what they
 // let through would fold onto the base band.
-Band SharpUpBand() { return {Oversampler::kPassbandEdge, Oversampler::kImageStopbandEdge, kSharpFactor}; }
+Band SharpUpBand() {
+    return {Oversampler::kPassbandEdge, Oversampler::kImageStopbandEdge, kSharpFactor, Oversampler::kStopbandDb};
+}
 Band WideUpBand(std::size_t factor) {
-    return {Oversampler::kPassbandEdge, kSharpFactor - Oversampler::kImageStopbandEdge, factor};
+    return {Oversampler::kPassbandEdge, kSharpFactor - Oversampler::kImageStopbandEdge, factor,
+            Oversampler::kWideStopbandDb};
 }
 Band WideDownBand(std::size_t factor) {
-    return {Oversampler::kPassbandEdge, kSharpFactor - Oversampler::kStopbandEdge, factor};
+    return {Oversampler::kPassbandEdge, kSharpFactor - Oversampler::kStopbandEdge, factor,
+            Oversampler::kWideStopbandDb};
 }
-Band SharpDownBand() { return {Oversampler::kPassbandEdge, Oversampler::kStopbandEdge, kSharpFactor}; }
+Band SharpDownBand() {
+    return {Oversampler::kPassbandEdge, Oversampler::kStopbandEdge, kSharpFactor, Oversampler::kStopbandDb};
+}
 
 }  // namespace
 
@@ -76,18 +113,25 @@ std::size_t Oversampler::DelayHalfSamples(std::size_t factor, std::size_t stageH
 
 Oversampler::Lengths Oversampler::Design(std::size_t factor, std::size_t stageHalfSamples) {
     const std::size_t wide = factor / kSharpFactor;
-    const std::size_t a0 = MinimumLength(SharpUpBand()), d0 = MinimumLength(SharpDownBand());
-    const std::size_t b0 = wide > 1 ? MinimumLength(WideUpBand(factor)) : 1;
-    const std::size_t c0 = wide > 1 ? MinimumLength(WideDownBand(factor)) : 1;
-    const std::size_t spread = wide > 1 ? 2 * factor : 1;
+    // Enough lengths of each filter that every delay parity has some that meet.
+    const std::size_t sharpSpread = 4 * kSharpFactor, wideSpread = wide > 1 ? 4 * factor : 1;
+    const std::size_t a0 = EstimatedLength(SharpUpBand()), d0 = EstimatedLength(SharpDownBand());
+    const std::size_t b0 = wide > 1 ? EstimatedLength(WideUpBand(factor)) : 1;
+    const std::size_t c0 = wide > 1 ? EstimatedLength(WideDownBand(factor)) : 1;
+    const std::vector<bool> aMeets = LengthsMeeting(SharpUpBand(), a0, sharpSpread);
+    const std::vector<bool> dMeets = LengthsMeeting(SharpDownBand(), d0, sharpSpread);
+    const std::vector<bool> bMeets = wide > 1 ? LengthsMeeting(WideUpBand(factor), b0, wideSpread) : std::vector<bool>{true};
+    const std::vector<bool> cMeets =
+        wide > 1 ? LengthsMeeting(WideDownBand(factor), c0, wideSpread) : std::vector<bool>{true};
     // Multiply-adds per base-rate sample of each length, its polyphase
     // padding included: the cheapest set whose delay is on whole samples.
     Lengths best;
     std::size_t bestCost = std::numeric_limits<std::size_t>::max();
-    for (std::size_t a = a0; a < a0 + 2 * kSharpFactor; ++a)
-        for (std::size_t b = b0; b < b0 + spread; ++b)
-            for (std::size_t c = c0; c < c0 + spread; ++c)
-                for (std::size_t d = d0; d < d0 + 2 * kSharpFactor; ++d) {
+    for (std::size_t a = a0; a < a0 + sharpSpread; ++a)
+        for (std::size_t b = b0; b < b0 + wideSpread; ++b)
+            for (std::size_t c = c0; c < c0 + wideSpread; ++c)
+                for (std::size_t d = d0; d < d0 + sharpSpread; ++d) {
+                    if (!aMeets[a - a0] || !bMeets[b - b0] || !cMeets[c - c0] || !dMeets[d - d0]) continue;
                     const Lengths n{a, b, c, d};
                     if (DelayHalfSamples(factor, stageHalfSamples, n) % (2 * factor) != 0) continue;
                     const std::size_t cost = kSharpFactor * CeilDiv(a, kSharpFactor) + factor * CeilDiv(b, wide) +

@@ -14,7 +14,9 @@
 // kStopbandDb; the sharp interpolator from kImageStopbandEdge on, where the
 // images of the pass band begin (what the input holds between the pass band
 // and Nyquist frequency is imaged less), which halves its length. The wide
-// stages stop where their images and aliases would reach those bands. The
+// stages stop where their images and aliases would reach those bands, and
+// kWideStopbandDb down: a hard-driven curve amplifies what the interpolator
+// leaves, and it costs them little. The
 // round trip delays by a whole number of base-rate samples, GetLatency(),
 // counting the stage's own delay of a half or a whole high-rate sample (an
 // antiderivative shaper).
@@ -40,6 +42,7 @@ public:
     static constexpr double kStopbandEdge = 0.5;   // of the base rate
     static constexpr double kImageStopbandEdge = 1.0 - kPassbandEdge;
     static constexpr double kStopbandDb = 90.0;
+    static constexpr double kWideStopbandDb = 100.0;
 
     // `factor` 2, 4 or 8; `stageHalfSamples` (0, 1 or 2): how far the owner's
     // stage delays, in half high-rate samples; the filters make up the rest.
