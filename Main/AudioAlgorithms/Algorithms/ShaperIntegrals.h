@@ -4,7 +4,7 @@
 // oversampled rate.
 //
 // No library calls on the way: the sine is a Taylor series after reduction
-// by the nearest multiple of pi, the logarithm a table of 128 cells of the
+// by the nearest multiple of pi, the logarithm a table of 256 cells of the
 // mantissa (built once) and a short series within the cell, without a
 // division; both accurate to a few units in the last place,
 // because the shaper divides differences of these values by squared steps

@@ -21,8 +21,8 @@ constexpr std::uint64_t kShaperTwoTo52Bits = 0x4330000000000000ull;
 constexpr double kShaperTwoTo52 = 4503599627370496.0;
 // The logarithm's table: kShaperLogCells cells of [1, 2), chosen by the
 // mantissa's top bits.
-constexpr std::size_t kShaperLogCells = 128;
-constexpr int kShaperLogCellShift = 45;  // 52 mantissa bits less 7
+constexpr std::size_t kShaperLogCells = 256;
+constexpr int kShaperLogCellShift = 44;  // 52 mantissa bits less 8
 constexpr std::uint64_t kShaperLogCellMask = kShaperLogCells - 1;
 constexpr std::uint64_t kShaperLogCellBits = std::uint64_t{kShaperLogCells - 1} << kShaperLogCellShift;
 constexpr std::uint64_t kShaperLogHalfCellBit = std::uint64_t{1} << (kShaperLogCellShift - 1);
@@ -114,8 +114,8 @@ inline typename L::D ShaperSine(typename L::D u) {
 
 // ln a for finite a >= 1: a = 2^k m with 1 <= m < 2; z, the middle of the
 // 1/kShaperLogCells of [1, 2) that holds m, comes from the table with 1/z and
-// ln z, so that ln m = ln z + ln(1 + r), r = (m - z) / z within +-2^-8 and
-// ln(1 + r) a short series to r^7 (the next term is below 1e-20): no
+// ln z, so that ln m = ln z + ln(1 + r), r = (m - z) / z within +-2^-9 and
+// ln(1 + r) a short series to r^5 (the next term is below 1e-17): no
 // division, and m - z is exact.
 template <class L>
 inline typename L::D ShaperLog(typename L::D a, const ShaperLogTable& table) {
@@ -127,9 +127,7 @@ inline typename L::D ShaperLog(typename L::D a, const ShaperLogTable& table) {
     const D m = L::FromBits((bits & kShaperMantissa) | kShaperOneBits);
     const D z = L::FromBits((bits & kShaperLogCellBits) | kShaperOneBits | kShaperLogHalfCellBit);
     const D r = (m - z) * L::Gather(table.inverse, cell);
-    D p = L::Dup(1.0 / 7.0);
-    p = p * r + L::Dup(-1.0 / 6.0);
-    p = p * r + L::Dup(1.0 / 5.0);
+    D p = L::Dup(1.0 / 5.0);
     p = p * r + L::Dup(-1.0 / 4.0);
     p = p * r + L::Dup(1.0 / 3.0);
     p = p * r + L::Dup(-1.0 / 2.0);

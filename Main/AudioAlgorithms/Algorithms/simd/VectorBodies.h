@@ -130,6 +130,14 @@ public:
     }
 };
 
+// Each group of M inputs to the M phase streams, the group's last sample
+// to phase 0; M a constant so that the copies unroll.
+template <std::size_t M>
+inline void SplitPhases(const float* in, float* streams, std::size_t stride, std::size_t outputs) noexcept {
+    for (std::size_t n = 0; n < outputs; ++n, in += M)
+        for (std::size_t p = 0; p < M; ++p) streams[p * stride + n] = in[M - 1 - p];
+}
+
 template <class V>
 class DownsamplerVec final : public DownsamplerImpl {
 public:
@@ -143,12 +151,18 @@ public:
         float* streams = st.scratch.data();
         // Phase p holds every M-th sample from M - 1 - p on: the history's, then the block's.
         for (std::size_t p = 0; p < M; ++p) {
-            float* stream = streams + p * stride;
             const float* h = history + (M - 1 - p);
-            for (std::size_t i = 0; i + 1 < Q; ++i) stream[i] = h[i * M];
-            const float* x = in + (M - 1 - p);
-            float* s = stream + (Q - 1);
-            for (std::size_t n = 0; n < outputs; ++n) s[n] = x[n * M];
+            for (std::size_t i = 0; i + 1 < Q; ++i) streams[p * stride + i] = h[i * M];
+        }
+        float* blockStreams = streams + (Q - 1);
+        switch (M) {
+            case 2: SplitPhases<2>(in, blockStreams, stride, outputs); break;
+            case 4: SplitPhases<4>(in, blockStreams, stride, outputs); break;
+            case 8: SplitPhases<8>(in, blockStreams, stride, outputs); break;
+            default:
+                for (std::size_t p = 0; p < M; ++p)
+                    for (std::size_t n = 0; n < outputs; ++n) blockStreams[p * stride + n] = in[n * M + M - 1 - p];
+                break;
         }
         const float* table = st.table.data();
         // Four groups of outputs at once, each summed phase by phase, tap by tap.
