@@ -25,12 +25,14 @@ struct WideLanes {
         return v;
     }
     static std::size_t StoreFlags(unsigned char* p, U mask) {
-        std::size_t flagged = 0;
-        for (int k = 0; k < 4; ++k) {
-            p[k] = mask[k] != 0 ? 1 : 0;
-            flagged += p[k];
+        // The lanes' sign bits at once; a set lane has every bit set.
+        const int bits = __builtin_ia32_movmskpd256((D)mask);
+        if (bits == 0) {
+            std::memset(p, 0, 4);
+            return 0;
         }
-        return flagged;
+        for (int k = 0; k < 4; ++k) p[k] = static_cast<unsigned char>((bits >> k) & 1);
+        return static_cast<std::size_t>(__builtin_popcount(static_cast<unsigned>(bits)));
     }
     static void StoreFloat(float* p, D v) {
         const v4sf f = __builtin_convertvector(v, v4sf);
