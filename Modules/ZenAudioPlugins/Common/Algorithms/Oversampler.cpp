@@ -3,6 +3,9 @@
 #include <cmath>
 #include <complex>
 #include <limits>
+#include <map>
+#include <mutex>
+#include <utility>
 #include <stdexcept>
 
 #include "Algorithms/KaiserLowPass.h"
@@ -112,6 +115,17 @@ std::size_t Oversampler::DelayHalfSamples(std::size_t factor, std::size_t stageH
 }
 
 Oversampler::Lengths Oversampler::Design(std::size_t factor, std::size_t stageHalfSamples) {
+    // Measuring the candidates takes milliseconds: each design once per process.
+    static std::mutex mutex;
+    static std::map<std::pair<std::size_t, std::size_t>, Lengths> designs;
+    const std::lock_guard<std::mutex> lock(mutex);
+    const auto key = std::make_pair(factor, stageHalfSamples);
+    const auto found = designs.find(key);
+    if (found != designs.end()) return found->second;
+    return designs[key] = Search(factor, stageHalfSamples);
+}
+
+Oversampler::Lengths Oversampler::Search(std::size_t factor, std::size_t stageHalfSamples) {
     const std::size_t wide = factor / kSharpFactor;
     // Enough lengths of each filter that every delay parity has some that meet.
     const std::size_t sharpSpread = 4 * kSharpFactor, wideSpread = wide > 1 ? 4 * factor : 1;

@@ -84,6 +84,7 @@ private:
         ora::AlignedBuffer<float> high;
     };
 
+    static Lengths Search(std::size_t factor, std::size_t stageHalfSamples);
     // Round-trip delay in half high-rate samples.
     static std::size_t DelayHalfSamples(std::size_t factor, std::size_t stageHalfSamples, const Lengths& lengths);
 
