@@ -5,8 +5,8 @@
 #include <limits>
 #include <map>
 #include <mutex>
-#include <utility>
 #include <stdexcept>
+#include <utility>
 
 #include "Algorithms/KaiserLowPass.h"
 
@@ -155,6 +155,7 @@ Oversampler::Lengths Oversampler::Search(std::size_t factor, std::size_t stageHa
                         best = n;
                     }
                 }
+    if (best.sharpUp == 0) throw std::logic_error("Oversampler: no filter lengths meet the stop band");
     return best;
 }
 
