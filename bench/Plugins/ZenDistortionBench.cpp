@@ -4,6 +4,17 @@
 static void BM_Distortion_Stereo48k(benchmark::State& state) { zenbench::RunPlugin(state, "Distortion", 2); }
 BENCHMARK(BM_Distortion_Stereo48k);
 
+// Every curve (0 "Tape" .. 3 "Fold-back") at the default drive and at full drive.
+static void BM_Distortion_Curve_Stereo48k(benchmark::State& state) {
+    const auto curve = static_cast<float>(state.range(0));
+    const auto drive = static_cast<float>(state.range(1));
+    zenbench::RunPlugin(state, "Distortion", 2, [&](AudioPlugin& plugin) {
+        zenbench::Set(plugin, "Curve", curve);
+        zenbench::Set(plugin, "Drive", drive);
+    });
+}
+BENCHMARK(BM_Distortion_Curve_Stereo48k)->ArgsProduct({{0, 1, 2, 3}, {12, 36}})->ArgNames({"curve", "drive"});
+
 // The fold-back curve driven hard, half dry.
 static void BM_Distortion_FoldBackParallel_Stereo48k(benchmark::State& state) {
     zenbench::RunPlugin(state, "Distortion", 2, [](AudioPlugin& plugin) {

@@ -3,9 +3,10 @@
 // straight lines between samples (see Waveshaper), once per sample at the
 // oversampled rate.
 //
-// No library calls: the sine is a Taylor series after reduction by the
-// nearest multiple of pi, the logarithm 2 atanh((m - 1) / (m + 1)) after
-// taking out the power of two; both accurate to a few units in the last place,
+// No library calls on the way: the sine is a Taylor series after reduction
+// by the nearest multiple of pi, the logarithm a table of 256 cells of the
+// mantissa (built once) and a short series within the cell, without a
+// division; both accurate to a few units in the last place,
 // because the shaper divides differences of these values by squared steps
 // (within ten units of the value in the last place, of 1 below it).
 // The 256-bit form (four doubles, chosen when the processor has AVX) takes
@@ -31,19 +32,20 @@ struct ShaperShape {
     double k = 1.0, bias = 0.0, biasLevel = 0.0, scale = 1.0;  // the tube's
 };
 
-using ShaperIntegralKernel = void (*)(const ShaperShape& shape, const float* pre, const float* in, double* u,
-                                      double* f2, std::size_t n);
-using ShaperMeanKernel = void (*)(const double* u, const double* f2, double smallStep, double* mean,
-                                  unsigned char* small, std::size_t n);
+using ShaperIntegralKernel = double (*)(const ShaperShape& shape, const float* pre, const float* in, double* u,
+                                        double* f2, std::size_t n);
+using ShaperMeanKernel = std::size_t (*)(const double* u, const double* f2, double smallStep, double* mean,
+                                         unsigned char* small, std::size_t n);
+using ShaperScaleKernel = void (*)(const double* mean, const float* post, float* out, std::size_t n);
 
 class ShaperIntegrals {
 public:
     ShaperIntegrals();
 
-    // u[i] = pre[i] x in[i] and f2[i] = F2(u[i]) for i < n.
-    void Evaluate(const ShaperShape& shape, const float* pre, const float* in, double* u, double* f2,
-                  std::size_t n) const noexcept {
-        m_kernel(shape, pre, in, u, f2, n);
+    // u[i] = pre[i] x in[i] and f2[i] = F2(u[i]) for i < n; returns the largest |u[i]|.
+    double Evaluate(const ShaperShape& shape, const float* pre, const float* in, double* u, double* f2,
+                    std::size_t n) const noexcept {
+        return m_kernel(shape, pre, in, u, f2, n);
     }
     // One value, the reference form's arithmetic.
     static double Evaluate(const ShaperShape& shape, double u) noexcept;
@@ -53,10 +55,15 @@ public:
     // D(a, b) = (F2(a) - F2(b)) / (a - b), for i < n (u and f2 hold n + 2
     // values). Where a step or the span is at most smallStep x (1 + |its
     // later end|) the divisions lose too many digits: small[i] is 1 and
-    // mean[i] is left for the caller, else small[i] is 0.
-    void Mean(const double* u, const double* f2, double smallStep, double* mean, unsigned char* small,
-              std::size_t n) const noexcept {
-        m_mean(u, f2, smallStep, mean, small, n);
+    // mean[i] is left for the caller, else small[i] is 0. Returns how many are 1.
+    std::size_t Mean(const double* u, const double* f2, double smallStep, double* mean, unsigned char* small,
+                     std::size_t n) const noexcept {
+        return m_mean(u, f2, smallStep, mean, small, n);
+    }
+
+    // out[i] = post[i] x mean[i] held within +-1, for i < n.
+    void Scale(const double* mean, const float* post, float* out, std::size_t n) const noexcept {
+        m_scale(mean, post, out, n);
     }
 
     system::KernelForm GetForm() const { return m_form; }
@@ -65,6 +72,7 @@ private:
     system::KernelForm m_form;
     ShaperIntegralKernel m_kernel;
     ShaperMeanKernel m_mean;
+    ShaperScaleKernel m_scale;
 };
 
 }  // namespace ora::numeric

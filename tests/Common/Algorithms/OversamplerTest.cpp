@@ -37,30 +37,37 @@ TEST(Oversampler, RoundTripIsFlatAcrossTheBandAndDelayedByTheLatency) {
 }
 
 TEST(Oversampler, ImagesAndAliasesStayBelowTheStopBand) {
-    constexpr std::size_t kFactor = 4, kFrames = 2400;
-    Oversampler over(kFactor);
-    over.SetChannelCount(1);
-    over.Prepare(48000.0f, kFrames);
-    // A 19 kHz tone: its images sit at 29, 67 and 77 kHz of the 192 kHz stream.
-    const std::vector<float> tone = zentest::Sine(19000.0, 48000.0, kFrames);
-    const float* high = over.Up(0, tone.data(), kFrames);
-    // Whole periods of 1 kHz (192 samples) after the filter has filled.
-    const std::size_t skip = (2 * kFactor * over.GetLatency() / 192 + 1) * 192;
-    const std::size_t length = kFrames * kFactor - skip;
-    EXPECT_NEAR(ComponentDb(high + skip, length, 19000.0 / 192000.0), 0.0, 0.01);
-    for (double image : {29000.0, 67000.0, 77000.0})
-        EXPECT_LT(ComponentDb(high + skip, length, image / 192000.0), -Oversampler::kStopbandDb + 2.0) << image;
+    constexpr std::size_t kFrames = 2400;
+    for (std::size_t factor : {4, 8}) {
+        const double highRate = 48000.0 * static_cast<double>(factor);
+        Oversampler over(factor);
+        over.SetChannelCount(1);
+        over.Prepare(48000.0f, kFrames);
+        // A 19 kHz tone: its images sit 19 kHz either side of each multiple of 48 kHz.
+        const std::vector<float> tone = zentest::Sine(19000.0, 48000.0, kFrames);
+        const float* high = over.Up(0, tone.data(), kFrames);
+        // Whole periods of 1 kHz after the filters have filled.
+        const std::size_t period = factor * 48;
+        const std::size_t skip = (2 * factor * over.GetLatency() / period + 1) * period;
+        const std::size_t length = kFrames * factor - skip;
+        EXPECT_NEAR(ComponentDb(high + skip, length, 19000.0 / highRate), 0.0, 0.01) << factor;
+        for (std::size_t m = 1; m < factor; ++m)
+            for (double image : {48000.0 * m - 19000.0, 48000.0 * m + 19000.0})
+                EXPECT_LT(ComponentDb(high + skip, length, image / highRate), -Oversampler::kStopbandDb + 2.0)
+                    << factor << "x: " << image;
 
-    // What the stage leaves above the host's Nyquist is gone after Down.
-    for (double f : {24000.0, 25000.0, 31000.0, 47000.0, 72000.0, 95000.0}) {
-        over.Reset();
-        std::vector<float> out(kFrames);
-        float* buffer = over.Up(0, out.data(), kFrames);
-        for (std::size_t n = 0; n < kFrames * kFactor; ++n)
-            buffer[n] = static_cast<float>(std::sin(2.0 * zentest::kPi * f * static_cast<double>(n) / 192000.0));
-        over.Down(0, out.data(), kFrames);
-        EXPECT_LT(zentest::ToDb(zentest::Peak(out, 2 * over.GetLatency())), -Oversampler::kStopbandDb + 2.0)
-            << f << " Hz";
+        // What the stage leaves above the host's Nyquist is gone after Down.
+        for (double f : {24000.0, 25000.0, 31000.0, 47000.0, 72000.0, 95000.0, 121000.0, 168000.0, 191000.0}) {
+            if (f >= 0.5 * highRate) continue;
+            over.Reset();
+            std::vector<float> out(kFrames);
+            float* buffer = over.Up(0, out.data(), kFrames);
+            for (std::size_t n = 0; n < kFrames * factor; ++n)
+                buffer[n] = static_cast<float>(std::sin(2.0 * zentest::kPi * f * static_cast<double>(n) / highRate));
+            over.Down(0, out.data(), kFrames);
+            EXPECT_LT(zentest::ToDb(zentest::Peak(out, 2 * over.GetLatency())), -Oversampler::kStopbandDb + 2.0)
+                << factor << "x: " << f << " Hz";
+        }
     }
 }
 

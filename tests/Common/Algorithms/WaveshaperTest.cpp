@@ -75,6 +75,13 @@ TEST(Waveshaper, OutputIsTheCurvesTriangleWeightedMeanWithinTheCeiling) {
             }
             ASSERT_NEAR(y[n], mean / 1000.0, 1e-5) << curve << " at " << ramp[n];
         }
+        // Near 0 (here 1e-7) every curve is a straight line of unit slope: the
+        // triangle's mean of the inputs themselves.
+        std::vector<float> quiet(300);
+        for (std::size_t n = 0; n < quiet.size(); ++n) quiet[n] = 1e-7f * static_cast<float>(std::sin(0.3 * n));
+        const std::vector<float> q = Shaped(curve, quiet, 1.0f, 0.5f);
+        for (std::size_t n = 2; n < quiet.size(); ++n)
+            ASSERT_NEAR(q[n], 0.5 * (4.0 * quiet[n - 1] + quiet[n] + quiet[n - 2]) / 6.0, 1e-14) << curve << " at " << n;
         // Huge inputs stay finite and within the ceiling.
         const std::vector<float> wild = Shaped(curve, {1e6f, -1e6f, 3e5f, 1e6f, 1e6f}, 1000.0f, 0.25f);
         for (float v : wild) {

@@ -5,9 +5,10 @@
 // or zero bits).
 #pragma once
 
+#include <algorithm>
+#include <cmath>
 #include <cstdint>
 #include <cstring>
-#include <cmath>
 
 #include "Algorithms/ShaperIntegrals.h"
 
@@ -15,10 +16,16 @@ namespace ora::numeric::simd {
 
 constexpr std::uint64_t kShaperSignBit = 0x8000000000000000ull;
 constexpr std::uint64_t kShaperMantissa = 0x000FFFFFFFFFFFFFull;
-constexpr std::uint64_t kShaperSqrtHalfBits = 0x3FE6A09E667F3BCDull;  // sqrt(1/2)
 constexpr std::uint64_t kShaperOneBits = 0x3FF0000000000000ull;
 constexpr std::uint64_t kShaperTwoTo52Bits = 0x4330000000000000ull;
 constexpr double kShaperTwoTo52 = 4503599627370496.0;
+// The logarithm's table: kShaperLogCells cells of [1, 2), chosen by the
+// mantissa's top bits.
+constexpr std::size_t kShaperLogCells = 256;
+constexpr int kShaperLogCellShift = 44;  // 52 mantissa bits less 8
+constexpr std::uint64_t kShaperLogCellMask = kShaperLogCells - 1;
+constexpr std::uint64_t kShaperLogCellBits = std::uint64_t{kShaperLogCells - 1} << kShaperLogCellShift;
+constexpr std::uint64_t kShaperLogHalfCellBit = std::uint64_t{1} << (kShaperLogCellShift - 1);
 constexpr double kShaperLn2Hi = 6.93147180369123816490e-01;
 constexpr double kShaperLn2Lo = 1.90821492927058770002e-10;
 // pi in three parts, the first two short enough that n times them is exact.
@@ -28,6 +35,26 @@ constexpr double kShaperPiC = 1.07806057163162381058e-14;
 constexpr double kShaperInversePi = 0.31830988618379067154;
 constexpr double kShaperRoundingShift = 6755399441055744.0;  // 1.5 x 2^52: adding it rounds to a whole number
 
+// Per cell of the logarithm's table, its middle z: 1/z and ln z, each
+// rounded once from long double. Built on first use, read only after.
+struct ShaperLogTable {
+    double inverse[kShaperLogCells];
+    double log[kShaperLogCells];
+
+    static const ShaperLogTable& Get() {
+        static const ShaperLogTable table = [] {
+            ShaperLogTable t{};
+            for (std::size_t j = 0; j < kShaperLogCells; ++j) {
+                const long double z = 1.0L + (static_cast<long double>(j) + 0.5L) / kShaperLogCells;
+                t.inverse[j] = static_cast<double>(1.0L / z);
+                t.log[j] = static_cast<double>(std::log(z));
+            }
+            return t;
+        }();
+        return table;
+    }
+};
+
 struct PlainLanes {
     using D = double;
     using U = std::uint64_t;
@@ -35,8 +62,14 @@ struct PlainLanes {
     static D Dup(double v) { return v; }
     static D Load(const float* p) { return static_cast<double>(*p); }
     static D LoadDouble(const double* p) { return *p; }
-    static void StoreFlags(unsigned char* p, U mask) { *p = mask != 0 ? 1 : 0; }
+    static std::size_t StoreFlags(unsigned char* p, U mask) {
+        *p = mask != 0 ? 1 : 0;
+        return *p;
+    }
     static void Store(double* p, D v) { *p = v; }
+    static void StoreFloat(float* p, D v) { *p = static_cast<float>(v); }
+    static double Lane(D v, std::size_t) { return v; }
+    static D Gather(const double* table, U index) { return table[index]; }
     static U Bits(D v) {
         U b;
         std::memcpy(&b, &v, sizeof b);
@@ -79,79 +112,80 @@ inline typename L::D ShaperSine(typename L::D u) {
     return L::FromBits(L::Bits(s) ^ (L::Bits(shifted) << 63));
 }
 
-// ln a for finite a >= 1: a = 2^k m with sqrt(1/2) <= m < sqrt(2), and
-// ln m = 2 atanh(s), s = (m - 1) / (m + 1), |s| <= 0.172, to s^21.
+// ln a for finite a >= 1: a = 2^k m with 1 <= m < 2; z, the middle of the
+// 1/kShaperLogCells of [1, 2) that holds m, comes from the table with 1/z and
+// ln z, so that ln m = ln z + ln(1 + r), r = (m - z) / z within +-2^-9 and
+// ln(1 + r) a short series to r^5 (the next term is below 1e-17): no
+// division, and m - z is exact.
 template <class L>
-inline typename L::D ShaperLog(typename L::D a) {
+inline typename L::D ShaperLog(typename L::D a, const ShaperLogTable& table) {
     using D = typename L::D;
     using U = typename L::U;
-    const U shifted = L::Bits(a) + (kShaperOneBits - kShaperSqrtHalfBits);
-    const U biased = shifted >> 52;  // k + 1023
-    const D m = L::FromBits((shifted & kShaperMantissa) + kShaperSqrtHalfBits);
-    const D k = (L::FromBits(biased | kShaperTwoTo52Bits) - L::Dup(kShaperTwoTo52)) - L::Dup(1023.0);
-    const D s = (m - L::Dup(1.0)) / (m + L::Dup(1.0));
-    const D z = s * s;
-    D p = L::Dup(1.0 / 21.0);
-    p = p * z + L::Dup(1.0 / 19.0);
-    p = p * z + L::Dup(1.0 / 17.0);
-    p = p * z + L::Dup(1.0 / 15.0);
-    p = p * z + L::Dup(1.0 / 13.0);
-    p = p * z + L::Dup(1.0 / 11.0);
-    p = p * z + L::Dup(1.0 / 9.0);
-    p = p * z + L::Dup(1.0 / 7.0);
-    p = p * z + L::Dup(1.0 / 5.0);
-    p = p * z + L::Dup(1.0 / 3.0);
-    const D logM = L::Dup(2.0) * s + L::Dup(2.0) * s * z * p;
+    const U bits = L::Bits(a);
+    const U cell = (bits >> kShaperLogCellShift) & kShaperLogCellMask;
+    const D k = (L::FromBits((bits >> 52) | kShaperTwoTo52Bits) - L::Dup(kShaperTwoTo52)) - L::Dup(1023.0);
+    const D m = L::FromBits((bits & kShaperMantissa) | kShaperOneBits);
+    const D z = L::FromBits((bits & kShaperLogCellBits) | kShaperOneBits | kShaperLogHalfCellBit);
+    const D r = (m - z) * L::Gather(table.inverse, cell);
+    D p = L::Dup(1.0 / 5.0);
+    p = p * r + L::Dup(-1.0 / 4.0);
+    p = p * r + L::Dup(1.0 / 3.0);
+    p = p * r + L::Dup(-1.0 / 2.0);
+    const D logM = L::Gather(table.log, cell) + (r + r * r * p);
     return k * L::Dup(kShaperLn2Hi) + (k * L::Dup(kShaperLn2Lo) + logM);
 }
 
 // R(v) = (v sqrt(1 + v^2) + asinh v) / 2, asinh from the root at hand.
 template <class L>
-inline typename L::D ShaperRootIntegral(typename L::D v) {
+inline typename L::D ShaperRootIntegral(typename L::D v, const ShaperLogTable& table) {
     using D = typename L::D;
     const D r = L::Sqrt(L::Dup(1.0) + v * v);
     const D magnitude = L::FromBits(L::Bits(v) & ~kShaperSignBit);
-    const D asinh = L::FromBits(L::Bits(ShaperLog<L>(magnitude + r)) | (L::Bits(v) & kShaperSignBit));
+    const D asinh = L::FromBits(L::Bits(ShaperLog<L>(magnitude + r, table)) | (L::Bits(v) & kShaperSignBit));
     return L::Dup(0.5) * (v * r + asinh);
 }
 
+// A shape's numbers as lanes, taken once per block.
 template <class L>
-inline typename L::D ShaperSecondIntegral(const ShaperShape& shape, typename L::D u) {
+struct ShaperTerms {
+    typename L::D k, bias, inverseKSquared, halfBiasLevel, scale;
+    explicit ShaperTerms(const ShaperShape& shape)
+        : k(L::Dup(shape.k)),
+          bias(L::Dup(shape.bias)),
+          inverseKSquared(L::Dup(1.0 / (shape.k * shape.k))),
+          halfBiasLevel(L::Dup(0.5 * shape.biasLevel)),
+          scale(L::Dup(shape.scale)) {}
+};
+
+template <class L, ShaperCurve C>
+inline typename L::D ShaperCurveIntegral(const ShaperTerms<L>& t, typename L::D u, const ShaperLogTable& table) {
     using D = typename L::D;
-    switch (shape.curve) {
-        case ShaperCurve::Tape: return ShaperRootIntegral<L>(u);
-        case ShaperCurve::Tube: {
-            const D v = L::Dup(shape.k) * u + L::Dup(shape.bias);
-            return (ShaperRootIntegral<L>(v) * L::Dup(1.0 / (shape.k * shape.k)) -
-                    L::Dup(0.5 * shape.biasLevel) * u * u) *
-                   L::Dup(shape.scale);
-        }
-        case ShaperCurve::Hard: {
-            const D m = L::FromBits(L::Bits(u) & ~kShaperSignBit);
-            const D inside = u * u * u * L::Dup(1.0 / 6.0);
-            const D outsideMagnitude = L::Dup(0.5) * m * m - L::Dup(0.5) * m + L::Dup(1.0 / 6.0);
-            const D outside = L::FromBits(L::Bits(outsideMagnitude) | (L::Bits(u) & kShaperSignBit));
-            return ShaperBlend<L>(L::Mask(m <= L::Dup(1.0)), inside, outside);
-        }
-        case ShaperCurve::FoldBack: return u - ShaperSine<L>(u);
+    if constexpr (C == ShaperCurve::Tape) {
+        return ShaperRootIntegral<L>(u, table);
+    } else if constexpr (C == ShaperCurve::Tube) {
+        const D v = t.k * u + t.bias;
+        return (ShaperRootIntegral<L>(v, table) * t.inverseKSquared - t.halfBiasLevel * u * u) * t.scale;
+    } else if constexpr (C == ShaperCurve::Hard) {
+        const D m = L::FromBits(L::Bits(u) & ~kShaperSignBit);
+        const D inside = u * u * u * L::Dup(1.0 / 6.0);
+        const D outsideMagnitude = L::Dup(0.5) * m * m - L::Dup(0.5) * m + L::Dup(1.0 / 6.0);
+        const D outside = L::FromBits(L::Bits(outsideMagnitude) | (L::Bits(u) & kShaperSignBit));
+        return ShaperBlend<L>(L::Mask(m <= L::Dup(1.0)), inside, outside);
+    } else {
+        return u - ShaperSine<L>(u);
     }
-    return u;
 }
 
-// The kernel on lanes L, the rest one by one.
 template <class L>
-inline void ShaperIntegralBlock(const ShaperShape& shape, const float* pre, const float* in, double* u, double* f2,
-                                std::size_t n) {
-    std::size_t i = 0;
-    for (; i + L::kWidth <= n; i += L::kWidth) {
-        const typename L::D driven = L::Load(pre + i) * L::Load(in + i);
-        L::Store(u + i, driven);
-        L::Store(f2 + i, ShaperSecondIntegral<L>(shape, driven));
+inline typename L::D ShaperSecondIntegral(const ShaperShape& shape, typename L::D u, const ShaperLogTable& table) {
+    const ShaperTerms<L> terms(shape);
+    switch (shape.curve) {
+        case ShaperCurve::Tape: return ShaperCurveIntegral<L, ShaperCurve::Tape>(terms, u, table);
+        case ShaperCurve::Tube: return ShaperCurveIntegral<L, ShaperCurve::Tube>(terms, u, table);
+        case ShaperCurve::Hard: return ShaperCurveIntegral<L, ShaperCurve::Hard>(terms, u, table);
+        case ShaperCurve::FoldBack: return ShaperCurveIntegral<L, ShaperCurve::FoldBack>(terms, u, table);
     }
-    for (; i < n; ++i) {
-        u[i] = static_cast<double>(pre[i]) * static_cast<double>(in[i]);
-        f2[i] = ShaperSecondIntegral<PlainLanes>(shape, u[i]);
-    }
+    return u;
 }
 
 template <class L>
@@ -159,11 +193,79 @@ inline typename L::D ShaperAbs(typename L::D v) {
     return L::FromBits(L::Bits(v) & ~kShaperSignBit);
 }
 
+// The larger of a and b, either when they are equal.
+template <class L>
+inline typename L::D ShaperMax(typename L::D a, typename L::D b) {
+    return ShaperBlend<L>(L::Mask(a < b), b, a);
+}
+
+// The kernel on lanes L, two vectors at a time so that their long chains
+// overlap, the rest one by one; returns the largest |u|.
+template <class L, ShaperCurve C>
+inline double ShaperCurveBlock(const ShaperShape& shape, const float* pre, const float* in, double* u, double* f2,
+                               std::size_t n) {
+    using D = typename L::D;
+    constexpr std::size_t W = L::kWidth;
+    const ShaperLogTable& table = ShaperLogTable::Get();
+    const ShaperTerms<L> terms(shape);
+    std::size_t i = 0;
+    D lanePeak = L::Dup(0.0);
+    for (; i + 2 * W <= n; i += 2 * W) {
+        const D a = L::Load(pre + i) * L::Load(in + i);
+        const D b = L::Load(pre + i + W) * L::Load(in + i + W);
+        L::Store(u + i, a);
+        L::Store(u + i + W, b);
+        L::Store(f2 + i, ShaperCurveIntegral<L, C>(terms, a, table));
+        L::Store(f2 + i + W, ShaperCurveIntegral<L, C>(terms, b, table));
+        lanePeak = ShaperMax<L>(lanePeak, ShaperMax<L>(ShaperAbs<L>(a), ShaperAbs<L>(b)));
+    }
+    for (; i + W <= n; i += W) {
+        const D driven = L::Load(pre + i) * L::Load(in + i);
+        L::Store(u + i, driven);
+        L::Store(f2 + i, ShaperCurveIntegral<L, C>(terms, driven, table));
+        lanePeak = ShaperMax<L>(lanePeak, ShaperAbs<L>(driven));
+    }
+    double peak = 0.0;
+    for (std::size_t k = 0; k < W; ++k) peak = std::max(peak, L::Lane(lanePeak, k));
+    const ShaperTerms<PlainLanes> one(shape);
+    for (; i < n; ++i) {
+        u[i] = static_cast<double>(pre[i]) * static_cast<double>(in[i]);
+        f2[i] = ShaperCurveIntegral<PlainLanes, C>(one, u[i], table);
+        peak = std::max(peak, std::fabs(u[i]));
+    }
+    return peak;
+}
+
+template <class L>
+inline double ShaperIntegralBlock(const ShaperShape& shape, const float* pre, const float* in, double* u, double* f2,
+                                  std::size_t n) {
+    switch (shape.curve) {
+        case ShaperCurve::Tape: return ShaperCurveBlock<L, ShaperCurve::Tape>(shape, pre, in, u, f2, n);
+        case ShaperCurve::Tube: return ShaperCurveBlock<L, ShaperCurve::Tube>(shape, pre, in, u, f2, n);
+        case ShaperCurve::Hard: return ShaperCurveBlock<L, ShaperCurve::Hard>(shape, pre, in, u, f2, n);
+        case ShaperCurve::FoldBack: return ShaperCurveBlock<L, ShaperCurve::FoldBack>(shape, pre, in, u, f2, n);
+    }
+    return 0.0;
+}
+
+// out[i] = post[i] x mean[i] held within +-1, on lanes L, the rest one by one.
+template <class L>
+inline void ShaperScaleBlock(const double* mean, const float* post, float* out, std::size_t n) {
+    std::size_t i = 0;
+    for (; i + L::kWidth <= n; i += L::kWidth) {
+        const typename L::D m = L::LoadDouble(mean + i);
+        const typename L::D held = ShaperBlend<L>(L::Mask(m < L::Dup(-1.0)), L::Dup(-1.0),
+                                                  ShaperBlend<L>(L::Mask(L::Dup(1.0) < m), L::Dup(1.0), m));
+        L::StoreFloat(out + i, L::Load(post + i) * held);
+    }
+    for (; i < n; ++i) out[i] = static_cast<float>(static_cast<double>(post[i]) * std::clamp(mean[i], -1.0, 1.0));
+}
+
 // Lanes L of the mean, the rest one by one; each output in the same order of operations.
 template <class L>
-inline void ShaperMeanBlock(const double* u, const double* f2, double smallStep, double* mean, unsigned char* small,
-                            std::size_t n) {
-    std::size_t i = 0;
+inline std::size_t ShaperMeanBlock(const double* u, const double* f2, double smallStep, double* mean,
+                                   unsigned char* small, std::size_t n) {
+    std::size_t i = 0, flagged = 0;
     for (; i + L::kWidth <= n; i += L::kWidth) {
         using D = typename L::D;
         const D u0 = L::LoadDouble(u + i + 2), u1 = L::LoadDouble(u + i + 1), u2 = L::LoadDouble(u + i);
@@ -176,7 +278,7 @@ inline void ShaperMeanBlock(const double* u, const double* f2, double smallStep,
         // Tiny lanes divide by 1 instead; their result is not used.
         const D safe = ShaperBlend<L>(tiny, one, step01 * step12 * span);
         L::Store(mean + i, L::Dup(2.0) * ((f0 - f1) * step12 - (f1 - f2b) * step01) / safe);
-        L::StoreFlags(small + i, tiny);
+        flagged += L::StoreFlags(small + i, tiny);
     }
     for (; i < n; ++i) {
         const double u0 = u[i + 2], u1 = u[i + 1], u2 = u[i];
@@ -187,7 +289,9 @@ inline void ShaperMeanBlock(const double* u, const double* f2, double smallStep,
         const double safe = tiny ? 1.0 : step01 * step12 * span;
         mean[i] = 2.0 * ((f2[i + 2] - f2[i + 1]) * step12 - (f2[i + 1] - f2[i]) * step01) / safe;
         small[i] = tiny ? 1 : 0;
+        flagged += tiny ? 1 : 0;
     }
+    return flagged;
 }
 
 }  // namespace ora::numeric::simd

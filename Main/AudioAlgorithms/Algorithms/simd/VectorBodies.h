@@ -62,6 +62,13 @@ public:
     }
 };
 
+// Each of `frames` inputs L times in a row, L a constant so that the copies unroll.
+template <std::size_t L>
+inline void RepeatEach(const float* in, float* out, std::size_t frames) noexcept {
+    for (std::size_t n = 0; n < frames; ++n, out += L)
+        for (std::size_t j = 0; j < L; ++j) out[j] = in[n];
+}
+
 template <class V>
 class UpsamplerVec final : public UpsamplerImpl {
 public:
@@ -74,8 +81,11 @@ public:
         for (std::size_t i = 0; i + 1 < P; ++i)
             for (std::size_t j = 0; j < L; ++j) xe[i * L + j] = history[i];
         const std::size_t base = (P - 1) * L;
-        for (std::size_t n = 0; n < frames; ++n)
-            for (std::size_t j = 0; j < L; ++j) xe[base + n * L + j] = in[n];
+        switch (L) {
+            case 2: RepeatEach<2>(in, xe + base, frames); break;
+            case 4: RepeatEach<4>(in, xe + base, frames); break;
+            default: RepeatEach<8>(in, xe + base, frames); break;
+        }
         const std::size_t outputs = frames * L;
         const float* table = st.table.data();
         // Four groups of outputs at once: four independent sums keep the
@@ -120,6 +130,14 @@ public:
     }
 };
 
+// Each group of M inputs to the M phase streams, the group's last sample
+// to phase 0; M a constant so that the copies unroll.
+template <std::size_t M>
+inline void SplitPhases(const float* in, float* streams, std::size_t stride, std::size_t outputs) noexcept {
+    for (std::size_t n = 0; n < outputs; ++n, in += M)
+        for (std::size_t p = 0; p < M; ++p) streams[p * stride + n] = in[M - 1 - p];
+}
+
 template <class V>
 class DownsamplerVec final : public DownsamplerImpl {
 public:
@@ -131,11 +149,20 @@ public:
         const std::size_t outputs = frames / M;
         float* history = st.history.data();
         float* streams = st.scratch.data();
-        for (std::size_t i = 0; i < Q - 1 + outputs; ++i) {
-            for (std::size_t p = 0; p < M; ++p) {
-                const std::size_t m = i * M + M - 1 - p;
-                streams[p * stride + i] = m < kept ? history[m] : in[m - kept];
-            }
+        // Phase p holds every M-th sample from M - 1 - p on: the history's, then the block's.
+        for (std::size_t p = 0; p < M; ++p) {
+            const float* h = history + (M - 1 - p);
+            for (std::size_t i = 0; i + 1 < Q; ++i) streams[p * stride + i] = h[i * M];
+        }
+        float* blockStreams = streams + (Q - 1);
+        switch (M) {
+            case 2: SplitPhases<2>(in, blockStreams, stride, outputs); break;
+            case 4: SplitPhases<4>(in, blockStreams, stride, outputs); break;
+            case 8: SplitPhases<8>(in, blockStreams, stride, outputs); break;
+            default:
+                for (std::size_t p = 0; p < M; ++p)
+                    for (std::size_t n = 0; n < outputs; ++n) blockStreams[p * stride + n] = in[n * M + M - 1 - p];
+                break;
         }
         const float* table = st.table.data();
         // Four groups of outputs at once, each summed phase by phase, tap by tap.

@@ -5,14 +5,23 @@
 // buffer in place, Down() decimates it back.
 //
 // Both directions use linear-phase Kaiser low-passes, flat (within
-// 0.001 dB) up to kPassbandEdge of the base rate and kStopbandDb down: the
-// decimator from the base Nyquist frequency on, so that nothing the stage
-// makes above the host's band folds back louder than that; the interpolator
-// from kImageStopbandEdge on, where the images of the pass band begin (what
-// the input holds between the pass band and Nyquist frequency is imaged
-// less), which halves its length. The round trip delays by a whole
-// number of base-rate samples, GetLatency(), counting the stage's own delay
-// of a half or a whole high-rate sample (an antiderivative shaper).
+// 0.001 dB) up to kPassbandEdge of the base rate and kStopbandDb down, in
+// two stages above twice the base rate: the sharp filters run at twice the
+// base rate, and a short one with a wide transition makes up the rest of
+// the factor, which costs a third of one sharp filter at the full rate.
+// The sharp decimator stops from the base Nyquist frequency on, so that
+// nothing the stage makes above the host's band folds back louder than
+// kStopbandDb; the sharp interpolator from kImageStopbandEdge on, where the
+// images of the pass band begin (what the input holds between the pass band
+// and Nyquist frequency is imaged less), which halves its length. The wide
+// stages stop where their images and aliases would reach those bands, and
+// kWideStopbandDb down: a hard-driven curve amplifies what the interpolator
+// leaves, and it costs them little. The
+// round trip delays by a whole number of base-rate samples, GetLatency(),
+// counting the stage's own delay of a half or a whole high-rate sample (an
+// antiderivative shaper).
+//
+// Construction and Prepare allocate; Up, Down and Reset do not (audio thread).
 #pragma once
 
 #include <cstdint>
@@ -33,6 +42,7 @@ public:
     static constexpr double kStopbandEdge = 0.5;   // of the base rate
     static constexpr double kImageStopbandEdge = 1.0 - kPassbandEdge;
     static constexpr double kStopbandDb = 90.0;
+    static constexpr double kWideStopbandDb = 100.0;
 
     // `factor` 2, 4 or 8; `stageHalfSamples` (0, 1 or 2): how far the owner's
     // stage delays, in half high-rate samples; the filters make up the rest.
@@ -58,23 +68,29 @@ public:
     // Round-trip delay in base-rate samples, the stage's included.
     std::uint32_t GetLatency() const;
 
-    // A low-pass at the high rate (unit DC gain) from the pass band to
-    // `stopEdge` of the base rate: the decimator's, of factor x its taps per
-    // phase coefficients; the interpolator's is shorter by the stage's half samples.
-    static std::vector<float> Prototype(std::size_t factor, std::size_t taps, double stopEdge);
-    // Taps per phase the Kaiser design needs from the pass band to `stopEdge`.
-    static std::size_t TapsPerPhase(double stopEdge);
+    // Prototype lengths of the four filters, each at its own rate.
+    struct Lengths {
+        std::size_t sharpUp = 0, wideUp = 1, wideDown = 1, sharpDown = 0;
+    };
+    // The shortest lengths that meet the stop band and leave the round trip
+    // on whole base-rate samples.
+    static Lengths Design(std::size_t factor, std::size_t stageHalfSamples);
 
 private:
     struct Channel {
-        std::unique_ptr<ora::numeric::Upsampler> up;
-        std::unique_ptr<ora::numeric::Downsampler> down;
+        std::unique_ptr<ora::numeric::Upsampler> sharpUp, wideUp;
+        std::unique_ptr<ora::numeric::Downsampler> wideDown, sharpDown;
+        ora::AlignedBuffer<float> middle;  // twice the base rate, between the stages
         ora::AlignedBuffer<float> high;
     };
 
+    static Lengths Search(std::size_t factor, std::size_t stageHalfSamples);
+    // Round-trip delay in half high-rate samples.
+    static std::size_t DelayHalfSamples(std::size_t factor, std::size_t stageHalfSamples, const Lengths& lengths);
+
     const std::size_t m_factor;
+    const std::size_t m_wideFactor;  // the wide stages' share of the factor (1: no wide stages)
     const std::size_t m_stageHalfSamples;
-    const std::size_t m_downTaps;  // per phase
-    const std::size_t m_upTaps;    // per phase, so that the two sum to an even number
+    const Lengths m_lengths;
     std::vector<Channel> m_channels;
 };

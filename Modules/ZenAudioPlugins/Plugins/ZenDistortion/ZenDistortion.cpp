@@ -122,13 +122,12 @@ void ZenDistortion::ProcessBlock(float* const* channels, std::uint32_t channelCo
 
         auto drive = Smoothed(kDrive).Track(c);
         auto ceiling = Smoothed(kCeiling).Track(c);
-        for (std::uint32_t i = 0; i < frames; ++i) {
+        float* pre = m_pre.data();
+        float* post = m_post.data();
+        for (std::uint32_t i = 0; i < frames; ++i, pre += kOversampling, post += kOversampling) {
             const double top = ceiling.Next();
-            const auto pre = static_cast<float>(drive.Next() / top);
-            for (std::size_t p = 0; p < kOversampling; ++p) {
-                m_pre[i * kOversampling + p] = pre;
-                m_post[i * kOversampling + p] = static_cast<float>(top);
-            }
+            std::fill_n(pre, kOversampling, static_cast<float>(drive.Next() / top));
+            std::fill_n(post, kOversampling, static_cast<float>(top));
         }
         float* high = m_oversampler.Up(c, x, frames);
         saturation = std::max(saturation, m_shaper.Shape(c, high, m_pre.data(), m_post.data(), frames * kOversampling));

@@ -1,8 +1,10 @@
 // ShaperIntegrals: each curve's second antiderivative against the library's
 // functions in long double, and every form against the reference bit for bit
-// (the antiderivatives, the means and which steps are too small).
+// (the antiderivatives and their peak, the means and which steps are too
+// small, the scaled output).
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cmath>
 #include <vector>
 
@@ -54,11 +56,12 @@ TEST(ShaperIntegrals, EveryFormAgreesWithTheReferenceBitForBit) {
     for (float& p : pre) p = std::fabs(p) + 0.5f;
     for (const ShaperShape& shape : kShapes) {
         std::vector<double> refU(total), refF2(total);
+        double refPeak = 0.0;
         {
             ora::system::ScopedDispatch forced(ora::system::InstructionLevel::None, false);
             ShaperIntegrals ref;
             ASSERT_EQ(ref.GetForm(), ora::system::KernelForm::Ref);
-            ref.Evaluate(shape, pre.data(), in.data(), refU.data(), refF2.data(), total);
+            refPeak = ref.Evaluate(shape, pre.data(), in.data(), refU.data(), refF2.data(), total);
         }
         for (const kerneltest::Form& form : kerneltest::AllForms()) {
             if (!kerneltest::Runnable(form)) continue;
@@ -72,16 +75,32 @@ TEST(ShaperIntegrals, EveryFormAgreesWithTheReferenceBitForBit) {
                 ora::system::ScopedDispatch plain(ora::system::InstructionLevel::None, false);
                 ShaperIntegrals().Mean(refU.data(), refF2.data(), 1e-3, refMean.data(), refSmall.data(), total - 2);
             }
+            std::size_t flagged = 0;
             for (std::size_t i = 0; i + 2 < total; ++i) {
                 ASSERT_EQ(small[i], refSmall[i]) << i;
+                flagged += small[i];
                 if (small[i] == 0) {
                     ASSERT_EQ(mean[i], refMean[i]) << i;
                 }
             }
+            EXPECT_EQ(kernel.Mean(refU.data(), refF2.data(), 1e-3, mean.data(), small.data(), total - 2), flagged);
+            // Scaled into the output, held within +-1 (the raw means of random steps stray far outside).
+            std::vector<float> scaled(total - 2), refScaled(total - 2);
+            kernel.Scale(refMean.data(), pre.data(), scaled.data(), total - 2);
+            {
+                ora::system::ScopedDispatch plain(ora::system::InstructionLevel::None, false);
+                ShaperIntegrals().Scale(refMean.data(), pre.data(), refScaled.data(), total - 2);
+            }
+            for (std::size_t i = 0; i + 2 < total; ++i) {
+                ASSERT_EQ(scaled[i], refScaled[i]) << i;
+                ASSERT_LE(std::fabs(scaled[i]), pre[i]) << i;
+            }
             std::size_t done = 0;
+            double peak = 0.0;
             for (std::size_t length : kerneltest::AwkwardLengths()) {
                 std::vector<double> u(length), f2(length);
-                kernel.Evaluate(shape, pre.data() + done, in.data() + done, u.data(), f2.data(), length);
+                peak = std::max(peak, kernel.Evaluate(shape, pre.data() + done, in.data() + done, u.data(),
+                                                      f2.data(), length));
                 for (std::size_t i = 0; i < length; ++i) {
                     ASSERT_EQ(u[i], refU[done + i]);
                     ASSERT_EQ(f2[i], refF2[done + i]) << static_cast<int>(shape.curve) << " form "
@@ -89,6 +108,7 @@ TEST(ShaperIntegrals, EveryFormAgreesWithTheReferenceBitForBit) {
                 }
                 done += length;
             }
+            EXPECT_EQ(peak, refPeak);
         }
     }
 }

@@ -24,8 +24,23 @@ struct WideLanes {
         std::memcpy(&v, p, sizeof v);
         return v;
     }
-    static void StoreFlags(unsigned char* p, U mask) {
-        for (int k = 0; k < 4; ++k) p[k] = mask[k] != 0 ? 1 : 0;
+    static std::size_t StoreFlags(unsigned char* p, U mask) {
+        // The lanes' sign bits at once; a set lane has every bit set.
+        const int bits = __builtin_ia32_movmskpd256((D)mask);
+        if (bits == 0) {
+            std::memset(p, 0, 4);
+            return 0;
+        }
+        for (int k = 0; k < 4; ++k) p[k] = static_cast<unsigned char>((bits >> k) & 1);
+        return static_cast<std::size_t>(__builtin_popcount(static_cast<unsigned>(bits)));
+    }
+    static void StoreFloat(float* p, D v) {
+        const v4sf f = __builtin_convertvector(v, v4sf);
+        std::memcpy(p, &f, sizeof f);
+    }
+    static double Lane(D v, std::size_t k) { return v[k]; }
+    static D Gather(const double* table, U index) {
+        return D{table[index[0]], table[index[1]], table[index[2]], table[index[3]]};
     }
     static U Bits(D v) { return (U)v; }
     static D FromBits(U b) { return (D)b; }
@@ -38,14 +53,18 @@ struct WideLanes {
 
 }  // namespace
 
-void ShaperIntegrals_m256(const ShaperShape& shape, const float* pre, const float* in, double* u, double* f2,
-                          std::size_t n) {
-    ShaperIntegralBlock<WideLanes>(shape, pre, in, u, f2, n);
+double ShaperIntegrals_m256(const ShaperShape& shape, const float* pre, const float* in, double* u, double* f2,
+                            std::size_t n) {
+    return ShaperIntegralBlock<WideLanes>(shape, pre, in, u, f2, n);
 }
 
-void ShaperMean_m256(const double* u, const double* f2, double smallStep, double* mean, unsigned char* small,
-                     std::size_t n) {
-    ShaperMeanBlock<WideLanes>(u, f2, smallStep, mean, small, n);
+std::size_t ShaperMean_m256(const double* u, const double* f2, double smallStep, double* mean, unsigned char* small,
+                            std::size_t n) {
+    return ShaperMeanBlock<WideLanes>(u, f2, smallStep, mean, small, n);
+}
+
+void ShaperScale_m256(const double* mean, const float* post, float* out, std::size_t n) {
+    ShaperScaleBlock<WideLanes>(mean, post, out, n);
 }
 
 }  // namespace ora::numeric::simd
