@@ -2,6 +2,7 @@
 // stream: latency, block splits, bad input, listening to what is removed.
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cmath>
 #include <random>
 
@@ -220,6 +221,7 @@ TEST(zn_denoiser, VoiceGuidanceSuppressesPausesHarder) {
     const zentest::Denoised guided = zentest::RunDenoiser(noisy, kRate, s);
     s.voiceGuided = false;
     s.floor = s.speechFloor;
+    s.speechFloorLift = 0.0f;  // the speech floor as it stands, not lifted
     const zentest::Denoised plain = zentest::RunDenoiser(noisy, kRate, s);
     // The tail is a pause.
     const std::size_t pause = static_cast<std::size_t>(0.4 * kRate), end = noisy.size();
@@ -230,4 +232,40 @@ TEST(zn_denoiser, VoiceGuidanceSuppressesPausesHarder) {
     const std::vector<float> speech = zentest::ApplyGains(clean, kRate, guided.gains);
     const std::vector<float> plainSpeech = zentest::ApplyGains(clean, kRate, plain.gains);
     EXPECT_GT(zentest::SiSdrDb(speech, clean), zentest::SiSdrDb(plainSpeech, clean) - 2.0) << "speech nearly as natural";
+}
+
+// Not voice guided, the floor rises under speech by the set share of its
+// depth and no further, while noise alone still rests at the floor: the
+// speech through the gains gains in SI-SDR, the noise before it does not.
+TEST(zn_denoiser, SpeechLiftsTheFloorNoiseAloneDoesNot) {
+    const std::vector<float>& clean = Phrase();
+    ASSERT_FALSE(clean.empty());
+    const std::vector<float> noisy = zentest::MixAtSnr(clean, zentest::MakeNoise(NoiseKind::Pink, clean.size(), kRate), 5.0);
+    nr::zn_denoise_settings s = Settings(nr::zn_denoise_settings::Estimate::Adaptive);
+    const float lifted = std::pow(s.floor, 1.0f - s.speechFloorLift);
+    const zentest::Denoised lift = zentest::RunDenoiser(noisy, kRate, s);
+    s.speechFloorLift = 0.0f;
+    const zentest::Denoised plain = zentest::RunDenoiser(noisy, kRate, s);
+
+    const auto least = [](const std::vector<float>& g) { return *std::min_element(g.begin(), g.end()); };
+    const std::size_t hop = 256, noiseBegin = static_cast<std::size_t>(0.3 * kRate) / hop,
+                      noiseEnd = static_cast<std::size_t>(kLeadSeconds * kRate) / hop - 1;
+    float highest = 0.0f;
+    for (std::size_t f = noiseBegin; f < lift.gains.size(); ++f) {  // the estimate has settled
+        const float g = least(lift.gains[f]);
+        highest = std::max(highest, g);
+        ASSERT_GE(g, 0.999f * s.floor) << f;
+        ASSERT_LE(g, 1.001f * lifted) << f;
+        ASSERT_LE(least(plain.gains[f]), 1.2f * s.floor) << f;
+        if (f >= noiseBegin && f < noiseEnd) {
+            EXPECT_LE(g, 1.12f * s.floor) << "noise alone, frame " << f;
+        }
+    }
+    EXPECT_GT(highest, 0.99f * lifted) << "speech lifts the floor all the way";
+
+    const std::size_t lead = static_cast<std::size_t>(0.3 * kRate), leadEnd = static_cast<std::size_t>(0.45 * kRate);
+    EXPECT_NEAR(zentest::ToDb(zentest::Rms(lift.output, lead, leadEnd) / zentest::Rms(plain.output, lead, leadEnd)), 0.0, 0.5);
+    const double liftSi = zentest::SiSdrDb(zentest::ApplyGains(clean, kRate, lift.gains), clean);
+    const double plainSi = zentest::SiSdrDb(zentest::ApplyGains(clean, kRate, plain.gains), clean);
+    EXPECT_GT(liftSi, plainSi + 1.0);
 }
