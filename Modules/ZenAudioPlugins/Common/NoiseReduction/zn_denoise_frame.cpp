@@ -116,13 +116,12 @@ void zn_denoise_frame::Process(ora::fft::Frame& frame, ora::fft::Context& contex
             if (s.learning) m_profile.Learn(c, power);
             m_tracker.Update(c, power, voice);
         }
-        float appliedFloor = floor;
         if (!s.voiceGuided && s.speechFloorLift > 0.0f) {
             const float lift = std::clamp(s.speechFloorLift, 0.0f, 1.0f) * VoiceBandPresence(c);
-            appliedFloor = std::pow(floor, 1.0f - lift);
-            for (std::size_t k = 0; k < m_bins; ++k) gain[k] = std::max(gain[k], appliedFloor);
+            const float lifted = std::pow(floor, 1.0f - lift);
+            for (std::size_t k = 0; k < m_bandEnd; ++k) gain[k] = std::max(gain[k], lifted);
         }
-        m_smoother.Process(c, gain, appliedFloor);
+        m_smoother.Process(c, gain, floor);
         double kept = 0.0;
         for (std::size_t k = 0; k < m_bins; ++k) {
             const float g = 1.0f - amount * (1.0f - gain[k]);

@@ -19,8 +19,8 @@ struct zn_denoise_settings {
     // estimate as it is. Below 1 by default (-4.8 dB): the voice masks what
     // noise is left beside it, and keeps its shape.
     float overSubtraction = 0.33f;
-    // Share of the floor's depth in dB given back while the voice band holds
-    // speech (0.6: a 20 dB floor stands at 8 dB under speech). Weak parts of
+    // Share of the floor's depth in dB given back up to 4 kHz while the voice
+    // band holds speech (0.6: a 20 dB floor stands at 8 dB). Weak parts of
     // a voice sunk in the noise keep their level beside the strong ones, and
     // the noise let through with them is masked. Ignored when voice guided,
     // where the speech floor does this.
