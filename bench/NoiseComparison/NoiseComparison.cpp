@@ -181,8 +181,9 @@ int main(int argc, char** argv) {
     noiseReduction.floor = 0.1f;
     nr::zn_denoise_settings learned = noiseReduction;
     learned.estimate = nr::zn_denoise_settings::Estimate::Learned;
-    nr::zn_denoise_settings voice = noiseReduction;  // "Voice Isolation" defaults: background -30 dB
+    nr::zn_denoise_settings voice = noiseReduction;  // "Voice Isolation" defaults: background -30 dB, its own sensitivity
     voice.voiceGuided = true;
+    voice.overSubtraction = 0.3f;
     voice.floor = std::pow(10.0f, -30.0f / 20.0f);
     voice.speechFloor = std::pow(10.0f, -10.0f / 20.0f);
     std::vector<Reducer> reducers = {

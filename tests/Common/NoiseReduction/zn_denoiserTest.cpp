@@ -2,6 +2,7 @@
 // stream: latency, block splits, bad input, listening to what is removed.
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cmath>
 #include <random>
 
@@ -220,6 +221,7 @@ TEST(zn_denoiser, VoiceGuidanceSuppressesPausesHarder) {
     const zentest::Denoised guided = zentest::RunDenoiser(noisy, kRate, s);
     s.voiceGuided = false;
     s.floor = s.speechFloor;
+    s.speechFloorLift = 0.0f;  // the speech floor as it stands, not lifted
     const zentest::Denoised plain = zentest::RunDenoiser(noisy, kRate, s);
     // The tail is a pause.
     const std::size_t pause = static_cast<std::size_t>(0.4 * kRate), end = noisy.size();
@@ -230,4 +232,46 @@ TEST(zn_denoiser, VoiceGuidanceSuppressesPausesHarder) {
     const std::vector<float> speech = zentest::ApplyGains(clean, kRate, guided.gains);
     const std::vector<float> plainSpeech = zentest::ApplyGains(clean, kRate, plain.gains);
     EXPECT_GT(zentest::SiSdrDb(speech, clean), zentest::SiSdrDb(plainSpeech, clean) - 2.0) << "speech nearly as natural";
+}
+
+// Not voice guided, the floor up to 4 kHz rises under speech by the set
+// share of its depth and no further, while noise alone still rests at the
+// floor and the gains above 8 kHz are untouched: the speech through the
+// gains gains in SI-SDR, the noise before it does not.
+TEST(zn_denoiser, SpeechLiftsTheFloorNoiseAloneDoesNot) {
+    const std::vector<float>& clean = Phrase();
+    ASSERT_FALSE(clean.empty());
+    const std::vector<float> noisy = zentest::MixAtSnr(clean, zentest::MakeNoise(NoiseKind::Pink, clean.size(), kRate), 5.0);
+    nr::zn_denoise_settings s = Settings(nr::zn_denoise_settings::Estimate::Adaptive);
+    const float lifted = std::pow(s.floor, 1.0f - s.speechFloorLift);
+    const zentest::Denoised lift = zentest::RunDenoiser(noisy, kRate, s);
+    s.speechFloorLift = 0.0f;
+    const zentest::Denoised plain = zentest::RunDenoiser(noisy, kRate, s);
+
+    const double binHz = kRate / 1024.0;
+    const auto voiceTop = static_cast<std::ptrdiff_t>(nr::zn_denoise_frame::kVoiceBandHz[1] / binHz);
+    const auto high = static_cast<std::ptrdiff_t>(8000.0 / binHz);
+    const auto least = [](auto begin, auto end) { return *std::min_element(begin, end); };
+    const std::size_t hop = 256, noiseBegin = static_cast<std::size_t>(0.3 * kRate) / hop,
+                      noiseEnd = static_cast<std::size_t>(kLeadSeconds * kRate) / hop - 1;
+    float highest = 0.0f;
+    for (std::size_t f = noiseBegin; f < lift.gains.size(); ++f) {  // the estimate has settled
+        const std::vector<float>& g = lift.gains[f];
+        const float voice = least(g.begin(), g.begin() + voiceTop);
+        highest = std::max(highest, voice);
+        ASSERT_GE(voice, 0.999f * s.floor) << f;
+        ASSERT_LE(voice, 1.001f * lifted) << f;
+        ASSERT_TRUE(std::equal(g.begin() + high, g.end(), plain.gains[f].begin() + high)) << f;
+        for (std::size_t k = 0; k < g.size(); ++k) ASSERT_GE(g[k], plain.gains[f][k] - 1e-6f) << f << " " << k;
+        if (f >= noiseBegin && f < noiseEnd) {
+            EXPECT_LE(voice, 1.12f * s.floor) << "noise alone, frame " << f;
+        }
+    }
+    EXPECT_GT(highest, 0.99f * lifted) << "speech lifts the floor all the way";
+
+    const std::size_t lead = static_cast<std::size_t>(0.3 * kRate), leadEnd = static_cast<std::size_t>(0.45 * kRate);
+    EXPECT_NEAR(zentest::ToDb(zentest::Rms(lift.output, lead, leadEnd) / zentest::Rms(plain.output, lead, leadEnd)), 0.0, 0.5);
+    const double liftSi = zentest::SiSdrDb(zentest::ApplyGains(clean, kRate, lift.gains), clean);
+    const double plainSi = zentest::SiSdrDb(zentest::ApplyGains(clean, kRate, plain.gains), clean);
+    EXPECT_GT(liftSi, plainSi + 1.0);
 }

@@ -62,15 +62,18 @@ void zn_denoise_frame::Apply(const zn_denoise_settings& settings) noexcept {
     m_smoother.SetAmount(settings.smoothing);
 }
 
-float zn_denoise_frame::SpeechEvidence() noexcept {
+float zn_denoise_frame::VoiceBandPresence(std::size_t channel) const noexcept {
     if (m_bandEnd <= m_bandBegin) return 1.0f;
+    const float* p = m_tracker.Presence(channel);
     float sum = 0.0f;
-    for (std::size_t c = 0; c < m_channels; ++c) {
-        const float* p = m_tracker.Presence(c);
-        for (std::size_t k = m_bandBegin; k < m_bandEnd; ++k) sum += p[k];
-    }
-    const float mean = sum / static_cast<float>(m_channels * (m_bandEnd - m_bandBegin));
-    m_evidence = std::max(std::min(1.0f, mean / kVoicedPresence), m_evidence - m_evidenceFall);
+    for (std::size_t k = m_bandBegin; k < m_bandEnd; ++k) sum += p[k];
+    return std::min(1.0f, sum / static_cast<float>(m_bandEnd - m_bandBegin) / kVoicedPresence);
+}
+
+float zn_denoise_frame::SpeechEvidence() noexcept {
+    float sum = 0.0f;
+    for (std::size_t c = 0; c < m_channels; ++c) sum += VoiceBandPresence(c);
+    m_evidence = std::max(sum / static_cast<float>(m_channels), m_evidence - m_evidenceFall);
     return m_evidence;
 }
 
@@ -112,6 +115,11 @@ void zn_denoise_frame::Process(ora::fft::Frame& frame, ora::fft::Context& contex
         if (context.analysisStart >= 0) {
             if (s.learning) m_profile.Learn(c, power);
             m_tracker.Update(c, power, voice);
+        }
+        if (!s.voiceGuided && s.speechFloorLift > 0.0f) {
+            const float lift = std::clamp(s.speechFloorLift, 0.0f, 1.0f) * VoiceBandPresence(c);
+            const float lifted = std::pow(floor, 1.0f - lift);
+            for (std::size_t k = 0; k < m_bandEnd; ++k) gain[k] = std::max(gain[k], lifted);
         }
         m_smoother.Process(c, gain, floor);
         double kept = 0.0;

@@ -10,6 +10,14 @@
 // (the detector can take noise for voice for a while after a loud passage;
 // the tracker cannot): a frame counts as voice only as far as both agree.
 // Outside voice the floor and the sensitivity move to their pause values.
+//
+// Not voice guided, the floor up to the top of the voice band rises by the
+// settings' speech lift as far as the tracker hears speech in the channel's
+// voice band in this very frame (no hold: noise after a word goes back down
+// at once). Above the band a voice has little energy to keep, and most of a
+// white noise's would pass. The lift shapes only the gain applied: the
+// speech presence and the decision-directed memory of the next frame see the
+// gain under the plain floor, so noise never lifts itself.
 #pragma once
 
 #include <cstddef>
@@ -61,6 +69,9 @@ public:
 
 private:
     float SpeechEvidence() noexcept;
+    // The tracker's presence in a channel's voice band, as a share of
+    // kVoicedPresence (0..1).
+    float VoiceBandPresence(std::size_t channel) const noexcept;
 
     zn_denoise_settings m_settings;
     std::size_t m_bandBegin = 0;

@@ -24,6 +24,7 @@ ZenVoiceIsolationControl::ZenVoiceIsolationControl() {
     InitParameters(Definitions());
     InitMeters(Meters());
     m_settings.voiceGuided = true;
+    m_settings.overSubtraction = kOverSubtraction;
 }
 
 const zen::ParameterTableDefinition& ZenVoiceIsolationControl::Definitions() {

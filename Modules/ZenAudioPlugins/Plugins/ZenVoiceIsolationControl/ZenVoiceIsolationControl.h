@@ -27,6 +27,9 @@ public:
     static constexpr float kSpectrumFloorDb = -150.0f;
     // The floor during speech, as a share of "Background" in dB.
     static constexpr float kSpeechFloorShare = 1.0f / 3.0f;
+    // The noise the gain sees during speech, linear power (-5.2 dB): tuned
+    // with the two floors, where "Noise Reduction" lifts one floor instead.
+    static constexpr float kOverSubtraction = 0.3f;
 
     ZenVoiceIsolationControl();
 
