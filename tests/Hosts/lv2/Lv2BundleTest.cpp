@@ -411,23 +411,20 @@ TEST(Lv2Bundle, StateTextIsSavedAndRestoredWithThePortsWinning) {
     EXPECT_EQ(state->restore(handle, StoredState::Retrieve, &empty, 0, nullptr), LV2_STATE_SUCCESS);
 }
 
-// An "AI" instance runs the chain its template builds at activation: with
-// AI_SFX, "Crunch" on brings the distortion in after it; off, the distortion
-// and the reverb sit bypassed and the input comes out as it went in, delayed.
+// An "AI" instance runs the chain its template builds: with AI_SFX, "Crunch"
+// on brings the distortion in after it; off, the distortion and the reverb
+// sit bypassed and the input comes out as it went in, delayed. Set before
+// activation, controls take effect then; with the host's worker, also while
+// running.
 TEST(Lv2Bundle, AiInstanceRunsItsTemplateChainThroughTheDistortion) {
     std::string key;
     for (const auto& [k, entry] : TestLibrary().Interface().GetPluginList(zen::kAudioPluginKind))
         if (entry.name == "AI") key = k;
     ASSERT_FALSE(key.empty());
     const std::string uri = zenlv2::Catalog::MakeUri(key, "stereo");
-    // Residual against the delayed input, in dB of the input.
-    const auto residualDb = [&](float crunch) {
-        LilvRun run(Host(), Host().Find(uri), 48000.0);
-        EXPECT_TRUE(run.Ok());
-        run.Control("template") = 2.0f;  // AI_SFX
-        run.Control("crunch_on") = crunch;
-        run.Activate();
-        constexpr std::uint32_t kFrames = 4800;
+    constexpr std::uint32_t kFrames = 4800;
+    // A block of sine, and the residual against the delayed input in dB of it.
+    const auto residualDb = [&](LilvRun& run) {
         for (std::uint32_t port : run.AudioPorts(true))
             for (std::uint32_t i = 0; i < kFrames; ++i)
                 run.Audio(port)[i] = 0.5f * std::sin(2.0f * static_cast<float>(M_PI) * 1000.0f * i / 48000.0f);
@@ -442,6 +439,24 @@ TEST(Lv2Bundle, AiInstanceRunsItsTemplateChainThroughTheDistortion) {
         }
         return 10.0 * std::log10(error / reference + 1e-30);
     };
-    EXPECT_LT(residualDb(0.0f), -60.0);
-    EXPECT_GT(residualDb(1.0f), -20.0);
+    for (float crunch : {0.0f, 1.0f}) {
+        LilvRun run(Host(), Host().Find(uri), 48000.0);
+        ASSERT_TRUE(run.Ok());
+        run.Control("template") = 2.0f;  // AI_SFX
+        run.Control("crunch_on") = crunch;
+        run.Activate();
+        if (crunch == 0.0f) EXPECT_LT(residualDb(run), -60.0);
+        else EXPECT_GT(residualDb(run), -20.0);
+    }
+
+    LilvRun live(Host(), Host().Find(uri), 48000.0, true);
+    ASSERT_TRUE(live.Ok());
+    live.Control("template") = 2.0f;
+    live.Activate();
+    EXPECT_LT(residualDb(live), -60.0);
+    live.Control("crunch_on") = 1.0f;
+    EXPECT_LT(residualDb(live), -60.0);  // the worker has not run yet
+    EXPECT_EQ(live.DoScheduledWork(), 1);  // one request while the last was pending
+    live.Run(kFrames);                     // past the distortion's switch-over
+    EXPECT_GT(residualDb(live), -20.0);
 }
