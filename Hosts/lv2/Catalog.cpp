@@ -93,6 +93,7 @@ std::vector<Variant> Catalog::Build(Library& library) {
             variant.outputs = layout.outputs;
             variant.layout = LayoutName(layout.inputs, layout.outputs);
             variant.uri = MakeUri(key, variant.layout);
+            variant.backgroundWork = zen::InterfaceCast<zen::BackgroundTask>(instance.get()) != nullptr;
             variants.push_back(std::move(variant));
         }
         const bool several = variants.size() - first > 1;

@@ -23,6 +23,7 @@ struct Variant {
     std::string layout;  // "mono", "stereo", "mono-to-stereo", "5.1", "7.1"
     std::string uri;     // "urn:zenaudioplugins:Soft%20Clipper:1517179747:stereo"
     std::string label;   // "Soft Clipper (Stereo)", or the plain name when it is the only layout
+    bool backgroundWork = false;  // the plug-in has a zen::BackgroundTask (it asks for LV2's worker)
 };
 
 class Catalog {

@@ -36,9 +36,19 @@ LV2_State_Status Restore(LV2_Handle handle, LV2_State_Retrieve_Function retrieve
     return static_cast<zenlv2::Instance*>(handle)->Restore(retrieve, state);
 }
 
+LV2_Worker_Status Work(LV2_Handle handle, LV2_Worker_Respond_Function, LV2_Worker_Respond_Handle, uint32_t,
+                       const void*) {
+    static_cast<zenlv2::Instance*>(handle)->Work();
+    return LV2_WORKER_SUCCESS;
+}
+LV2_Worker_Status WorkResponse(LV2_Handle, uint32_t, const void*) { return LV2_WORKER_SUCCESS; }
+
 const void* ExtensionData(const char* uri) {
     static const LV2_State_Interface state = {Save, Restore};
-    return std::strcmp(uri, LV2_STATE__interface) == 0 ? &state : nullptr;
+    static const LV2_Worker_Interface worker = {Work, WorkResponse, nullptr};
+    if (std::strcmp(uri, LV2_STATE__interface) == 0) return &state;
+    if (std::strcmp(uri, LV2_WORKER__interface) == 0) return &worker;
+    return nullptr;
 }
 
 const Offered& TheOffered() {

@@ -20,15 +20,20 @@ const void* FindFeature(const LV2_Feature* const* features, const char* uri) {
     return nullptr;
 }
 
+// The library hands the services set on its interface to each instance it
+// creates, also to those background work loads; hosts may instantiate and
+// run workers on several threads at once.
+std::mutex& LibraryServicesMutex() {
+    static std::mutex mutex;
+    return mutex;
+}
+
 }  // namespace
 
 std::unique_ptr<Instance> Instance::Create(Library& library, const Variant& variant, double sampleRate,
                                            const LV2_Feature* const* features) {
     if (!library.IsLoaded()) return nullptr;
-    // The library hands the services set on its interface to each instance
-    // it creates; hosts may instantiate from several threads at once.
-    static std::mutex creating;
-    std::lock_guard<std::mutex> lock(creating);
+    std::lock_guard<std::mutex> lock(LibraryServicesMutex());
     auto studio = std::make_unique<zen::host::StudioModel>(library.Interface());
     const std::uint32_t source = variant.inputs == 0 ? variant.outputs : variant.inputs;
     studio->AddChannel(variant.name, variant.outputs, source);
@@ -37,6 +42,10 @@ std::unique_ptr<Instance> Instance::Create(Library& library, const Variant& vari
     std::unique_ptr<Instance> self(new Instance(std::move(studio), std::move(ports), static_cast<float>(sampleRate)));
     self->ReadFeatures(features);
     self->m_studio->Prepare(sampleRate, self->m_maxBlock);
+    self->m_backgroundWork = zen::InterfaceCast<zen::BackgroundTask>(
+                                 self->m_studio->GetChannel(kChannel).chain[kSlot].instance.get()) != nullptr;
+    self->m_runLists.push_back(std::make_unique<RunList>(RunList{&self->m_audio}));
+    self->m_runList.store(self->m_runLists.back().get(), std::memory_order_release);
     return self;
 }
 
@@ -54,6 +63,7 @@ Instance::Instance(std::unique_ptr<zen::host::StudioModel> studio, PortMap ports
       m_meterPorts(m_audio.GetMeterCount(), nullptr) {}
 
 void Instance::ReadFeatures(const LV2_Feature* const* features) {
+    m_schedule = static_cast<const LV2_Worker_Schedule*>(FindFeature(features, LV2_WORKER__schedule));
     const auto* map = static_cast<const LV2_URID_Map*>(FindFeature(features, LV2_URID__map));
     if (map == nullptr) return;  // no state text and no block-length options
     m_stateKey = map->map(map->handle, kStateKey);
@@ -89,6 +99,7 @@ void Instance::ConnectPort(std::uint32_t index, void* data) noexcept {
 
 void Instance::Activate() {
     SendControls();
+    RunBackgroundWork();
     try {
         m_studio->Prepare(m_sampleRate, m_maxBlock);
     } catch (const std::exception&) {  // it was prepared at this rate once; Run then does nothing
@@ -131,10 +142,49 @@ void Instance::Run(std::uint32_t frames) noexcept {
                 if (in == nullptr) std::fill_n(m_outputs[c], frames, 0.0f);
                 else if (in != m_outputs[c]) std::copy_n(in, frames, m_outputs[c]);
             }
-            m_studio->Process(kChannel, m_outputs.data(), frames);
+            ProcessChain(m_outputs.data(), frames);
         }
     }
     PublishOutputs();
+    ScheduleWork(frames);
+}
+
+void Instance::ProcessChain(float* const* buffers, std::uint32_t frames) noexcept {
+    if (!m_studio->IsPrepared()) return;
+    for (AudioPlugin* audio : *m_runList.load(std::memory_order_acquire)) audio->Process(buffers, frames);
+}
+
+void Instance::ScheduleWork(std::uint32_t frames) noexcept {
+    if (m_schedule == nullptr || !m_backgroundWork) return;
+    m_framesSinceWork += frames;
+    if (m_framesSinceWork < static_cast<std::uint32_t>(m_sampleRate / kWorkRate) || m_workPending.exchange(true, std::memory_order_acq_rel))
+        return;
+    m_framesSinceWork = 0;
+    const char token = 0;
+    if (m_schedule->schedule_work(m_schedule->handle, sizeof(token), &token) != LV2_WORKER_SUCCESS)
+        m_workPending.store(false, std::memory_order_release);
+}
+
+void Instance::Work() noexcept {
+    RunBackgroundWork();
+    m_workPending.store(false, std::memory_order_release);
+}
+
+void Instance::RunBackgroundWork() noexcept {
+    if (!m_backgroundWork) return;
+    std::lock_guard<std::mutex> lock(m_backgroundMutex);
+    try {
+        {
+            std::lock_guard<std::mutex> services(LibraryServicesMutex());
+            m_studio->RunBackgroundTasks(kChannel, false);
+        }
+        RunList list;
+        for (const auto& slot : m_studio->GetChannel(kChannel).chain) list.push_back(slot.audio);
+        if (list == *m_runList.load(std::memory_order_acquire)) return;
+        m_runLists.push_back(std::make_unique<RunList>(std::move(list)));
+        m_runList.store(m_runLists.back().get(), std::memory_order_release);
+    } catch (const std::exception&) {  // out of memory: the chain Run walks stays as it was
+    }
 }
 
 void Instance::ProcessAliased(std::uint32_t frames) noexcept {
@@ -150,13 +200,17 @@ void Instance::ProcessAliased(std::uint32_t frames) noexcept {
             if (c < m_inputs.size()) std::copy_n(m_scratch.data() + c * kScratchFrames, length, m_chunk[c]);
             else std::fill_n(m_chunk[c], length, 0.0f);
         }
-        m_studio->Process(kChannel, m_chunk.data(), length);
+        ProcessChain(m_chunk.data(), length);
         done += length;
     }
 }
 
 void Instance::PublishOutputs() noexcept {
-    if (m_latency != nullptr) *m_latency = static_cast<float>(m_audio.GetLatency());
+    if (m_latency != nullptr) {
+        std::uint64_t latency = 0;
+        for (const AudioPlugin* audio : *m_runList.load(std::memory_order_acquire)) latency += audio->GetLatency();
+        *m_latency = static_cast<float>(latency);
+    }
     for (std::size_t m = 0; m < m_meterPorts.size(); ++m)
         if (m_meterPorts[m] != nullptr) *m_meterPorts[m] = m_audio.GetMeter(static_cast<std::uint32_t>(m));
 }
@@ -177,6 +231,7 @@ LV2_State_Status Instance::Restore(LV2_State_Retrieve_Function retrieve, LV2_Sta
     if (type != m_atomString) return LV2_STATE_ERR_BAD_TYPE;
     if (!m_audio.LoadState(std::string(text, strnlen(text, size)))) return LV2_STATE_ERR_UNKNOWN;
     m_resend.store(true, std::memory_order_release);
+    RunBackgroundWork();
     return LV2_STATE_SUCCESS;
 }
 

@@ -1,19 +1,27 @@
-// One LV2 plug-in instance: a one-slot channel of the host core's studio
-// model, in the variant's layout, driven through the ports of its PortMap.
+// One LV2 plug-in instance: a channel of the host core's studio model, in the
+// variant's layout, driven through the ports of its PortMap. The plug-in is
+// its first slot; one with background work (the "AI" rows) may load more
+// after it: the plug-ins its template configures.
 //
 // Threads as LV2 defines them: Create, Activate and the state calls on the
 // host's instantiation thread; ConnectPort and Run on the audio thread. Run
 // neither allocates nor locks: changed control values go to SetParameter
-// (atomic) and the enabled port to SetBypass.
+// (atomic) and the enabled port to SetBypass. Background work (a template
+// applying its controls, loading targets) runs in Activate and Restore and,
+// when the host offers LV2's worker, on the worker thread about 30 times a
+// second beside Run: Run walks a list of the chain's plug-ins that background
+// work replaces whole, through an atomic pointer, after it changed the chain.
 #pragma once
 
 #include <lv2/core/lv2.h>
 #include <lv2/state/state.h>
 #include <lv2/urid/urid.h>
+#include <lv2/worker/worker.h>
 
 #include <atomic>
 #include <cstdint>
 #include <memory>
+#include <mutex>
 #include <vector>
 
 #include "Catalog.h"
@@ -36,6 +44,8 @@ public:
     static constexpr std::uint32_t kScratchFrames = 256;
     // Key of the plug-in's state text in a host's saved state.
     static constexpr const char* kStateKey = "urn:zenaudioplugins:state";
+    // Background work a second, through the host's worker.
+    static constexpr double kWorkRate = 30.0;
 
     // Null when the library is not loaded; throws HostError when the plug-in
     // cannot be created in the variant's layout or run at this rate.
@@ -52,6 +62,9 @@ public:
     LV2_State_Status Save(LV2_State_Store_Function store, LV2_State_Handle handle);
     LV2_State_Status Restore(LV2_State_Retrieve_Function retrieve, LV2_State_Handle handle);
 
+    // The worker thread's call, scheduled by Run.
+    void Work() noexcept;
+
 private:
     static constexpr std::size_t kChannel = 0;
     static constexpr std::size_t kSlot = 0;
@@ -62,8 +75,13 @@ private:
     void SendControls() noexcept;
     void ProcessAliased(std::uint32_t frames) noexcept;
     void PublishOutputs() noexcept;
+    void ProcessChain(float* const* buffers, std::uint32_t frames) noexcept;
+    void ScheduleWork(std::uint32_t frames) noexcept;
+    // The slots' background tasks, then the list Run walks renewed. Never on
+    // the audio thread; one at a time.
+    void RunBackgroundWork() noexcept;
 
-    std::unique_ptr<zen::host::StudioModel> m_studio;  // one channel, one slot
+    std::unique_ptr<zen::host::StudioModel> m_studio;  // one channel
     AudioPlugin& m_audio;
     PortMap m_ports;
     float m_sampleRate;
@@ -82,6 +100,17 @@ private:
     // Set by Restore: every port value is sent again, so ports win over the
     // restored text for whatever they carry.
     std::atomic<bool> m_resend{false};
+
+    using RunList = std::vector<AudioPlugin*>;
+    std::atomic<const RunList*> m_runList{nullptr};
+    // Every list published, kept until the instance goes: Run may still be
+    // walking an old one when a new one comes.
+    std::vector<std::unique_ptr<RunList>> m_runLists;
+    std::mutex m_backgroundMutex;
+    bool m_backgroundWork = false;  // a slot has a background task
+    const LV2_Worker_Schedule* m_schedule = nullptr;
+    std::uint32_t m_framesSinceWork = 0;  // audio thread
+    std::atomic<bool> m_workPending{false};
 
     LV2_URID m_stateKey = 0;
     LV2_URID m_atomString = 0;

@@ -202,7 +202,8 @@ std::string TurtleWriter::Prefixes() {
            "@prefix state: <http://lv2plug.in/ns/ext/state#> .\n"
            "@prefix pset: <http://lv2plug.in/ns/ext/presets#> .\n"
            "@prefix ui: <http://lv2plug.in/ns/extensions/ui#> .\n"
-           "@prefix urid: <http://lv2plug.in/ns/ext/urid#> .\n\n";
+           "@prefix urid: <http://lv2plug.in/ns/ext/urid#> .\n"
+           "@prefix work: <http://lv2plug.in/ns/ext/worker#> .\n\n";
 }
 
 std::string TurtleWriter::Manifest(const std::vector<Variant>& variants, const std::string& binary,
@@ -249,9 +250,10 @@ std::string TurtleWriter::Plugin(const Variant& variant, const PortMap& ports) {
     out << Group(variant.uri, "out", variant.outputs, false);
     out << "<" << variant.uri << ">\n\ta lv2:Plugin ;\n\tdoap:name " << Quoted(variant.label)
         << " ;\n\tlv2:project <" << kProjectUri << "> ;\n"
-        << "\tlv2:optionalFeature lv2:hardRTCapable , urid:map , opts:options ;\n"
+        << "\tlv2:optionalFeature lv2:hardRTCapable , urid:map , opts:options"
+        << (variant.backgroundWork ? " , work:schedule" : "") << " ;\n"
         << "\topts:supportedOption bufsz:maxBlockLength , bufsz:nominalBlockLength ;\n"
-        << "\tlv2:extensionData state:interface ;\n";
+        << "\tlv2:extensionData state:interface" << (variant.backgroundWork ? " , work:interface" : "") << " ;\n";
     if (variant.inputs > 0) out << "\tpg:mainInput <" << variant.uri << ":in> ;\n";
     out << "\tpg:mainOutput <" << variant.uri << ":out> ;\n" << Ports(variant.uri, ports) << " .\n\n";
     return out.str();

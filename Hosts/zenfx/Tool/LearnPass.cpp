@@ -40,9 +40,10 @@ LearnRegion ParseLearnRegion(const std::string& text) {
 }
 
 void RunLearnPasses(zen::host::StudioModel& studio, std::size_t channel, const std::vector<StageSpec>& stages,
+                    const std::vector<AudioPlugin*>& plugins,
                     const std::function<std::unique_ptr<AudioSource>()>& open, std::uint32_t block) {
     const auto resetAll = [&] {
-        for (std::size_t s = 0; s < stages.size(); ++s) studio.PluginAt(channel, s).Reset();
+        for (const auto& slot : studio.GetChannel(channel).chain) slot.audio->Reset();
     };
     for (std::size_t s = 0; s < stages.size(); ++s) {
         if (stages[s].learn.empty()) continue;
@@ -57,7 +58,7 @@ void RunLearnPasses(zen::host::StudioModel& studio, std::size_t channel, const s
                                  Seconds(static_cast<double>(source->Frames()) / rate) + " s",
                              kExitUsage);
 
-        StageSettings learner(studio.PluginAt(channel, s), stages[s].plugin, [](const std::string&) {});
+        StageSettings learner(*plugins[s], stages[s].plugin, [](const std::string&) {});
         resetAll();
         learner.Set("Learn=1");
         std::vector<float> interleaved(channels * block), planar(channels * block);

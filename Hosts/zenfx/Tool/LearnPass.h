@@ -26,11 +26,13 @@ struct LearnRegion {
 // "START:END" in seconds, 0 <= START < END; throws ZenfxError (usage).
 LearnRegion ParseLearnRegion(const std::string& text);
 
-// Runs the first passes of every stage with a learn region; stage s is slot
-// s of the studio's `channel`, which is prepared. `open` gives a fresh
-// source of the input each time. Throws ZenfxError for a region outside the
-// input or a plug-in without "Learn".
+// Runs the first passes of every stage with a learn region; stage s is
+// `plugins[s]` in the studio's `channel`, which is prepared (a template may
+// have loaded more slots between stages). `open` gives a fresh source of the
+// input each time. Throws ZenfxError for a region outside the input or a
+// plug-in without "Learn".
 void RunLearnPasses(zen::host::StudioModel& studio, std::size_t channel, const std::vector<StageSpec>& stages,
+                    const std::vector<AudioPlugin*>& plugins,
                     const std::function<std::unique_ptr<AudioSource>()>& open, std::uint32_t block);
 
 }  // namespace zenfx

@@ -7,6 +7,7 @@
 #include <sstream>
 
 #include "AudioFile.h"
+#include "ChainReport.h"
 #include "Commands.h"
 #include "DemoMaterial.h"
 #include "HostCore/Settings/AtomicFile.h"
@@ -104,8 +105,16 @@ int RunProcess(PluginLibrary& library, const ProcessOptions& options) {
         StageSettings(studio.PluginAt(channel, slot), plugin.entry.name, Warn).Apply(spec.actions);
         plugins.push_back({plugin.entry.name, plugin.key, &studio.PluginAt(channel, slot)});
     }
+    // Plug-ins that set up their channel (a template loading and setting its
+    // targets) do it off the audio path, before Prepare: their settings hold
+    // from the first sample, as in an LV2 host at activation.
+    ChainReport report(studio, options.verbose);
+    studio.RunBackgroundTasks(channel, false);
+    if (!report.Records().empty()) report.Print(std::cout, channel);
     studio.Prepare(rate, options.block);
-    RunLearnPasses(studio, channel, options.stages, open, options.block);
+    std::vector<AudioPlugin*> stagePlugins;
+    for (const MeterRecorder::Plugin& plugin : plugins) stagePlugins.push_back(plugin.audio);
+    RunLearnPasses(studio, channel, options.stages, stagePlugins, open, options.block);
     const std::uint64_t latency = studio.Latency(channel);
 
     // Every destination is taken before the run, so that one that cannot be

@@ -173,8 +173,17 @@ std::vector<Lv2Preset> LilvHost::Presets(const LilvPlugin* plugin) {
     return presets;
 }
 
-LilvRun::LilvRun(LilvHost& host, const LilvPlugin* plugin, double sampleRate)
-    : m_instance(lilv_plugin_instantiate(plugin, sampleRate, host.Features())), m_ports(host.Ports(plugin)) {
+LilvRun::LilvRun(LilvHost& host, const LilvPlugin* plugin, double sampleRate, bool worker)
+    : m_ports(host.Ports(plugin)) {
+    for (const LV2_Feature* const* feature = host.Features(); *feature != nullptr; ++feature)
+        m_features.push_back(*feature);
+    if (worker) {
+        m_schedule = {this, &LilvRun::Schedule};
+        m_workerFeature = {LV2_WORKER__schedule, &m_schedule};
+        m_features.push_back(&m_workerFeature);
+    }
+    m_features.push_back(nullptr);
+    m_instance = lilv_plugin_instantiate(plugin, sampleRate, m_features.data());
     m_controls.resize(m_ports.size());
     m_audio.resize(m_ports.size());
     if (m_instance == nullptr) return;
@@ -219,5 +228,21 @@ void LilvRun::Deactivate() {
 }
 
 void LilvRun::Run(std::uint32_t frames) { lilv_instance_run(m_instance, frames); }
+
+LV2_Worker_Status LilvRun::Schedule(LV2_Worker_Schedule_Handle handle, std::uint32_t, const void*) {
+    ++static_cast<LilvRun*>(handle)->m_scheduled;
+    return LV2_WORKER_SUCCESS;
+}
+
+int LilvRun::DoScheduledWork() {
+    const auto* worker =
+        static_cast<const LV2_Worker_Interface*>(lilv_instance_get_extension_data(m_instance, LV2_WORKER__interface));
+    const auto respond = [](LV2_Worker_Respond_Handle, std::uint32_t, const void*) { return LV2_WORKER_SUCCESS; };
+    const int requests = m_scheduled;
+    const char token = 0;
+    for (; m_scheduled > 0; --m_scheduled)
+        worker->work(lilv_instance_get_handle(m_instance), respond, nullptr, sizeof(token), &token);
+    return requests;
+}
 
 }  // namespace zentest

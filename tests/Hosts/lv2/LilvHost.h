@@ -6,6 +6,7 @@
 #include <lilv/lilv.h>
 #include <lv2/options/options.h>
 #include <lv2/urid/urid.h>
+#include <lv2/worker/worker.h>
 
 #include <cstdint>
 #include <map>
@@ -76,12 +77,13 @@ private:
 };
 
 // An instance with a buffer behind every port: audio ports hold up to
-// LilvHost::kMaxBlock * 3 frames, control ports one float.
+// LilvHost::kMaxBlock * 3 frames, control ports one float. With `worker`, it
+// also offers LV2's worker: work Run schedules waits for DoScheduledWork.
 class LilvRun {
 public:
     static constexpr std::uint32_t kMaxFrames = LilvHost::kMaxBlock * 3;
 
-    LilvRun(LilvHost& host, const LilvPlugin* plugin, double sampleRate);
+    LilvRun(LilvHost& host, const LilvPlugin* plugin, double sampleRate, bool worker = false);
     ~LilvRun();
     LilvRun(const LilvRun&) = delete;
     LilvRun& operator=(const LilvRun&) = delete;
@@ -98,9 +100,18 @@ public:
     void Activate();
     void Deactivate();
     void Run(std::uint32_t frames);
+    // The work scheduled so far, done as a host's worker thread does it
+    // between blocks; the number of requests.
+    int DoScheduledWork();
     LilvInstance* Instance() { return m_instance; }
 
 private:
+    static LV2_Worker_Status Schedule(LV2_Worker_Schedule_Handle handle, std::uint32_t size, const void* data);
+
+    std::vector<const LV2_Feature*> m_features;
+    LV2_Worker_Schedule m_schedule{};
+    LV2_Feature m_workerFeature{};
+    int m_scheduled = 0;
     LilvInstance* m_instance = nullptr;
     bool m_active = false;
     std::vector<Lv2Port> m_ports;
