@@ -7,6 +7,7 @@
 #include <sstream>
 
 #include "HostCore/HostError.h"
+#include "HostCore/Levelling/LevellerEngineAction.h"
 #include "HostCore/Settings/SettingsDocument.h"
 
 namespace zen::host {
@@ -248,6 +249,7 @@ void StudioModel::RegisterActions() {
         SetBypass(callerChannel(call), ParseIndex(call.arguments[0], "slot"), flag == 1);
         return true;
     });
+    RegisterLevellerEngine(m_actions);
 }
 
 }  // namespace zen::host
