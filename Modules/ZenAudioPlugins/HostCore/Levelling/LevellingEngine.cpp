@@ -22,15 +22,21 @@ float LevellingEngine::Input(std::int64_t entry) const {
     return m_inputs[static_cast<std::size_t>(entry)];
 }
 
-bool LevellingEngine::IsSpeech(std::int64_t entry) const {
+bool LevellingEngine::IsAboveGate(std::int64_t entry) const {
     const float v = Input(entry);
     return v > kNoSpeech && v >= m_settings.Get(S::kGateThreshold);
 }
 
-bool LevellingEngine::IsGated(std::int64_t entry) const {
-    const float v = Input(entry);
-    return v > kNoSpeech && v < m_settings.Get(S::kGateThreshold);
+bool LevellingEngine::IsSpeech(std::int64_t entry) const {
+    if (!IsAboveGate(entry)) return false;
+    // Looking back only, so that an entry's kind is known with its input.
+    float loudest = Input(entry);
+    for (std::int64_t e = std::max<std::int64_t>(0, entry - kRelativeGateEntries); e < entry; ++e)
+        if (IsAboveGate(e)) loudest = std::max(loudest, Input(e));
+    return Input(entry) >= loudest - kRelativeGateLu;
 }
+
+bool LevellingEngine::IsGated(std::int64_t entry) const { return Input(entry) > kNoSpeech && !IsSpeech(entry); }
 
 bool LevellingEngine::IsPhraseStart(std::int64_t entry) const {
     return IsSpeech(entry) && (entry == 0 || !IsSpeech(entry - 1));

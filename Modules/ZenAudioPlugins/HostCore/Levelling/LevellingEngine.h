@@ -15,7 +15,8 @@
 //   monotonically between the two; without, it heads for 0 dB. "Music
 //   Ducking" lowers it in every pause, "Background Reduction" (with "Reduce
 //   Background") in pauses longer than "Hold Time", "Silence Gain" in
-//   entries whose speech lies under "Gate Threshold";
+//   entries whose speech lies under "Gate Threshold" or 15 LU under the
+//   loudest speech of the 4 s before (a bed, room tone): those are pauses;
 // - lookahead: the gain reaches each phrase's gain by the phrase's first
 //   entry, starting as late as "Max Gain Rate" allows, "Lookahead" ahead at
 //   most;
@@ -51,6 +52,10 @@ public:
     static constexpr double kEntrySeconds = levelling::kEntryFrames / 48000.0;
     // How far past an entry its answer may look.
     static constexpr std::int64_t kLookaheadEntries = levelling::kBlockEntries;
+    // "Speech" this far below the loudest speech of the 4 s before it is
+    // taken for what a voice detector hears in a music bed or room tone.
+    static constexpr float kRelativeGateLu = 15.0f;
+    static constexpr std::int64_t kRelativeGateEntries = 10;
 
     // Changes apply to the entries not answered yet.
     LevellingSettings& Settings() { return m_settings; }
@@ -78,6 +83,7 @@ private:
     };
 
     float Input(std::int64_t entry) const;
+    bool IsAboveGate(std::int64_t entry) const;
     bool IsSpeech(std::int64_t entry) const;
     bool IsGated(std::int64_t entry) const;
     bool IsPhraseStart(std::int64_t entry) const;

@@ -72,7 +72,7 @@ struct LevellerParameter {
 // named by its label; 33 and 34 are the plug-in's own switches.
 inline constexpr std::array<LevellerParameter, kParameterCount> kLevellerParameters = {{
     {"Target Offset", "dB", -10.0f, 10.0f, 0.0f, false},          // 0: added to the mode's target
-    {"Max Boost", "dB", 0.0f, 30.0f, 18.0f, false},               // 1: most the engine raises
+    {"Max Boost", "dB", 0.0f, 30.0f, 24.0f, false},               // 1: most the engine raises
     {"Max Cut", "dB", 0.0f, 30.0f, 18.0f, false},                 // 2: most it lowers
     {"Attack", "s", 0.4f, 10.0f, 1.2f, false},                    // 3: time constant of falling gain
     {"Release", "s", 0.4f, 20.0f, 2.4f, false},                   // 4: time constant of rising gain
