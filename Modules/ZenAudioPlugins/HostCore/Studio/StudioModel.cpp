@@ -198,6 +198,14 @@ bool StudioModel::Process(std::size_t channel, float* const* buffers, std::uint6
     return ok;
 }
 
+void StudioModel::RunBackgroundTasks(std::size_t channel, bool inputEnded) {
+    // A task may edit the chain through actions: walk a copy of the instances.
+    std::vector<zen::BackgroundTask*> tasks;
+    for (Slot& slot : ChannelAt(channel).chain)
+        if (auto* task = zen::InterfaceCast<zen::BackgroundTask>(slot.instance.get())) tasks.push_back(task);
+    for (zen::BackgroundTask* task : tasks) task->RunBackgroundTask(inputEnded);
+}
+
 std::uint64_t StudioModel::Latency(std::size_t channel) const {
     std::uint64_t total = 0;
     for (const Slot& slot : GetChannel(channel).chain) total += slot.audio->GetLatency();

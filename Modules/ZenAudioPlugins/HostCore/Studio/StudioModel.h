@@ -71,6 +71,10 @@ public:
     // Runs the channel's chain in place, bypassed slots included (they pass
     // the signal delayed by their latency). False when not prepared.
     bool Process(std::size_t channel, float* const* buffers, std::uint64_t frames) noexcept;
+    // Runs the background task of every slot of the channel that has one, on
+    // the calling (non-audio) thread. Slots a task inserts meanwhile wait for
+    // the next call.
+    void RunBackgroundTasks(std::size_t channel, bool inputEnded);
     // Sum of the chain's latencies, in samples.
     std::uint64_t Latency(std::size_t channel) const;
 

@@ -2,6 +2,7 @@
 #pragma once
 
 #include "AudioPlugin.h"
+#include "BackgroundTask.h"
 #include "ControlPlugin.h"
 #include "ParameterInfo.h"
 #include "PluginInstance.h"
