@@ -12,6 +12,7 @@
 #include "HostCore/Settings/AtomicFile.h"
 #include "HostCore/Studio/StudioModel.h"
 #include "LearnPass.h"
+#include "LevellingPasses.h"
 #include "MeterRecorder.h"
 #include "ProgressBar.h"
 #include "RunFiles.h"
@@ -106,6 +107,7 @@ int RunProcess(PluginLibrary& library, const ProcessOptions& options) {
     }
     studio.Prepare(rate, options.block);
     RunLearnPasses(studio, channel, options.stages, open, options.block);
+    RunLevellingPasses(studio, channel, open, options.block);
     const std::uint64_t latency = studio.Latency(channel);
 
     // Every destination is taken before the run, so that one that cannot be

@@ -1,4 +1,4 @@
-#include "LevellingFigures.h"
+#include "Support/LevellingFigures.h"
 
 #include <algorithm>
 #include <cmath>

@@ -1,4 +1,4 @@
-#include "DialogueFile.h"
+#include "Support/DialogueFile.h"
 
 #include <cmath>
 #include <string>

@@ -12,7 +12,7 @@
 
 #include <vector>
 
-#include "DialogueFile.h"
+#include "Support/DialogueFile.h"
 
 namespace zentest {
 
