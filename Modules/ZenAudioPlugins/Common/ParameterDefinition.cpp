@@ -41,6 +41,7 @@ ParameterInfo ParameterDefinition::ToInfo() const {
     info.step = step;
     info.unit = unit.toStdString();
     for (const QString& caption : choices) info.choices.push_back(caption.toStdString());
+    info.hostScale = hostScale;
     return info;
 }
 
@@ -79,11 +80,13 @@ ParameterDefinition ListParameter(const char* name, const char* label, std::init
     return d;
 }
 
-ParameterTableDefinition MakeParameterTable(const char* className, std::vector<ParameterDefinition> rows) {
+ParameterTableDefinition MakeParameterTable(const char* className, std::vector<ParameterDefinition> rows,
+                                            HostScale hostScale) {
     const QString prefix = QString::fromLatin1(className) + QStringLiteral("::");
     for (std::size_t i = 0; i < rows.size(); ++i) {
         ParameterDefinition& d = rows[i];
         d.index = i;
+        if (hostScale != HostScale::OwnValue) d.hostScale = hostScale;
         d.identifier = prefix + d.identifier;
         d.label = QCoreApplication::translate(className, d.label.toUtf8().constData());
         for (QString& caption : d.choices) caption = QCoreApplication::translate(className, caption.toUtf8().constData());

@@ -42,6 +42,7 @@ struct ParameterDefinition {
     // conversion to the smoothed working value.
     WorkingValue smoothing = nullptr;
     bool smoothedPerChannel = false;  // one smoothed element per channel, or one in all
+    HostScale hostScale = HostScale::OwnValue;  // how "SetIntParameter" reads this parameter
 
     bool IsSmoothed() const { return smoothing != nullptr; }
     // This row, smoothed through `working`: one element per channel, or one.
@@ -74,6 +75,9 @@ ParameterDefinition SwitchParameter(const char* name, const char* label, float d
 ParameterDefinition ListParameter(const char* name, const char* label, std::initializer_list<const char*> captions,
                                   float defaultValue);
 
-ParameterTableDefinition MakeParameterTable(const char* className, std::vector<ParameterDefinition> rows);
+// `hostScale`: the scale of every row (a class whose host integers are all
+// places along the controls declares PerMille once).
+ParameterTableDefinition MakeParameterTable(const char* className, std::vector<ParameterDefinition> rows,
+                                            HostScale hostScale = HostScale::OwnValue);
 
 }  // namespace zen

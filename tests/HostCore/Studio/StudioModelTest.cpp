@@ -106,3 +106,141 @@ TEST(StudioModel, PluginsActOnTheirOwnChannelThroughHostActions) {
     EXPECT_FALSE(Call(studio, dialog, "AudioLevellerEngine", {"NormaliseClips", "0", "1", "2"}, &result));
     EXPECT_EQ(result, "unknown action 'AudioLevellerEngine'");
 }
+
+namespace {
+
+// An action as the plug-in in `slot` sends it, through its own services.
+bool CallFrom(StudioModel& studio, std::size_t channel, std::size_t slot, const char* action,
+              std::vector<const char*> arguments, std::string* result = nullptr) {
+    char buffer[256] = {};
+    const bool ok = ActionServices::CallAction(studio.GetChannel(channel).chain[slot].services->Services(), action,
+                                               arguments.data(), static_cast<std::uint32_t>(arguments.size()),
+                                               buffer, sizeof(buffer));
+    if (result) *result = buffer;
+    return ok;
+}
+
+float Value(StudioModel& studio, std::size_t channel, std::size_t slot, const char* label) {
+    AudioPlugin& plugin = studio.PluginAt(channel, slot);
+    for (std::uint32_t i = 0; i < plugin.GetParameterCount(); ++i) {
+        zen::ParameterInfo info;
+        if (plugin.GetParameterInfo(i, info) && info.label == label) return plugin.GetParameter(i);
+    }
+    ADD_FAILURE() << "no parameter " << label;
+    return 0.0f;
+}
+
+}  // namespace
+
+// Template integers are tenths: of the value itself (Dialogue Processor), or
+// of per-mille along the control (Limiter, Reverb, Distortion, Stereo Width).
+TEST(StudioModel, SetIntParameterReadsEachParametersHostScale) {
+    StudioModel studio(*GetZenPluginInterface());
+    const std::size_t c = studio.AddChannel("FX", 2);
+    for (const char* plugin : {"Dialogue Processor", "Limiter", "Reverb", "Distortion", "Stereo Width"})
+        studio.InsertPlugin(c, plugin);
+    std::vector<std::string> debug;
+    studio.SetDebugOutput([&](const std::string& message) { debug.push_back(message); });
+    std::vector<StudioModel::ActionRecord> log;
+    studio.SetActionObserver([&](const StudioModel::ActionRecord& record) { log.push_back(record); });
+    const auto set = [&](const char* slot, const char* parameter, const char* integer) {
+        std::string result;
+        EXPECT_TRUE(Call(studio, c, "SetIntParameter", {slot, parameter, integer}, &result)) << result;
+    };
+
+    set("0", "Exp Speed", "10000");
+    set("0", "De-Pop Amount", "8");  // 0.85 sent toward zero
+    set("0", "Expander", "10");
+    EXPECT_FLOAT_EQ(Value(studio, c, 0, "Exp Speed"), 1000.0f);
+    EXPECT_FLOAT_EQ(Value(studio, c, 0, "De-Pop Amount"), 0.8f);
+    EXPECT_FLOAT_EQ(Value(studio, c, 0, "Expander"), 1.0f);
+
+    set("1", "Soft", "10000");
+    set("1", "Input Gain", "5000");
+    EXPECT_FLOAT_EQ(Value(studio, c, 1, "Soft"), 1.0f);
+    EXPECT_NEAR(Value(studio, c, 1, "Input Gain"), 0.0f, 1e-5f);
+    set("1", "Input Gain", "9000");  // 0.9 of -18..18
+    EXPECT_NEAR(Value(studio, c, 1, "Input Gain"), 14.4f, 1e-4f);
+
+    // The reverb defaults of the effects template, each inside its range.
+    set("2", "Dry/Wet", "2450");
+    set("2", "T@-60dB", "4180");
+    set("2", "Room Length", "4490");
+    set("2", "Early Refl. Gain", "9000");
+    EXPECT_NEAR(Value(studio, c, 2, "Dry/Wet"), 24.5f, 1e-4f);
+    EXPECT_NEAR(Value(studio, c, 2, "T@-60dB"), 0.1f * std::pow(200.0f, 0.418f), 0.01f);  // logarithmic taper
+    EXPECT_NEAR(Value(studio, c, 2, "Room Length"), 1.0f + 0.449f * 99.0f, 1e-3f);
+    EXPECT_NEAR(Value(studio, c, 2, "Early Refl. Gain"), 4.8f, 1e-4f);
+
+    // Distortion "Ceiling" at 1000 - amount: an amount of 250 sits at -6 dB;
+    // places outside 0..1000 clamp; a list is set by its place too.
+    set("3", "Ceiling", "7500");
+    set("3", "Output Level", "-500");
+    set("3", "Curve", "10000");
+    EXPECT_NEAR(Value(studio, c, 3, "Ceiling"), -6.0f, 1e-4f);
+    EXPECT_FLOAT_EQ(Value(studio, c, 3, "Output Level"), -24.0f);
+    EXPECT_FLOAT_EQ(Value(studio, c, 3, "Curve"), 3.0f);
+
+    // "Internal Bypass" is the host's bypass of any plug-in; a parameter the
+    // target lacks is skipped, answered true, and only said as debug output.
+    set("4", "Internal Bypass", "10000");
+    EXPECT_TRUE(studio.PluginAt(c, 4).IsBypassed());
+    set("4", "Internal Bypass", "0");
+    EXPECT_FALSE(studio.PluginAt(c, 4).IsBypassed());
+    set("2", "Diffusion", "3500");
+    ASSERT_EQ(debug.size(), 1u);
+    EXPECT_EQ(debug[0], "skipped: 'Reverb' has no parameter 'Diffusion'");
+
+    ASSERT_EQ(log.size(), 16u);
+    EXPECT_EQ(log[4].target, "Limiter");
+    EXPECT_TRUE(log[4].parameterSet);
+    EXPECT_EQ(log[4].parameter.label, "Input Gain");
+    EXPECT_EQ(log[4].parameter.unit, "dB");
+    EXPECT_EQ(log[13].note, "bypassed");
+    EXPECT_FALSE(log[15].parameterSet);
+    EXPECT_TRUE(log[15].ok);
+
+    std::string result;
+    EXPECT_FALSE(Call(studio, c, "SetIntParameter", {"1", "Soft", "2.5"}, &result));
+    EXPECT_EQ(result, "'2.5' is not a whole number of tenths");
+    EXPECT_FALSE(log.back().ok);
+}
+
+// "LoadPlugin" without a slot inserts right after its caller; "FindPlugin"
+// matches the whole identifier, so two plug-ins with one number differ.
+TEST(StudioModel, TemplatesFindAndLoadTheirTargetsAfterTheCaller) {
+    StudioModel studio(*GetZenPluginInterface());
+    studio.AddChannel("Music", 2);
+    const std::size_t c = studio.AddChannel("SFX", 2);
+    studio.InsertPlugin(c, "Soft Clipper");
+    studio.InsertPlugin(c, "Test Delay");
+    studio.Prepare(48000, 64);
+    std::string result;
+    ASSERT_TRUE(CallFrom(studio, c, 0, "FindPlugin", {"zen:Distortion:1516596851"}, &result));
+    EXPECT_EQ(result, "");
+    ASSERT_TRUE(CallFrom(studio, c, 0, "LoadPlugin", {"zen:Distortion:1516596851"}, &result)) << result;
+    EXPECT_EQ(result, "1");
+    ASSERT_TRUE(CallFrom(studio, c, 0, "LoadPlugin", {"zen:Stereo Width:1516596851", "after"}, &result));
+    EXPECT_EQ(result, "1");
+    // The chain: Soft Clipper, Stereo Width, Distortion, Test Delay.
+    const auto find = [&](const char* identifier) {
+        EXPECT_TRUE(CallFrom(studio, c, 3, "FindPlugin", {identifier}, &result));
+        return result;
+    };
+    EXPECT_EQ(find("zen:Distortion:1516596851"), "2");
+    EXPECT_EQ(find("zen:Stereo Width:1516596851"), "1");
+    EXPECT_EQ(find("Test Delay"), "3");
+    EXPECT_EQ(find("zen:Distortion:1516596852"), "");
+    EXPECT_EQ(find("zen:Limiter:1517177970"), "");
+
+    // The caller is known after the chain moved; outside any slot, "LoadPlugin"
+    // appends, and an explicit slot still wins.
+    studio.MovePlugin(c, 0, 3);
+    ASSERT_TRUE(CallFrom(studio, c, 3, "LoadPlugin", {"Limiter"}, &result));
+    EXPECT_EQ(result, "4");
+    ASSERT_TRUE(Call(studio, c, "LoadPlugin", {"Limiter"}, &result));
+    EXPECT_EQ(result, "5");
+    ASSERT_TRUE(CallFrom(studio, c, 3, "LoadPlugin", {"Test Delay", "0"}, &result));
+    EXPECT_EQ(result, "0");
+    EXPECT_EQ(studio.GetChannel(0).chain.size(), 0u);
+}

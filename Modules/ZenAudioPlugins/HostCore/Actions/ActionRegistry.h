@@ -20,6 +20,7 @@ struct ActionCall {
     std::string action;
     std::vector<std::string> arguments;
     std::int64_t channel = -1;  // the caller's mixer channel, -1 when unknown
+    std::uint64_t caller = 0;   // the calling slot's host-given id, 0 when unknown
 };
 
 class ActionRegistry {

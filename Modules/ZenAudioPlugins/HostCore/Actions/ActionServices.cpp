@@ -5,8 +5,9 @@
 
 namespace zen::host {
 
-ActionServices::ActionServices(const ActionRegistry& registry, std::int64_t channelIndex, std::int64_t sessionId)
-    : m_registry(registry), m_channelIndex(channelIndex), m_sessionId(sessionId) {
+ActionServices::ActionServices(const ActionRegistry& registry, std::int64_t channelIndex, std::int64_t sessionId,
+                               std::uint64_t caller)
+    : m_registry(registry), m_channelIndex(channelIndex), m_sessionId(sessionId), m_caller(caller) {
     m_bridge.owner = this;
     m_bridge.structSize = sizeof(zen::HostServices);
     m_bridge.version = zen::kHostServicesVersion;
@@ -31,7 +32,7 @@ bool ActionServices::CallAction(zen::HostServices* self, const char* action, con
         text = "malformed action call";
     } else {
         const ActionServices& owner = *static_cast<Bridge*>(self)->owner;
-        ActionCall call{action, {}, owner.m_channelIndex};
+        ActionCall call{action, {}, owner.m_channelIndex, owner.m_caller};
         for (std::uint32_t i = 0; i < argumentCount; ++i) call.arguments.emplace_back(arguments[i] ? arguments[i] : "");
         try {
             ok = owner.m_registry.Call(call, text);

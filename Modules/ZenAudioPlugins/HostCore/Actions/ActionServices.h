@@ -1,7 +1,8 @@
-// The zen::HostServices a host hands the library for one mixer channel: the
-// channel index and session id an instance asks for at creation, and the
-// action-call entry, answered from an action registry with the channel as
-// the caller's. One object per channel, so an action knows whose it is.
+// The zen::HostServices a host hands the library for one mixer channel or one
+// slot of it: the channel index and session id an instance asks for at
+// creation, and the action-call entry, answered from an action registry with
+// the channel (and the slot's id, when given) as the caller's. One object per
+// slot, so an action knows who called it.
 #pragma once
 
 #include <cstdint>
@@ -13,7 +14,8 @@ namespace zen::host {
 
 class ActionServices {
 public:
-    ActionServices(const ActionRegistry& registry, std::int64_t channelIndex, std::int64_t sessionId);
+    ActionServices(const ActionRegistry& registry, std::int64_t channelIndex, std::int64_t sessionId,
+                   std::uint64_t caller = 0);
     ActionServices(const ActionServices&) = delete;
     ActionServices& operator=(const ActionServices&) = delete;
 
@@ -39,6 +41,7 @@ private:
     const ActionRegistry& m_registry;
     std::int64_t m_channelIndex;
     std::int64_t m_sessionId;
+    std::uint64_t m_caller;
 };
 
 }  // namespace zen::host

@@ -23,6 +23,11 @@ std::string Hertz(double rate) {
 }
 
 constexpr const char* kReferencePrefix = "zen:";  // how plug-ins name other plug-ins
+// The host bypass of any plug-in, as templates name it.
+constexpr const char* kInternalBypass = "Internal Bypass";
+constexpr const char* kAfterCaller = "after";
+constexpr double kTenths = 10.0;    // "SetIntParameter" integers carry tenths
+constexpr double kPerMille = 1000.0;  // a whole control, in PerMille integers' values
 
 std::size_t ParseIndex(const std::string& text, const char* what) {
     double value = 0.0;
@@ -31,7 +36,8 @@ std::size_t ParseIndex(const std::string& text, const char* what) {
     return static_cast<std::size_t>(value);
 }
 
-std::int32_t FindParameter(zen::PluginInstance& instance, AudioPlugin& audio, const std::string& name) {
+// -1 when the plug-in has no such parameter.
+std::int32_t LookUpParameter(zen::PluginInstance& instance, AudioPlugin& audio, const std::string& name) {
     auto* controls = zen::InterfaceCast<ZenControlValueHost>(&instance);
     std::int32_t index = controls != nullptr ? controls->FindParameter(name.c_str()) : -1;
     for (std::uint32_t i = 0; index < 0 && i < audio.GetParameterCount(); ++i) {
@@ -40,8 +46,25 @@ std::int32_t FindParameter(zen::PluginInstance& instance, AudioPlugin& audio, co
                                                 strcasecmp(info.identifier.c_str(), name.c_str()) == 0))
             index = static_cast<std::int32_t>(i);
     }
-    if (index < 0) throw HostError(std::string("'") + instance.GetName() + "' has no parameter '" + name + "'");
     return index;
+}
+
+std::string NoParameter(zen::PluginInstance& instance, const std::string& name) {
+    return std::string("'") + instance.GetName() + "' has no parameter '" + name + "'";
+}
+
+std::int32_t FindParameter(zen::PluginInstance& instance, AudioPlugin& audio, const std::string& name) {
+    const std::int32_t index = LookUpParameter(instance, audio, name);
+    if (index < 0) throw HostError(NoParameter(instance, name));
+    return index;
+}
+
+// Whole tenths as "SetIntParameter" sends them, signed.
+double ParseTenths(const std::string& text) {
+    double tenths = 0.0;
+    if (!ParseNumber(text, tenths) || std::floor(tenths) != tenths)
+        throw HostError("'" + text + "' is not a whole number of tenths");
+    return tenths;
 }
 
 // "1 or 2", "1 to 32": the channel counts a plug-in takes (in = out).
@@ -137,9 +160,11 @@ std::size_t StudioModel::InsertPlugin(std::size_t channel, const std::string& pl
         throw HostError("channel '" + c.name + "' has no slot " + std::to_string(slot));
     Slot s;
     s.key = FindKey(plugin);
+    s.id = ++m_lastSlotId;
+    s.services = std::make_unique<ActionServices>(m_actions, static_cast<std::int64_t>(channel), m_sessionId, s.id);
     // The instance learns its channel from the services it is created with
     // and keeps them; the interface's own pointer must not outlive the model.
-    m_library.SetHostServices(c.services->Services());
+    m_library.SetHostServices(s.services->Services());
     s.instance.reset(m_library.CreatePlugin(zen::kAudioPluginKind, s.key));
     m_library.SetHostServices(nullptr);
     s.audio = zen::InterfaceCast<AudioPlugin>(s.instance.get());
@@ -212,49 +237,143 @@ std::uint64_t StudioModel::Latency(std::size_t channel) const {
     return total;
 }
 
+std::size_t StudioModel::CallerChannel(const ActionCall& call) const {
+    if (call.channel < 0 || static_cast<std::size_t>(call.channel) >= m_channels.size())
+        throw HostError("'" + call.action + "' needs the caller's channel");
+    return static_cast<std::size_t>(call.channel);
+}
+
+std::size_t StudioModel::CallerSlot(const ActionCall& call) const {
+    const auto& chain = m_channels[CallerChannel(call)]->chain;
+    for (std::size_t i = 0; call.caller != 0 && i < chain.size(); ++i)
+        if (chain[i].id == call.caller) return i;
+    return kAppend;
+}
+
+void StudioModel::RegisterChainAction(const char* name, std::size_t minimumArguments, std::size_t maximumArguments,
+                                      std::function<bool(const ActionCall&, ActionRecord&)> handler) {
+    m_actions.Register(name, minimumArguments, maximumArguments,
+                       [this, handler](const ActionCall& call, std::string& result) {
+                           ActionRecord record;
+                           record.channel = static_cast<std::size_t>(std::max<std::int64_t>(call.channel, 0));
+                           record.action = call.action;
+                           record.arguments = call.arguments;
+                           try {
+                               record.ok = handler(call, record);
+                           } catch (const HostError& e) {
+                               record.result = e.what();
+                               if (m_observer) m_observer(record);
+                               throw;
+                           }
+                           result = record.result;
+                           if (m_observer) m_observer(record);
+                           return record.ok;
+                       });
+}
+
+bool StudioModel::SetIntParameter(const ActionCall& call, ActionRecord& record) {
+    Slot& slot = SlotAt(CallerChannel(call), ParseIndex(call.arguments[0], "slot"));
+    const std::string& name = call.arguments[1];
+    const double value = ParseTenths(call.arguments[2]) / kTenths;
+    record.target = slot.name;
+    if (strcasecmp(name.c_str(), kInternalBypass) == 0) {
+        slot.audio->SetBypass(value != 0.0);
+        record.note = value != 0.0 ? "bypassed" : "in";
+        return true;
+    }
+    const std::int32_t index = LookUpParameter(*slot.instance, *slot.audio, name);
+    if (index < 0) {
+        // A template may name a parameter this plug-in lacks: nothing to set.
+        record.note = "skipped: " + NoParameter(*slot.instance, name);
+        if (m_debug) m_debug(record.note);
+        return true;
+    }
+    const auto i = static_cast<std::uint32_t>(index);
+    zen::ParameterInfo& info = record.parameter;
+    if (!slot.audio->GetParameterInfo(i, info)) throw HostError(NoParameter(*slot.instance, name));
+    bool set = false;
+    if (info.hostScale == zen::HostScale::PerMille) {
+        auto* controls = zen::InterfaceCast<ZenControlValueHost>(slot.instance.get());
+        if (controls == nullptr) throw HostError("'" + slot.name + "' has no control positions");
+        set = controls->SetParameterPosition(i, static_cast<float>(std::clamp(value / kPerMille, 0.0, 1.0)));
+    } else {
+        set = slot.audio->SetParameter(
+            i, static_cast<float>(std::clamp(value, static_cast<double>(info.minimum), static_cast<double>(info.maximum))));
+    }
+    record.parameterSet = set;
+    record.value = slot.audio->GetParameter(i);
+    if (!set) record.result = "'" + slot.name + "' refused " + info.label + " " + FormatNumber(value);
+    return set;
+}
+
 void StudioModel::RegisterActions() {
-    auto callerChannel = [this](const ActionCall& call) -> std::size_t {
-        if (call.channel < 0 || static_cast<std::size_t>(call.channel) >= m_channels.size())
-            throw HostError("'" + call.action + "' needs the caller's channel");
-        return static_cast<std::size_t>(call.channel);
-    };
-    // (plug-in, slot): inserts the plug-in at the slot of the caller's channel.
-    m_actions.Register("LoadPlugin", 1, 2, [this, callerChannel](const ActionCall& call, std::string& result) {
-        const std::size_t slot = call.arguments.size() > 1 ? ParseIndex(call.arguments[1], "slot") : kAppend;
-        const std::size_t channel = callerChannel(call);
-        result =
-            std::to_string(InsertPlugin(channel, call.arguments[0], std::min(slot, ChannelAt(channel).chain.size())));
+    // (plug-in, slot): inserts the plug-in into the caller's channel at the
+    // slot; with no slot or "after", right after the calling plug-in.
+    RegisterChainAction("LoadPlugin", 1, 2, [this](const ActionCall& call, ActionRecord& record) {
+        const std::size_t channel = CallerChannel(call);
+        const std::size_t size = ChannelAt(channel).chain.size();
+        std::size_t slot = kAppend;
+        if (call.arguments.size() < 2 || call.arguments[1] == kAfterCaller) {
+            const std::size_t caller = CallerSlot(call);
+            slot = caller == kAppend ? kAppend : caller + 1;
+        } else {
+            slot = std::min(ParseIndex(call.arguments[1], "slot"), size);
+        }
+        const std::size_t at = InsertPlugin(channel, call.arguments[0], slot);
+        record.target = ChannelAt(channel).chain[at].name;
+        record.result = std::to_string(at);
         return true;
     });
-    // (slot, parameter, value in tenths): the decimal text of the value times ten.
-    m_actions.Register("SetIntParameter", 3, 3, [this, callerChannel](const ActionCall& call, std::string&) {
-        Slot& slot = SlotAt(callerChannel(call), ParseIndex(call.arguments[0], "slot"));
-        double tenths = 0.0;
-        if (!ParseNumber(call.arguments[2], tenths) || std::floor(tenths) != tenths)
-            throw HostError("'" + call.arguments[2] + "' is not a whole number of tenths");
-        const std::int32_t index = FindParameter(*slot.instance, *slot.audio, call.arguments[1]);
-        return slot.audio->SetParameter(static_cast<std::uint32_t>(index), static_cast<float>(tenths / 10.0));
+    // (identifier): the slot of the caller's channel holding that plug-in,
+    // matched on the whole "zen:Name:code", key or name; "" when none.
+    m_actions.Register("FindPlugin", 1, 1, [this](const ActionCall& call, std::string& result) {
+        const std::string& wanted = call.arguments[0];
+        const auto& chain = ChannelAt(CallerChannel(call)).chain;
+        for (std::size_t i = 0; i < chain.size(); ++i) {
+            const std::string reference = kReferencePrefix + chain[i].key;
+            if (strcasecmp(reference.c_str(), wanted.c_str()) == 0 ||
+                strcasecmp(chain[i].key.c_str(), wanted.c_str()) == 0 ||
+                strcasecmp(chain[i].name.c_str(), wanted.c_str()) == 0) {
+                result = std::to_string(i);
+                return true;
+            }
+        }
+        result.clear();
+        return true;
     });
+    // (slot, parameter, value in tenths): the signed decimal of the value
+    // times ten, read through the parameter's host scale. "Internal Bypass"
+    // is the slot's bypass (nonzero: bypassed); a parameter the plug-in lacks
+    // is skipped.
+    RegisterChainAction("SetIntParameter", 3, 3,
+                        [this](const ActionCall& call, ActionRecord& record) { return SetIntParameter(call, record); });
     // (slot, parameter, value): the value in the parameter's unit.
-    m_actions.Register("SetParameter", 3, 3, [this, callerChannel](const ActionCall& call, std::string&) {
-        Slot& slot = SlotAt(callerChannel(call), ParseIndex(call.arguments[0], "slot"));
+    RegisterChainAction("SetParameter", 3, 3, [this](const ActionCall& call, ActionRecord& record) {
+        Slot& slot = SlotAt(CallerChannel(call), ParseIndex(call.arguments[0], "slot"));
         double value = 0.0;
         if (!ParseNumber(call.arguments[2], value)) throw HostError("'" + call.arguments[2] + "' is not a number");
-        const std::int32_t index = FindParameter(*slot.instance, *slot.audio, call.arguments[1]);
-        return slot.audio->SetParameter(static_cast<std::uint32_t>(index), static_cast<float>(value));
+        const auto index = static_cast<std::uint32_t>(FindParameter(*slot.instance, *slot.audio, call.arguments[1]));
+        record.target = slot.name;
+        record.parameterSet = slot.audio->SetParameter(index, static_cast<float>(value));
+        slot.audio->GetParameterInfo(index, record.parameter);
+        record.value = slot.audio->GetParameter(index);
+        return record.parameterSet;
     });
     // (slot, parameter): the current value.
-    m_actions.Register("GetParameter", 2, 2, [this, callerChannel](const ActionCall& call, std::string& result) {
-        Slot& slot = SlotAt(callerChannel(call), ParseIndex(call.arguments[0], "slot"));
+    m_actions.Register("GetParameter", 2, 2, [this](const ActionCall& call, std::string& result) {
+        Slot& slot = SlotAt(CallerChannel(call), ParseIndex(call.arguments[0], "slot"));
         const std::int32_t index = FindParameter(*slot.instance, *slot.audio, call.arguments[1]);
         result = FormatNumber(slot.audio->GetParameter(static_cast<std::uint32_t>(index)));
         return true;
     });
     // (slot, 0 or 1)
-    m_actions.Register("SetBypass", 2, 2, [this, callerChannel](const ActionCall& call, std::string&) {
+    RegisterChainAction("SetBypass", 2, 2, [this](const ActionCall& call, ActionRecord& record) {
         const std::size_t flag = ParseIndex(call.arguments[1], "bypass");
         if (flag > 1) throw HostError("bypass is 0 or 1");
-        SetBypass(callerChannel(call), ParseIndex(call.arguments[0], "slot"), flag == 1);
+        const std::size_t slot = ParseIndex(call.arguments[0], "slot");
+        SetBypass(CallerChannel(call), slot, flag == 1);
+        record.target = SlotAt(CallerChannel(call), slot).name;
+        record.note = flag == 1 ? "bypassed" : "in";
         return true;
     });
     RegisterLevellerEngine(m_actions);

@@ -20,6 +20,21 @@ enum class ParameterTaper : std::uint32_t {
     List = 2,         // discrete values
 };
 
+// How the host action "SetIntParameter" reads its integer, which carries a
+// value in tenths: integer / 10 is
+//   OwnValue: the value itself, in the parameter's unit (a switch 1, an
+//             amount 0.65, a time 1000 ms);
+//   PerMille: a place along the control, 0..1000 for its normalised 0..1
+//             position on the parameter's taper (linear, logarithmic, or the
+//             index of a list or switch): 500 is the middle of -18..18 dB,
+//             i.e. 0 dB, and 1000 turns a switch on.
+// Values outside the range are clamped to it. A parameter declares its scale
+// in its definition; the default is OwnValue.
+enum class HostScale : std::uint32_t {
+    OwnValue = 0,
+    PerMille = 1,
+};
+
 struct ParameterInfo {
     std::string identifier;  // class name, "::" and an upper-case name: "ZenSoftClipper::THRESHOLD"
     std::string label;       // display name: "Threshold"
@@ -31,6 +46,7 @@ struct ParameterInfo {
     float step = 0.0f;        // display resolution; 0 = none
     std::string unit;         // "dB", "Hz", "ms", "%", "dBTP", or empty
     std::vector<std::string> choices;  // captions of a list parameter, in value order
+    HostScale hostScale = HostScale::OwnValue;
 };
 
 // What a meter publishes and how a host reads it.

@@ -50,7 +50,8 @@ const zen::ParameterTableDefinition& ZenDistortion::Definitions() {
             ContinuousParameter("OUTPUT_LEVEL", QT_TRANSLATE_NOOP("ZenDistortion", "Output Level"), -kCeilingRangeDb,
                                 kCeilingRangeDb, 0.0f, 0.1f, "dB")
                 .Smoothed(working::DbToGain),
-        });
+        },
+        zen::HostScale::PerMille);  // template integers are places along the controls
     return table;
 }
 

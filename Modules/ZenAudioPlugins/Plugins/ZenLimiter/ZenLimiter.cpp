@@ -29,7 +29,8 @@ const zen::ParameterTableDefinition& ZenLimiter::Definitions() {
             zen::ContinuousParameter("RELEASE", QT_TRANSLATE_NOOP("ZenLimiter", "Release"), 0.0f, 1000.0f, 1.0f, 0.01f,
                                      "ms"),
             zen::SwitchParameter("SOFT", QT_TRANSLATE_NOOP("ZenLimiter", "Soft"), 0.0f),
-        });
+        },
+        zen::HostScale::PerMille);  // template integers are places along the controls
     return table;
 }
 

@@ -55,7 +55,8 @@ const zen::ParameterTableDefinition& ZenReverb::Definitions() {
             zen::ContinuousParameter("DIRECT_GAIN", ZR("Direct Gain"), -60.0f, 12.0f, 0.0f, 0.1f, "dB"),
             zen::ContinuousParameter("EARLY_GAIN", ZR("Early Refl. Gain"), -60.0f, 12.0f, 0.0f, 0.1f, "dB"),
             zen::ContinuousParameter("LATE_GAIN", ZR("Late Rev. Gain"), -60.0f, 12.0f, 0.0f, 0.1f, "dB"),
-        });
+        },
+        zen::HostScale::PerMille);  // template integers are places along the controls
 #undef ZR
     return table;
 }

@@ -34,7 +34,8 @@ const zen::ParameterTableDefinition& ZenStereoWidth::Definitions() {
             SwitchParameter("MONO_BASS", QT_TRANSLATE_NOOP("ZenStereoWidth", "Mono Bass"), 0.0f),
             LogarithmicParameter("MONO_BASS_FREQUENCY", QT_TRANSLATE_NOOP("ZenStereoWidth", "Mono Bass Below"), 40.0f,
                                  500.0f, 120.0f, 1.0f, "Hz"),
-        });
+        },
+        zen::HostScale::PerMille);  // template integers are places along the controls
     return table;
 }
 
