@@ -95,7 +95,8 @@ TEST(LevellingEngine, SteadySpeechReachesTheModesTargetWithinLimitsAndShares) {
     for (const Case& c : cases) {
         LevellingEngine engine = Narrator();
         for (const auto& [index, value] : c.settings) ASSERT_TRUE(engine.Settings().Set(index, value));
-        for (const EntryRecord& r : Level(engine, std::vector<float>(30, c.level))) ASSERT_NEAR(Db(r), c.gain, 0.051) << c.what;
+        for (const EntryRecord& r : Level(engine, std::vector<float>(30, c.level)))
+            ASSERT_NEAR(Db(r), c.gain, 0.051) << c.what;
     }
     // The plug-in's own switches and indexes past the table are not the engine's.
     EXPECT_FALSE(Narrator().Settings().Set(zen::levelling::kLevellingOnIndex, 1.0f));
@@ -107,7 +108,8 @@ TEST(LevellingEngine, GainStepsStayWithinTheRateAndReachEachPhraseOnItsFirstEntr
     std::uniform_real_distribution<float> level(-45.0f, -10.0f);
     std::uniform_int_distribution<int> length(1, 12);
     std::vector<std::pair<float, int>> runs;
-    for (int phrase = 0; phrase < 40; ++phrase) runs.push_back({phrase % 2 ? kNoSpeech : level(random), length(random)});
+    for (int phrase = 0; phrase < 40; ++phrase)
+        runs.push_back({phrase % 2 ? kNoSpeech : level(random), length(random)});
     const std::vector<float> inputs = Phrases(runs);
     for (const float rate : {0.5f, 1.5f, 2.5f}) {
         LevellingEngine engine = Narrator();
@@ -121,7 +123,8 @@ TEST(LevellingEngine, GainStepsStayWithinTheRateAndReachEachPhraseOnItsFirstEntr
     // is long enough, so each phrase has its own gain from its first entry
     // and the pause moves only from one to the other.
     LevellingEngine engine = Narrator();
-    const auto records = Level(engine, Phrases({{-30.0f, 12}, {kNoSpeech, 6}, {-24.0f, 12}, {kNoSpeech, 6}, {-30.0f, 12}}));
+    const auto records =
+        Level(engine, Phrases({{-30.0f, 12}, {kNoSpeech, 6}, {-24.0f, 12}, {kNoSpeech, 6}, {-30.0f, 12}}));
     for (int e = 0; e < 12; ++e) EXPECT_NEAR(Db(records[static_cast<std::size_t>(e)]), 12.0, 0.051) << e;
     for (int e = 18; e < 30; ++e) EXPECT_NEAR(Db(records[static_cast<std::size_t>(e)]), 6.0, 0.051) << e;
     for (int e = 36; e < 48; ++e) EXPECT_NEAR(Db(records[static_cast<std::size_t>(e)]), 12.0, 0.051) << e;
@@ -130,7 +133,8 @@ TEST(LevellingEngine, GainStepsStayWithinTheRateAndReachEachPhraseOnItsFirstEntr
         EXPECT_EQ(records[e].speech, 0);
         EXPECT_EQ(records[e].output, static_cast<int>(kNoSpeech * 10));
     }
-    for (std::size_t e = 30; e < 36; ++e) EXPECT_GE(Db(records[e]), Db(records[e - 1]) - 0.001) << "rises only, entry " << e;
+    for (std::size_t e = 30; e < 36; ++e)
+        EXPECT_GE(Db(records[e]), Db(records[e - 1]) - 0.001) << "rises only, entry " << e;
 }
 
 TEST(LevellingEngine, PausesHoldUnlessToldToReleaseOrReduce) {
@@ -184,7 +188,8 @@ TEST(LevellingEngine, RangePointsDrawTheLawWhileSet) {
     ASSERT_TRUE(engine.Settings().SetRangePoint(2, -20.0f, 0.0f));
     ASSERT_TRUE(engine.Settings().SetRangePoint(0, -40.0f, 10.0f));
     EXPECT_FALSE(engine.Settings().SetRangePoint(4, -40.0f, 10.0f));
-    const std::pair<float, double> law[] = {{-50.0f, 10.0}, {-40.0f, 10.0}, {-30.0f, 5.0}, {-20.0f, 0.0}, {-10.0f, 0.0}};
+    const std::pair<float, double> law[] = {
+        {-50.0f, 10.0}, {-40.0f, 10.0}, {-30.0f, 5.0}, {-20.0f, 0.0}, {-10.0f, 0.0}};
     for (const auto& [in, gain] : law) {
         engine.Reset();
         EXPECT_NEAR(Db(Level(engine, std::vector<float>(20, in))[10]), gain, 0.051) << "speech at " << in;
@@ -245,10 +250,9 @@ TEST(LevellingEngine, EachStudioChannelAnswersTheTextActionWithItsOwnEngine) {
         std::vector<const char*> pointers;
         for (const std::string& s : args) pointers.push_back(s.c_str());
         char buffer[1024] = {};
-        const bool ok = zen::host::ActionServices::CallAction(studio.GetChannel(channel).services->Services(),
-                                                                zen::levelling::kEngineAction, pointers.data(),
-                                                                static_cast<std::uint32_t>(pointers.size()), buffer,
-                                                                sizeof(buffer));
+        const bool ok = zen::host::ActionServices::CallAction(
+            studio.GetChannel(channel).services->Services(), zen::levelling::kEngineAction, pointers.data(),
+            static_cast<std::uint32_t>(pointers.size()), buffer, sizeof(buffer));
         if (result) *result = buffer;
         return ok;
     };
@@ -274,14 +278,20 @@ TEST(LevellingEngine, EachStudioChannelAnswersTheTextActionWithItsOwnEngine) {
     ASSERT_TRUE(process(b, "10", result));
     EXPECT_EQ(result.substr(0, 15), "0 -300 -300 100");
 
-    for (const std::vector<std::string>& ignored : {std::vector<std::string>{"40", "1"}, {"33", "1"}, {"Reset"},
+    for (const std::vector<std::string>& ignored : {std::vector<std::string>{"40", "1"},
+                                                    {"33", "1"},
+                                                    {"Reset"},
                                                     {"SetRangePoint", "0", "-40", "6"},
                                                     {"NormaliseSetAdvancedParameters", "2", "-1", "20"},
                                                     {"NormaliseClips", "1", "99999", "6"}})
         EXPECT_TRUE(call(a, ignored, &result)) << ignored[0] << ": " << result;
     for (const std::vector<std::string>& refused :
-         {std::vector<std::string>{"Mode", "4"}, {"Levelling"}, {"Process", "0", "1"}, {"Finish", "x"},
-          {"SetRangePoint", "4", "-40", "6"}, {"Process", "-10", "1", "1", "1", "1", "1", "1", "1", "1", "1", "1"}})
+         {std::vector<std::string>{"Mode", "4"},
+          {"Levelling"},
+          {"Process", "0", "1"},
+          {"Finish", "x"},
+          {"SetRangePoint", "4", "-40", "6"},
+          {"Process", "-10", "1", "1", "1", "1", "1", "1", "1", "1", "1", "1"}})
         EXPECT_FALSE(call(a, refused, &result)) << refused[0];
     EXPECT_FALSE(result.empty()) << "a refusal says why";
 }

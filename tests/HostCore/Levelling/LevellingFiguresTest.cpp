@@ -67,9 +67,10 @@ TEST(LevellingFigures, TheDialogueLevellerLevelsInTwoPassesThroughTheHostCore) {
 
     const zentest::LevellingFigures before = zentest::MeasureLevelling(file, file.samples, {});
     const zentest::LevellingFigures after = zentest::MeasureLevelling(file, output, applied);
-    std::printf("Dialogue Leveller, Narrator: short-term sigma %.2f LU before, %.2f after; integrated %.2f LUFS "
-                "(target -18); fastest gain change %.2f dB per 100 ms; pause pump %.2f dB\n",
-                before.sigma, after.sigma, after.integrated, after.fastestChange, after.pausePump);
+    std::printf(
+        "Dialogue Leveller, Narrator: short-term sigma %.2f LU before, %.2f after; integrated %.2f LUFS "
+        "(target -18); fastest gain change %.2f dB per 100 ms; pause pump %.2f dB\n",
+        before.sigma, after.sigma, after.integrated, after.fastestChange, after.pausePump);
     EXPECT_GT(before.sigma, 5.0);
     EXPECT_LE(after.sigma, 1.5);
     EXPECT_NEAR(after.integrated, -18.0, 0.5);

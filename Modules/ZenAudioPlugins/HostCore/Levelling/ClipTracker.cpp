@@ -10,16 +10,11 @@ void ClipTracker::Truncate(std::size_t entry) {
 }
 
 void ClipTracker::Append(bool speech, double loudness, std::int64_t gapEntries) {
-    Entry next;
-    if (!m_entries.empty()) {
-        next = m_entries.back();
-        next.pauseRun = speech ? 0 : next.pauseRun + 1;
-    } else {
-        next.pauseRun = speech ? 0 : 1;
-    }
+    Entry next = m_entries.empty() ? Entry{} : m_entries.back();
+    const bool startsClip = m_entries.empty() || next.count == 0 || next.pauseRun >= gapEntries;
+    next.pauseRun = speech ? 0 : next.pauseRun + 1;
     if (speech) {
-        const Entry& before = m_entries.empty() ? next : m_entries.back();
-        if (m_entries.empty() || before.count == 0 || before.pauseRun >= gapEntries) {
+        if (startsClip) {
             next.clipStart = m_entries.size();
             next.energy = 0.0;
             next.count = 0;

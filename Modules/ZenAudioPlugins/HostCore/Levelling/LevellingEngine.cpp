@@ -163,7 +163,8 @@ void LevellingEngine::ComputeUpTo(std::int64_t end) {
         m_clipGap = gap;
         m_clipGate = m_settings.Get(S::kGateThreshold);
     }
-    const auto known = static_cast<std::int64_t>(std::max(m_inputs.size(), static_cast<std::size_t>(std::max<std::int64_t>(end, 0))));
+    // Clips as far as any entry up to `end` may look.
+    const std::int64_t known = std::max(static_cast<std::int64_t>(m_inputs.size()), end);
     for (auto e = static_cast<std::int64_t>(m_clips.Size()); e < known + kLookaheadEntries; ++e)
         m_clips.Append(IsSpeech(e), Input(e), gap);
     for (std::int64_t e = Computed(); e < end; ++e) ComputeEntry(e);

@@ -103,7 +103,7 @@ private:
     std::vector<float> m_inputs;
     std::vector<Entry> m_entries;
     ClipTracker m_clips;
-    std::int64_t m_clipGap = 0;     // what m_clips was built with
+    std::int64_t m_clipGap = 0;  // what m_clips was built with
     float m_clipGate = 0.0f;
 };
 

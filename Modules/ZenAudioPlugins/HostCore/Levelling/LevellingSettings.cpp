@@ -12,8 +12,8 @@ LevellingSettings::LevellingSettings() {
 }
 
 bool LevellingSettings::Set(std::uint32_t index, float value) {
-    if (index >= levelling::kParameterCount || index == levelling::kLevellingOnIndex || index == levelling::kApplyGainIndex ||
-        !std::isfinite(value))
+    if (index >= levelling::kParameterCount || index == levelling::kLevellingOnIndex ||
+        index == levelling::kApplyGainIndex || !std::isfinite(value))
         return false;
     const auto& p = kLevellerParameters[index];
     m_values[index] = std::clamp(value, p.minimum, p.maximum);
