@@ -22,16 +22,19 @@ void AILevellerControlTemplate::ApplyPreset() {
 }
 
 void AILevellerControlTemplate::AddCurveMappings(std::size_t rider, std::size_t lifter, std::size_t gate) {
+    using zen::levelling::kLevellerParameters;
     constexpr float kPercent = 0.01f;
-    constexpr float kMostRideDb = 18.0f;      // the engine's default Max Cut and Max Boost
+    // At 100 % the engine rides as far as its defaults allow.
+    const float mostCut = kLevellerParameters[static_cast<std::size_t>(EngineIndex("Max Cut"))].defaultValue;
+    const float mostBoost = kLevellerParameters[static_cast<std::size_t>(EngineIndex("Max Boost"))].defaultValue;
     constexpr float kMostReductionDb = 12.0f;  // all of "Background Reduction"
     if (rider != kNoControl) {
         AddMapping(rider, kEngine, "Reduce Loud Dialogue", kPercent, 0.0f);
-        AddMapping(rider, kEngine, "Max Cut", kMostRideDb * kPercent, 0.0f);
+        AddMapping(rider, kEngine, "Max Cut", mostCut * kPercent, 0.0f);
     }
     if (lifter != kNoControl) {
         AddMapping(lifter, kEngine, "Lift Soft Dialogue", kPercent, 0.0f);
-        AddMapping(lifter, kEngine, "Max Boost", kMostRideDb * kPercent, 0.0f);
+        AddMapping(lifter, kEngine, "Max Boost", mostBoost * kPercent, 0.0f);
     }
     if (gate != kNoControl) AddMapping(gate, kEngine, "Background Reduction", kMostReductionDb * kPercent, 0.0f);
 }

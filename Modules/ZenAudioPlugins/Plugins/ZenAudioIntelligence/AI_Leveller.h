@@ -1,5 +1,6 @@
 // "Dialogue Leveller": levelling to the mode's target with the engine's
-// standard times, the rider, lifter and gate curves and the two switches.
+// standard ranges and times, the rider, lifter and gate curves and the two
+// switches.
 #pragma once
 
 #include "AILevellerControlTemplate.h"
