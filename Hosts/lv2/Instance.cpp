@@ -90,6 +90,7 @@ void Instance::ConnectPort(std::uint32_t index, void* data) noexcept {
 void Instance::Activate() {
     SendControls();
     try {
+        m_studio->RunBackgroundTasks(kChannel, false);
         m_studio->Prepare(m_sampleRate, m_maxBlock);
     } catch (const std::exception&) {  // it was prepared at this rate once; Run then does nothing
     }
@@ -156,7 +157,7 @@ void Instance::ProcessAliased(std::uint32_t frames) noexcept {
 }
 
 void Instance::PublishOutputs() noexcept {
-    if (m_latency != nullptr) *m_latency = static_cast<float>(m_audio.GetLatency());
+    if (m_latency != nullptr) *m_latency = static_cast<float>(m_studio->Latency(kChannel));
     for (std::size_t m = 0; m < m_meterPorts.size(); ++m)
         if (m_meterPorts[m] != nullptr) *m_meterPorts[m] = m_audio.GetMeter(static_cast<std::uint32_t>(m));
 }
@@ -177,6 +178,10 @@ LV2_State_Status Instance::Restore(LV2_State_Retrieve_Function retrieve, LV2_Sta
     if (type != m_atomString) return LV2_STATE_ERR_BAD_TYPE;
     if (!m_audio.LoadState(std::string(text, strnlen(text, size)))) return LV2_STATE_ERR_UNKNOWN;
     m_resend.store(true, std::memory_order_release);
+    try {
+        m_studio->RunBackgroundTasks(kChannel, false);
+    } catch (const std::exception&) {  // a target that cannot load leaves the chain as it was
+    }
     return LV2_STATE_SUCCESS;
 }
 

@@ -1,10 +1,14 @@
-// One LV2 plug-in instance: a one-slot channel of the host core's studio
-// model, in the variant's layout, driven through the ports of its PortMap.
+// One LV2 plug-in instance: a channel of the host core's studio model, in the
+// variant's layout, driven through the ports of its PortMap. The plug-in is
+// its first slot; one with background work (the "AI" rows) may load more
+// after it: the plug-ins its template configures.
 //
 // Threads as LV2 defines them: Create, Activate and the state calls on the
 // host's instantiation thread; ConnectPort and Run on the audio thread. Run
 // neither allocates nor locks: changed control values go to SetParameter
-// (atomic) and the enabled port to SetBypass.
+// (atomic) and the enabled port to SetBypass. Background work, which may edit
+// the chain, runs only in Activate and Restore, never beside Run: a template
+// applies the controls it finds there.
 #pragma once
 
 #include <lv2/core/lv2.h>
@@ -63,7 +67,7 @@ private:
     void ProcessAliased(std::uint32_t frames) noexcept;
     void PublishOutputs() noexcept;
 
-    std::unique_ptr<zen::host::StudioModel> m_studio;  // one channel, one slot
+    std::unique_ptr<zen::host::StudioModel> m_studio;  // one channel
     AudioPlugin& m_audio;
     PortMap m_ports;
     float m_sampleRate;

@@ -18,7 +18,8 @@ struct InfoOptions {
 
 struct StageSpec {
     std::string plugin;
-    // In command-line order: {"--preset", name} or {"--set", "PARAM=VALUE"}.
+    // In command-line order: {"--preset", name}, {"--set", "PARAM=VALUE"} or
+    // {"--template", name}.
     std::vector<std::pair<std::string, std::string>> actions;
     std::string learn;  // --learn START:END (seconds); empty: none
 };
@@ -31,6 +32,7 @@ struct ProcessOptions {
     bool compensateLatency = true;
     std::string format;
     std::string metersJson;
+    bool verbose = false;
 };
 
 struct ValidateOptions {
@@ -40,6 +42,8 @@ struct ValidateOptions {
     std::uint32_t seed = 1;
     bool json = false;
     std::vector<std::string> checks;  // only checks whose id starts with one of these
+    // One plug-in's template: its chain is built and every plug-in in it validated.
+    std::string templateName;
 };
 
 struct ControlOptions {

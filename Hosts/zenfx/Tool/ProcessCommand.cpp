@@ -7,6 +7,7 @@
 #include <sstream>
 
 #include "AudioFile.h"
+#include "ChainReport.h"
 #include "Commands.h"
 #include "DemoMaterial.h"
 #include "HostCore/Settings/AtomicFile.h"
@@ -107,6 +108,11 @@ int RunProcess(PluginLibrary& library, const ProcessOptions& options) {
     }
     studio.Prepare(rate, options.block);
     RunLearnPasses(studio, channel, options.stages, open, options.block);
+    // Plug-ins that set up their channel (a template loading and setting its
+    // targets) do it off the audio path, before the first block.
+    ChainReport report(studio, options.verbose);
+    studio.RunBackgroundTasks(channel, false);
+    if (!report.Records().empty()) report.Print(std::cout, channel);
     RunLevellingPasses(studio, channel, open, options.block);
     const std::uint64_t latency = studio.Latency(channel);
 

@@ -8,6 +8,10 @@
 
 namespace zenfx {
 
+namespace {
+constexpr const char* kTemplateParameter = "Template";
+}
+
 StageSettings::StageSettings(AudioPlugin& audio, std::string pluginName, Warn warn)
     : m_audio(audio), m_name(std::move(pluginName)), m_warn(std::move(warn)) {}
 
@@ -55,9 +59,21 @@ void StageSettings::LoadPreset(const std::string& preset) {
     m_preset = found;
 }
 
+void StageSettings::UseTemplate(const std::string& name) {
+    bool found = false;
+    for (std::uint32_t i = 0; !found && i < m_audio.GetParameterCount(); ++i) {
+        zen::ParameterInfo info;
+        found = m_audio.GetParameterInfo(i, info) && info.label == kTemplateParameter;
+    }
+    if (!found)
+        throw ZenfxError("--template " + name + ": '" + m_name + "' has no templates (\"AI\" has)", kExitUsage);
+    Set(std::string(kTemplateParameter) + "=" + name);
+}
+
 void StageSettings::Apply(const std::vector<std::pair<std::string, std::string>>& actions) {
     for (const auto& [action, argument] : actions) {
         if (action == "--preset") LoadPreset(argument);
+        else if (action == "--template") UseTemplate(argument);
         else Set(argument);
     }
 }

@@ -1,4 +1,4 @@
-// The --set and --preset of one plug-in of a chain, applied in command-line
+// The --set, --preset and --template of one plug-in of a chain, applied in command-line
 // order, with a warning wherever a later one silently undoes an earlier one
 // (a parameter set twice, a preset over values set before it) or a value is
 // likely not what was meant (Amount=0.5 on a percent parameter is 0.5 %).
@@ -24,8 +24,11 @@ public:
     void Set(const std::string& assignment);
     // A factory preset by name, any case; throws ZenfxError.
     void LoadPreset(const std::string& preset);
+    // The plug-in's control template by name ("AI": its "Template" list).
+    void UseTemplate(const std::string& name);
 
-    // Each {"--set", "PARAM=VALUE"} or {"--preset", NAME} in order.
+    // Each {"--set", "PARAM=VALUE"}, {"--preset", NAME} or {"--template",
+    // NAME} in order.
     void Apply(const std::vector<std::pair<std::string, std::string>>& actions);
 
 private:

@@ -9,12 +9,12 @@
 namespace {
 
 // Walks the process options in command-line order, so that every --set,
-// --preset and --learn belongs to the --plugin named before it.
+// --preset, --template and --learn belongs to the --plugin named before it.
 std::vector<zenfx::StageSpec> CollectStages(const CLI::App& process, const CLI::Option* plugin,
                                             const CLI::Option* set, const CLI::Option* preset,
-                                            const CLI::Option* learn) {
+                                            const CLI::Option* templateOption, const CLI::Option* learn) {
     std::vector<zenfx::StageSpec> stages;
-    std::size_t pluginIndex = 0, setIndex = 0, presetIndex = 0, learnIndex = 0;
+    std::size_t pluginIndex = 0, setIndex = 0, presetIndex = 0, templateIndex = 0, learnIndex = 0;
     for (const CLI::Option* option : process.parse_order()) {
         if (option == plugin) {
             stages.push_back({option->results().at(pluginIndex++), {}, {}});
@@ -27,10 +27,13 @@ std::vector<zenfx::StageSpec> CollectStages(const CLI::App& process, const CLI::
             stages.back().learn = region;
             continue;
         }
-        const bool isSet = option == set;
-        if (!isSet && option != preset) continue;
-        const std::string& value = isSet ? option->results().at(setIndex++) : option->results().at(presetIndex++);
-        const std::string name = isSet ? "--set" : "--preset";
+        std::string name;
+        std::size_t* index = nullptr;
+        if (option == set) name = "--set", index = &setIndex;
+        else if (option == preset) name = "--preset", index = &presetIndex;
+        else if (option == templateOption) name = "--template", index = &templateIndex;
+        else continue;
+        const std::string& value = option->results().at((*index)++);
         if (stages.empty())
             throw zenfx::ZenfxError(name + " " + value + " comes before any --plugin", zenfx::kExitUsage);
         stages.back().actions.emplace_back(name, value);
@@ -90,6 +93,15 @@ int main(int argc, char** argv) {
             ->expected(1)
             ->multi_option_policy(CLI::MultiOptionPolicy::TakeAll)
             ->allow_extra_args(false);
+    std::vector<std::string> templates;
+    CLI::Option* templateOption =
+        processCommand
+            ->add_option("--template", templates,
+                         "Control template of the plug-in named before it (\"AI\": AI_Dialog, AI_SFX, ...)")
+            ->expected(1)
+            ->multi_option_policy(CLI::MultiOptionPolicy::TakeAll)
+            ->allow_extra_args(false);
+    processCommand->add_flag("-v,--verbose", process.verbose, "Also say what the chain's plug-ins skipped");
     CLI::Option* learnOption =
         processCommand
             ->add_option("--learn", learns, "START:END seconds the plug-in named before it learns from (its \"Learn\")")
@@ -109,6 +121,9 @@ int main(int argc, char** argv) {
         app.add_subcommand("validate", "Run the validation battery over plug-ins; non-zero exit on any failure");
     validateCommand->add_option("PLUGIN", validate.plugins, "Display names or keys, case-insensitive");
     validateCommand->add_flag("--all", validate.all, "Every audio plug-in of the library");
+    validateCommand->add_option("--template", validate.templateName,
+                                "Build the plug-in's template chain (\"AI\": AI_SFX, ...) and validate it and "
+                                "every plug-in in it");
     validateCommand->add_option("--level", validate.level, "1 quick .. 5 longest (default 3)")
         ->check(CLI::Range(1, 5));
     validateCommand->add_option("--seed", validate.seed, "Seed of the random choices (default 1)");
@@ -235,7 +250,7 @@ int main(int argc, char** argv) {
             render.actions = CollectActions(*renderCommand, renderSetOption, renderPresetOption);
             return zenfx::RunRender(library, render);
         }
-        process.stages = CollectStages(*processCommand, pluginOption, setOption, presetOption, learnOption);
+        process.stages = CollectStages(*processCommand, pluginOption, setOption, presetOption, templateOption, learnOption);
         process.compensateLatency = !noCompensation;
         return zenfx::RunProcess(library, process);
     } catch (const zenfx::ZenfxError& e) {

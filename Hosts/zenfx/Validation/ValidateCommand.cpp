@@ -1,12 +1,14 @@
 // zenfx validate: the validation battery over one, several or every plug-in.
 #include <algorithm>
 #include <cstdio>
+#include <functional>
 #include <iostream>
 
 #include <nlohmann/json.hpp>
 
 #include "Commands.h"
 #include "NameSuggestions.h"
+#include "TemplateChain.h"
 #include "ValidationContext.h"
 #include "Validator.h"
 #include "ZenfxError.h"
@@ -35,6 +37,8 @@ struct Counts {
 std::vector<PluginEntry> ChoosePlugins(PluginLibrary& library, const ValidateOptions& options) {
     if (options.all == !options.plugins.empty())
         throw ZenfxError("validate needs plug-in names or --all, not both", kExitUsage);
+    if (!options.templateName.empty() && (options.all || options.plugins.size() != 1))
+        throw ZenfxError("--template needs exactly one plug-in (the one with templates: \"AI\")", kExitUsage);
     std::vector<PluginEntry> plugins;
     if (options.all) {
         for (const PluginEntry& plugin : library.List())
@@ -46,18 +50,25 @@ std::vector<PluginEntry> ChoosePlugins(PluginLibrary& library, const ValidateOpt
     return plugins;
 }
 
+bool Matches(const std::string& id, const std::vector<std::string>& prefixes) {
+    return prefixes.empty() || std::any_of(prefixes.begin(), prefixes.end(), [&](const std::string& prefix) {
+               return id.compare(0, prefix.size(), prefix) == 0;
+           });
+}
+
 // A --check that matches no check would pass by checking nothing.
 void RequireKnownChecks(const ValidateOptions& options) {
-    const std::vector<std::string> ids = Validator::CheckIds();
+    std::vector<std::string> ids = Validator::CheckIds();
+    if (!options.templateName.empty())
+        ids.insert(ids.end(), TemplateChain::CheckIds().begin(), TemplateChain::CheckIds().end());
     std::vector<std::string> groups;
     for (const std::string& id : ids) {
         const std::string group = id.substr(0, id.find('.'));
         if (std::find(groups.begin(), groups.end(), group) == groups.end()) groups.push_back(group);
     }
     for (const std::string& prefix : options.checks) {
-        const bool matches = std::any_of(ids.begin(), ids.end(), [&](const std::string& id) {
-            return id.compare(0, prefix.size(), prefix) == 0;
-        });
+        const bool matches =
+            std::any_of(ids.begin(), ids.end(), [&](const std::string& id) { return Matches(id, {prefix}); });
         if (matches) continue;
         std::vector<std::string> names = groups;
         names.insert(names.end(), ids.begin(), ids.end());
@@ -73,14 +84,28 @@ void RequireKnownChecks(const ValidateOptions& options) {
 
 int RunValidate(PluginLibrary& library, const ValidateOptions& options) {
     RequireKnownChecks(options);
-    const std::vector<PluginEntry> plugins = ChoosePlugins(library, options);
+    std::vector<PluginEntry> plugins = ChoosePlugins(library, options);
+    std::unique_ptr<TemplateChain> chain;
+    if (!options.templateName.empty()) {
+        chain = std::make_unique<TemplateChain>(library, plugins.front(), options.templateName);
+        plugins = chain->Plugins();
+        if (!options.json) {
+            std::cout << chain->Name() << ":\n";
+            chain->Print(std::cout);
+            std::cout << std::endl;
+        }
+    }
+    // With only chain checks asked for, the plug-ins' battery is left out.
+    const std::vector<std::string> battery = Validator::CheckIds();
+    const bool wantsBattery = std::any_of(battery.begin(), battery.end(),
+                                          [&](const std::string& id) { return Matches(id, options.checks); });
     Validator validator(library, options);
     Counts total;
     nlohmann::json reports = nlohmann::json::array();
-    for (const PluginEntry& plugin : plugins) {
+    const auto report = [&](const std::string& name, const std::string& key,
+                            const std::function<std::vector<CheckResult>(const ValidationContext::Listener&)>& run) {
         if (!options.json)
-            std::cout << plugin.entry.name << " (" << plugin.key << "), level " << options.level << ", seed "
-                      << options.seed << std::endl;
+            std::cout << name << " (" << key << "), level " << options.level << ", seed " << options.seed << std::endl;
         Counts counts;
         const auto printLine = [&](const CheckResult& result) {
             counts.Add(result);
@@ -89,25 +114,34 @@ int RunValidate(PluginLibrary& library, const ValidateOptions& options) {
                         result.outcome.reason.c_str());
             std::fflush(stdout);
         };
-        const std::vector<CheckResult> results = validator.Validate(plugin, printLine);
+        const std::vector<CheckResult> results = run(printLine);
         total.passed += counts.passed;
         total.failed += counts.failed;
         total.skipped += counts.skipped;
         if (!options.json) {
-            std::cout << plugin.entry.name << ": " << counts.Text() << "\n" << std::endl;
-            continue;
+            std::cout << name << ": " << counts.Text() << "\n" << std::endl;
+            return;
         }
         nlohmann::json checks = nlohmann::json::array();
         for (const CheckResult& result : results)
             checks.push_back({{"id", result.id},
                               {"status", StatusName(result.outcome.status)},
                               {"reason", result.outcome.reason}});
-        reports.push_back({{"name", plugin.entry.name},
-                           {"key", plugin.key},
+        reports.push_back({{"name", name},
+                           {"key", key},
                            {"passed", counts.failed == 0},
                            {"counts", {{"pass", counts.passed}, {"fail", counts.failed}, {"skip", counts.skipped}}},
                            {"checks", checks}});
+    };
+    for (const PluginEntry& plugin : plugins) {
+        if (!wantsBattery) break;
+        report(plugin.entry.name, plugin.key,
+               [&](const ValidationContext::Listener& listener) { return validator.Validate(plugin, listener); });
     }
+    if (chain)
+        report(chain->Name(), options.templateName,
+               [&](const ValidationContext::Listener& listener) { return chain->Check(options, listener); });
+    const std::size_t validated = wantsBattery ? plugins.size() : 0;
     if (options.json) {
         nlohmann::json document = {{"level", options.level},
                                    {"seed", options.seed},
@@ -116,8 +150,8 @@ int RunValidate(PluginLibrary& library, const ValidateOptions& options) {
                                    {"plugins", reports}};
         std::cout << document.dump(2) << std::endl;
     } else {
-        std::cout << "zenfx validate: " << plugins.size() << " plug-in" << (plugins.size() == 1 ? "" : "s") << ", "
-                  << total.Text() << std::endl;
+        std::cout << "zenfx validate: " << validated << " plug-in" << (validated == 1 ? "" : "s")
+                  << (chain ? " and the chain" : "") << ", " << total.Text() << std::endl;
     }
     return total.failed == 0 ? 0 : kExitFailure;
 }

@@ -98,7 +98,7 @@ TEST(StudioModel, PluginsActOnTheirOwnChannelThroughHostActions) {
     ASSERT_TRUE(Call(studio, dialog, "SetBypass", {"0", "1"}));
     EXPECT_TRUE(studio.PluginAt(dialog, 0).IsBypassed());
 
-    EXPECT_FALSE(Call(studio, dialog, "SetIntParameter", {"1", "Loudness", "10"}, &result));
+    EXPECT_FALSE(Call(studio, dialog, "SetParameter", {"1", "Loudness", "10"}, &result));
     EXPECT_EQ(result, "'Soft Clipper' has no parameter 'Loudness'");
     EXPECT_FALSE(Call(studio, dialog, "SetIntParameter", {"7", "Threshold", "10"}, &result));
     EXPECT_EQ(result, "channel 'Dialog' has no slot 7 (it has 2)");
@@ -243,4 +243,48 @@ TEST(StudioModel, TemplatesFindAndLoadTheirTargetsAfterTheCaller) {
     ASSERT_TRUE(CallFrom(studio, c, 3, "LoadPlugin", {"Test Delay", "0"}, &result));
     EXPECT_EQ(result, "0");
     EXPECT_EQ(studio.GetChannel(0).chain.size(), 0u);
+}
+
+// The "AI" plug-in's template loads its targets from its background task,
+// while RunBackgroundTasks walks the chain; later rounds find them again and
+// only follow the controls.
+TEST(StudioModel, BackgroundTasksLetATemplateBuildAndFollowItsChain) {
+    StudioModel studio(*GetZenPluginInterface());
+    const std::size_t c = studio.AddChannel("SFX", 2);
+    studio.InsertPlugin(c, "Soft Clipper");
+    studio.InsertPlugin(c, "AI");
+    studio.InsertPlugin(c, "Test Delay");
+    AudioPlugin& ai = studio.PluginAt(c, 1);
+    const auto index = [&](const char* label) {
+        auto* controls = zen::InterfaceCast<ZenControlValueHost>(studio.GetChannel(c).chain[1].instance.get());
+        return static_cast<std::uint32_t>(controls->FindParameter(label));
+    };
+    ai.SetParameter(index("Template"), 2.0f);  // AI_SFX
+    ai.SetParameter(index("Crunch"), 1.0f);
+    std::vector<StudioModel::ActionRecord> log;
+    studio.SetActionObserver([&](const StudioModel::ActionRecord& record) { log.push_back(record); });
+    studio.Prepare(48000, 256);
+    studio.RunBackgroundTasks(c, false);
+
+    const auto names = [&] {
+        std::vector<std::string> list;
+        for (const auto& slot : studio.GetChannel(c).chain) list.push_back(slot.name);
+        return list;
+    };
+    ASSERT_EQ(names(), (std::vector<std::string>{"Soft Clipper", "AI", "Reverb", "Distortion", "Test Delay"}));
+    EXPECT_FALSE(studio.PluginAt(c, 3).IsBypassed());  // "Crunch" on
+    EXPECT_TRUE(studio.PluginAt(c, 2).IsBypassed());   // reverb off
+    EXPECT_NEAR(Value(studio, c, 2, "Dry/Wet"), 24.5f, 1e-4f);
+    for (const auto& record : log) EXPECT_TRUE(record.ok) << record.action << " " << record.result;
+
+    log.clear();
+    ai.SetParameter(index("Crunch"), 0.0f);
+    studio.RunBackgroundTasks(c, false);
+    EXPECT_EQ(names().size(), 5u);
+    EXPECT_TRUE(studio.PluginAt(c, 3).IsBypassed());
+    ASSERT_EQ(log.size(), 1u);
+    EXPECT_EQ(log[0].note, "bypassed");
+    std::vector<float> left(256, 0.25f), right(256, -0.25f);
+    float* buffers[] = {left.data(), right.data()};
+    EXPECT_TRUE(studio.Process(c, buffers, 256));
 }

@@ -14,6 +14,8 @@
 #include <random>
 
 #include "Catalog.h"
+#include "HostCore/HostError.h"
+#include "HostCore/Studio/StudioModel.h"
 #include "Library.h"
 #include "LilvHost.h"
 #include "PortMap.h"
@@ -40,19 +42,36 @@ LilvHost& Host() {
     return host;
 }
 
-// The plug-in a URI names, created directly and set to the URI's layout.
+// The plug-in a URI names, run directly through the library as the first
+// slot of a studio channel in the URI's layout; a plug-in with background
+// work may load more slots after it when prepared, as in the adapter.
 struct Direct {
-    std::unique_ptr<zen::PluginInstance> instance;
+    std::unique_ptr<zen::host::StudioModel> studio;
+    zen::PluginInstance* instance = nullptr;
     AudioPlugin* audio = nullptr;
+
+    void Prepare(double rate) {
+        studio->RunBackgroundTasks(0, false);
+        studio->Prepare(rate, LilvHost::kMaxBlock);
+    }
+    bool Process(float* const* buffers, std::uint32_t frames) { return studio->Process(0, buffers, frames); }
+    std::uint64_t Latency() const { return studio->Latency(0); }
 };
 
 Direct CreateDirect(const std::string& uri) {
     for (const zenlv2::Variant& variant : zenlv2::Catalog::Build(TestLibrary())) {
         if (variant.uri != uri) continue;
         Direct direct;
-        direct.instance = TestLibrary().Create(variant.key);
-        direct.audio = zen::InterfaceCast<AudioPlugin>(direct.instance.get());
-        if (direct.audio != nullptr && direct.audio->ConfigureChannels(variant.inputs, variant.outputs)) return direct;
+        direct.studio = std::make_unique<zen::host::StudioModel>(TestLibrary().Interface());
+        direct.studio->AddChannel(variant.name, variant.outputs, variant.inputs == 0 ? variant.outputs : variant.inputs);
+        try {
+            direct.studio->InsertPlugin(0, variant.key);
+        } catch (const zen::host::HostError&) {
+            continue;
+        }
+        direct.instance = direct.studio->GetChannel(0).chain[0].instance.get();
+        direct.audio = &direct.studio->PluginAt(0, 0);
+        return direct;
     }
     return {};
 }
@@ -60,7 +79,7 @@ Direct CreateDirect(const std::string& uri) {
 // Control inputs by parameter index, found by label as a host author would.
 std::map<std::uint32_t, std::uint32_t> ParameterPorts(const LilvRun& run, Direct& direct) {
     std::map<std::uint32_t, std::uint32_t> ports;  // port -> parameter index
-    auto* host = zen::InterfaceCast<ZenControlValueHost>(direct.instance.get());
+    auto* host = zen::InterfaceCast<ZenControlValueHost>(direct.instance);
     for (const Lv2Port& port : run.Ports()) {
         if (port.audio || !port.input || port.designation == LV2_CORE__enabled) continue;
         const std::int32_t index = host != nullptr ? host->FindParameter(port.name.c_str()) : -1;
@@ -214,7 +233,7 @@ TEST(Lv2Bundle, ProcessesLikeTheLibraryAtBothRatesThroughChangingBlocksAndSettin
             // as they do before Prepare in the library.
             change(false);
             run.Activate();
-            ASSERT_TRUE(direct.audio->Prepare(static_cast<float>(rate), LilvHost::kMaxBlock));
+            ASSERT_NO_THROW(direct.Prepare(rate));
 
             const auto inputs = run.AudioPorts(true);
             const auto outputs = run.AudioPorts(false);
@@ -233,7 +252,7 @@ TEST(Lv2Bundle, ProcessesLikeTheLibraryAtBothRatesThroughChangingBlocksAndSettin
                     }
                 }
                 run.Run(frames);
-                ASSERT_TRUE(direct.audio->Process(pointers.data(), frames));
+                ASSERT_TRUE(direct.Process(pointers.data(), frames));
                 for (std::size_t c = 0; c < outputs.size(); ++c) {
                     const std::vector<float>& out = run.Audio(outputs[c]);
                     for (std::uint32_t i = 0; i < frames; ++i) {
@@ -241,7 +260,7 @@ TEST(Lv2Bundle, ProcessesLikeTheLibraryAtBothRatesThroughChangingBlocksAndSettin
                         ASSERT_EQ(out[i], buffers[c][i]) << "block " << block << " channel " << c << " sample " << i;
                     }
                 }
-                EXPECT_EQ(run.Control("latency"), static_cast<float>(direct.audio->GetLatency()));
+                EXPECT_EQ(run.Control("latency"), static_cast<float>(direct.Latency()));
                 for (const auto& [port, meter] : meters)
                     EXPECT_EQ(run.Control(port), direct.audio->GetMeter(meter)) << run.Ports()[port].symbol;
                 ++block;
@@ -390,4 +409,39 @@ TEST(Lv2Bundle, StateTextIsSavedAndRestoredWithThePortsWinning) {
     EXPECT_EQ(state->restore(handle, StoredState::Retrieve, &malformed, 0, nullptr), LV2_STATE_ERR_UNKNOWN);
     StoredState empty;
     EXPECT_EQ(state->restore(handle, StoredState::Retrieve, &empty, 0, nullptr), LV2_STATE_SUCCESS);
+}
+
+// An "AI" instance runs the chain its template builds at activation: with
+// AI_SFX, "Crunch" on brings the distortion in after it; off, the distortion
+// and the reverb sit bypassed and the input comes out as it went in, delayed.
+TEST(Lv2Bundle, AiInstanceRunsItsTemplateChainThroughTheDistortion) {
+    std::string key;
+    for (const auto& [k, entry] : TestLibrary().Interface().GetPluginList(zen::kAudioPluginKind))
+        if (entry.name == "AI") key = k;
+    ASSERT_FALSE(key.empty());
+    const std::string uri = zenlv2::Catalog::MakeUri(key, "stereo");
+    // Residual against the delayed input, in dB of the input.
+    const auto residualDb = [&](float crunch) {
+        LilvRun run(Host(), Host().Find(uri), 48000.0);
+        EXPECT_TRUE(run.Ok());
+        run.Control("template") = 2.0f;  // AI_SFX
+        run.Control("crunch_on") = crunch;
+        run.Activate();
+        constexpr std::uint32_t kFrames = 4800;
+        for (std::uint32_t port : run.AudioPorts(true))
+            for (std::uint32_t i = 0; i < kFrames; ++i)
+                run.Audio(port)[i] = 0.5f * std::sin(2.0f * static_cast<float>(M_PI) * 1000.0f * i / 48000.0f);
+        run.Run(kFrames);
+        const auto latency = static_cast<std::size_t>(run.Control("latency"));
+        const auto& in = run.Audio(run.AudioPorts(true)[0]);
+        const auto& out = run.Audio(run.AudioPorts(false)[0]);
+        double error = 0.0, reference = 0.0;
+        for (std::size_t i = latency + kFrames / 2; i < kFrames; ++i) {
+            error += std::pow(out[i] - in[i - latency], 2.0);
+            reference += std::pow(in[i - latency], 2.0);
+        }
+        return 10.0 * std::log10(error / reference + 1e-30);
+    };
+    EXPECT_LT(residualDb(0.0f), -60.0);
+    EXPECT_GT(residualDb(1.0f), -20.0);
 }

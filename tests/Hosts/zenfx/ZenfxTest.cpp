@@ -110,6 +110,28 @@ TEST(ZenfxProcess, RunsTheChainInOrderWithEachSettingOnItsPlugin) {
     }
 }
 
+// --template chooses the "AI" plug-in's template; its controls load their
+// target right after it and set it, and zenfx prints the chain and every
+// integer sent with the value it became.
+TEST(ZenfxProcess, TemplateLoadsItsTargetAndPrintsTheChainAndEveryValueItSet) {
+    TempFolder folder;
+    WriteAudio(folder / "in.wav", {Ramp(4800, 0.3f), Ramp(4800, 0.3f)}, kRate);
+    const auto result = RunZenfx({"process", folder / "in.wav", "-o", folder / "out.wav", "--plugin", "AI",
+                                  "--template", "AI_Dialog", "--set", "Cleanup=1", "--set", "CleanUpAmount=1"});
+    ASSERT_EQ(result.exitCode, 0) << result.err;
+    for (const char* line : {"zenfx:   0  AI\n", "zenfx:   1  Dialogue Processor\n",
+                             "Dialogue Processor: Rumble Filt 10 -> on", "Dialogue Processor: Expander 10 -> on",
+                             "Dialogue Processor: De-Pop Amount 8 -> 0.8", "Dialogue Processor: De-Ess Amount 6 -> 0.6",
+                             "Dialogue Processor: Exp Amount 5 -> 0.5", "Dialogue Processor: Exp Speed 10000 -> 1000"})
+        EXPECT_NE(result.out.find(line), std::string::npos) << line << "\n" << result.out;
+    EXPECT_EQ(ReadAudio(folder / "out.wav").samples.size(), 9600u);
+
+    const auto refused = RunZenfx({"process", folder / "in.wav", "-o", folder / "out2.wav", "--plugin", "Limiter",
+                                   "--template", "AI_Dialog"});
+    EXPECT_EQ(refused.exitCode, 2);
+    EXPECT_NE(refused.err.find("'Limiter' has no templates"), std::string::npos) << refused.err;
+}
+
 TEST(ZenfxProcess, BlockSizeDoesNotChangeTheResult) {
     TempFolder folder;
     WriteAudio(folder / "in.wav", {Ramp(5001, 1.5f), Ramp(5001, -0.7f)}, kRate);

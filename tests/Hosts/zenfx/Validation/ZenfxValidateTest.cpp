@@ -189,3 +189,27 @@ TEST(ZenfxValidate, UsageMistakesAreOneLineErrors) {
     EXPECT_EQ(unknown.exitCode, 1);
     EXPECT_NE(unknown.err.find("did you mean 'Soft Clipper'"), std::string::npos) << unknown.err;
 }
+
+// Every template's chain builds and runs: all its actions go through and
+// noise passes the chain as the template left it. (Each plug-in in a chain
+// gets its battery in EveryRegisteredPluginPasses.)
+TEST(ZenfxValidate, EveryTemplateChainPasses) {
+    for (const char* name : {"AI_Dialog", "AI_Music", "AI_SFX", "AI_Ambience", "AI_VoiceOverRecording",
+                             "AI_DialogAdvanced", "AI_LevelRider", "AI_Leveller", "AI_Master", "AI_DialogRider"}) {
+        SCOPED_TRACE(name);
+        const auto report = ValidateJson({"validate", "AI", "--template", name, "--check", "chain"}, 0);
+        ASSERT_TRUE(report.is_object());
+        EXPECT_TRUE(report["passed"].get<bool>()) << FailureLines(report);
+        ASSERT_EQ(report["plugins"].size(), 1u);  // the battery is left out when only chain checks are asked
+        EXPECT_EQ(report["counts"]["pass"], 2);
+    }
+    // A chain's plug-ins are validated too: AI_SFX loads the distortion and the reverb.
+    const auto report = ValidateJson({"validate", "AI", "--template", "AI_SFX", "--check", "parameters.set-get",
+                                      "--check", "chain"},
+                                     0);
+    ASSERT_TRUE(report.is_object());
+    std::set<std::string> names;
+    for (const auto& plugin : report["plugins"]) names.insert(plugin["name"].get<std::string>());
+    EXPECT_EQ(names, (std::set<std::string>{"AI", "Distortion", "Reverb", "AI, AI_SFX chain"}));
+    EXPECT_EQ(report["counts"]["fail"], 0) << FailureLines(report);
+}
