@@ -245,53 +245,35 @@ TEST(LevellingEngine, ClipsGoToTheirTargetUnderCeilingAndMaxGainThenRideWithinRa
 
 TEST(LevellingEngine, EachStudioChannelAnswersTheTextActionWithItsOwnEngine) {
     zen::host::StudioModel studio(*GetZenPluginInterface());
-    const std::size_t a = studio.AddChannel("A", 2), b = studio.AddChannel("B", 2);
-    const auto call = [&studio](std::size_t channel, std::vector<std::string> args, std::string* result = nullptr) {
-        std::vector<const char*> pointers;
-        for (const std::string& s : args) pointers.push_back(s.c_str());
+    studio.AddChannel("A", 2);
+    studio.AddChannel("B", 2);
+    std::string result;
+    const auto call = [&](std::size_t channel, std::vector<const char*> args) {
         char buffer[1024] = {};
         const bool ok = zen::host::ActionServices::CallAction(
-            studio.GetChannel(channel).services->Services(), zen::levelling::kEngineAction, pointers.data(),
-            static_cast<std::uint32_t>(pointers.size()), buffer, sizeof(buffer));
-        if (result) *result = buffer;
+            studio.GetChannel(channel).services->Services(), zen::levelling::kEngineAction, args.data(),
+            static_cast<std::uint32_t>(args.size()), buffer, sizeof(buffer));
+        result = buffer;
         return ok;
     };
-    const std::vector<std::string> block = {"-30", "-30", "-30", "-30", "-30", "-30", "-30", "-30", "-30", "-30"};
-    const auto process = [&](std::size_t channel, const char* first, std::string& result) {
-        std::vector<std::string> args = {"Process", first};
-        args.insert(args.end(), block.begin(), block.end());
-        return call(channel, args, &result);
+    const auto process = [&](std::size_t channel, const char* first) {
+        return call(channel, {"Process", first, "-30", "-30", "-30", "-30", "-30", "-30", "-30", "-30", "-30", "-30"});
     };
-    ASSERT_TRUE(call(a, {"Mode", "1"}));
-    ASSERT_TRUE(call(a, {"1", "6"}));  // Max Boost
-    std::string result;
-    ASSERT_TRUE(process(a, "0", result));
-    std::string unity;
-    for (int i = 0; i < 10; ++i) unity += std::string(i ? " " : "") + "0 -2000 -2000 0";
-    EXPECT_EQ(result, unity) << "before entry 0";
-    ASSERT_TRUE(process(a, "10", result));
+    ASSERT_TRUE(call(0, {"Mode", "1"}) && call(0, {"1", "6"}));  // Narrator, Max Boost 6 dB
+    ASSERT_TRUE(process(0, "0"));
+    EXPECT_EQ(result.substr(0, 32), "0 -2000 -2000 0 0 -2000 -2000 0 ") << "before entry 0: unity";
+    ASSERT_TRUE(process(0, "10"));
     EXPECT_EQ(result.substr(0, 20), "60 -300 -240 1000 60");
-    ASSERT_TRUE(call(a, {"Finish", "20"}, &result));
+    ASSERT_TRUE(call(0, {"Finish", "20"}));
     EXPECT_EQ(result.substr(0, 17), "60 -300 -240 1000");
-    // Channel B has its own engine, still unlevelled.
-    ASSERT_TRUE(process(b, "0", result));
-    ASSERT_TRUE(process(b, "10", result));
-    EXPECT_EQ(result.substr(0, 15), "0 -300 -300 100");
+    ASSERT_TRUE(process(1, "0") && process(1, "10"));
+    EXPECT_EQ(result.substr(0, 15), "0 -300 -300 100") << "channel B's own engine is unlevelled";
 
-    for (const std::vector<std::string>& ignored : {std::vector<std::string>{"40", "1"},
-                                                    {"33", "1"},
-                                                    {"Reset"},
-                                                    {"SetRangePoint", "0", "-40", "6"},
-                                                    {"NormaliseSetAdvancedParameters", "2", "-1", "20"},
-                                                    {"NormaliseClips", "1", "99999", "6"}})
-        EXPECT_TRUE(call(a, ignored, &result)) << ignored[0] << ": " << result;
-    for (const std::vector<std::string>& refused :
-         {std::vector<std::string>{"Mode", "4"},
-          {"Levelling"},
-          {"Process", "0", "1"},
-          {"Finish", "x"},
-          {"SetRangePoint", "4", "-40", "6"},
-          {"Process", "-10", "1", "1", "1", "1", "1", "1", "1", "1", "1", "1"}})
-        EXPECT_FALSE(call(a, refused, &result)) << refused[0];
-    EXPECT_FALSE(result.empty()) << "a refusal says why";
+    EXPECT_TRUE(call(0, {"40", "1"}) && call(0, {"33", "1"})) << "indexes that are not the engine's are ignored";
+    EXPECT_TRUE(call(0, {"NormaliseClips", "1", "99999", "6"}) && call(0, {"Reset"}));
+    for (const std::vector<const char*>& refused : {std::vector<const char*>{"Mode", "4"}, {"Levelling"},
+                                                    {"Process", "0", "1"}, {"SetRangePoint", "4", "-40", "6"}}) {
+        EXPECT_FALSE(call(0, refused)) << refused[0];
+        EXPECT_FALSE(result.empty()) << "a refusal says why";
+    }
 }
