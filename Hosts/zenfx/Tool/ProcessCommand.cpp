@@ -13,6 +13,7 @@
 #include "HostCore/Settings/AtomicFile.h"
 #include "HostCore/Studio/StudioModel.h"
 #include "LearnPass.h"
+#include "LevellingPasses.h"
 #include "MeterRecorder.h"
 #include "ProgressBar.h"
 #include "RunFiles.h"
@@ -115,6 +116,7 @@ int RunProcess(PluginLibrary& library, const ProcessOptions& options) {
     std::vector<AudioPlugin*> stagePlugins;
     for (const MeterRecorder::Plugin& plugin : plugins) stagePlugins.push_back(plugin.audio);
     RunLearnPasses(studio, channel, options.stages, stagePlugins, open, options.block);
+    RunLevellingPasses(studio, channel, open, options.block);
     const std::uint64_t latency = studio.Latency(channel);
 
     // Every destination is taken before the run, so that one that cannot be

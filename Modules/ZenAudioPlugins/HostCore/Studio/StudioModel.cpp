@@ -7,6 +7,7 @@
 #include <sstream>
 
 #include "HostCore/HostError.h"
+#include "HostCore/Levelling/LevellerEngineAction.h"
 #include "HostCore/Settings/SettingsDocument.h"
 
 namespace zen::host {
@@ -375,6 +376,7 @@ void StudioModel::RegisterActions() {
         record.note = flag == 1 ? "bypassed" : "in";
         return true;
     });
+    RegisterLevellerEngine(m_actions);
 }
 
 }  // namespace zen::host

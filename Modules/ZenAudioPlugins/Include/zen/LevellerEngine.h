@@ -2,7 +2,8 @@
 // carried by the host action "AudioLevellerEngine" (text arguments, decimal
 // numbers). The plug-in measures its input per entry of kEntryFrames samples
 // and hands the measurements over kBlockEntries at a time; the engine answers
-// a gain (tenths of a dB) and three display values per entry.
+// a gain (tenths of a dB) and three display values per entry. README.md,
+// "Levelling engine", gives the law and what every parameter index means.
 //
 // Arguments of "AudioLevellerEngine":
 //   INDEX VALUE                  sets engine parameter INDEX (0..37, not 33/34)
@@ -72,17 +73,17 @@ struct LevellerParameter {
 // named by its label; 33 and 34 are the plug-in's own switches.
 inline constexpr std::array<LevellerParameter, kParameterCount> kLevellerParameters = {{
     {"Target Offset", "dB", -10.0f, 10.0f, 0.0f, false},          // 0: added to the mode's target
-    {"Max Boost", "dB", 0.0f, 30.0f, 18.0f, false},               // 1: most the engine raises
+    {"Max Boost", "dB", 0.0f, 30.0f, 24.0f, false},               // 1: most the engine raises
     {"Max Cut", "dB", 0.0f, 30.0f, 18.0f, false},                 // 2: most it lowers
     {"Attack", "s", 0.4f, 10.0f, 1.2f, false},                    // 3: time constant of falling gain
     {"Release", "s", 0.4f, 20.0f, 2.4f, false},                   // 4: time constant of rising gain
     {"Lookahead", "s", 0.0f, 4.0f, 4.0f, false},                  // 5: how early the curve moves
     {"Max Gain Rate", "dB/s", 0.5f, 2.5f, 2.5f, false},           // 6: slope limit of the curve
-    {"VAD Mode", "", 0.0f, 3.0f, 2.0f, false},                    // 7: voice detector aggressiveness
-    {"Speech Fraction", "%", 10.0f, 90.0f, 30.0f, false},         // 8: share of voiced frames for speech
-    {"Speech Floor", "LUFS", -80.0f, -30.0f, -65.0f, false},      // 9: quieter frames are not speech
-    {"Pause Hold", "", 0.0f, 1.0f, 1.0f, true},                   // 10: hold the gain through pauses
-    {"Background Reduction", "dB", 0.0f, 12.0f, 0.0f, false},     // 11: cut in pauses
+    {"VAD Mode", "", 0.0f, 3.0f, 2.0f, false},                    // 7: voice detector aggressiveness (plug-in)
+    {"Speech Fraction", "%", 10.0f, 90.0f, 30.0f, false},         // 8: share of voiced frames for speech (plug-in)
+    {"Speech Floor", "LUFS", -80.0f, -30.0f, -65.0f, false},      // 9: quieter frames are not speech (plug-in)
+    {"Pause Hold", "", 0.0f, 1.0f, 1.0f, true},                   // 10: hold the gain through pauses (off: to 0 dB)
+    {"Background Reduction", "dB", 0.0f, 12.0f, 0.0f, false},     // 11: cut in pauses longer than Hold Time
     {"Reduce Loud Dialogue", "", 0.0f, 1.0f, 1.0f, false},        // 12: share of a cut applied
     {"Lift Soft Dialogue", "", 0.0f, 1.0f, 1.0f, false},          // 13: share of a boost applied
     {"Manage Loud Dialogue", "", 0.0f, 1.0f, 1.0f, true},         // 14: cut speech above target
@@ -102,12 +103,12 @@ inline constexpr std::array<LevellerParameter, kParameterCount> kLevellerParamet
     {"Clip Gap", "s", 0.4f, 10.0f, 2.0f, false},                  // 28: NormaliseSetAdvancedParameters GAP
     {"Clip Peak Ceiling", "dBFS", -12.0f, 0.0f, -1.0f, false},    // 29: ... PEAK
     {"Clip Max Gain", "dB", 0.0f, 30.0f, 20.0f, false},           // 30: ... MAXGAIN
-    {"Music Ducking", "dB", 0.0f, 20.0f, 0.0f, false},            // 31: cut of non-speech under speech
-    {"Hold Time", "s", 0.0f, 10.0f, 2.0f, false},                 // 32: pause shorter than this holds
+    {"Music Ducking", "dB", 0.0f, 20.0f, 0.0f, false},            // 31: pauses sit this far under the phrases
+    {"Hold Time", "s", 0.0f, 10.0f, 2.0f, false},                 // 32: longer pauses are background (11)
     {"Levelling", "", 0.0f, 1.0f, 0.0f, true},                    // 33: analysis and levelling on
     {"Apply Gain List", "", 0.0f, 1.0f, 0.0f, true},              // 34: apply the gain list
-    {"Gate Threshold", "dBFS", -90.0f, -30.0f, -70.0f, false},    // 35: entries below are silence
-    {"Silence Gain", "dB", -60.0f, 0.0f, 0.0f, false},            // 36: gain applied to silence
+    {"Gate Threshold", "dBFS", -90.0f, -30.0f, -70.0f, false},    // 35: quieter speech entries are pauses
+    {"Silence Gain", "dB", -60.0f, 0.0f, 0.0f, false},            // 36: added to the gain of gated entries
     {"Output Trim", "dB", -12.0f, 12.0f, 0.0f, false},            // 37: added to every gain
 }};
 
