@@ -20,11 +20,13 @@ DOUBLE="ZenLimiter ZenMultiBandCompressor ZenReverb ZenMeter"
 mkdir -p "$OUT/2x"
 
 # One line per plug-in: file name, key, display name. Audio plug-ins are
-# named by class, control plug-ins by key without spaces.
+# named by class (rows that share a class, the levelling templates, get the
+# first row's picture), control plug-ins by key without spaces.
 list=$(mktemp)
 trap 'rm -f "$list"' EXIT
 "$ZENFX" list --json | jq -r '
-  .[] | [ (if .class then .class else (.key | gsub("[^A-Za-z0-9]"; "")) end), .key, .name ] | @tsv' >"$list"
+  .[] | [ (if .class then .class else (.key | gsub("[^A-Za-z0-9]"; "")) end), .key, .name ] | @tsv' |
+  awk -F'\t' '!seen[$1]++' >"$list"
 
 # Every picture as one zenfx call, JOBS at a time.
 {
